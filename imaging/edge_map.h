@@ -1,0 +1,20 @@
+// The edge map that every drawing effect starts from.
+#pragma once
+
+#include "imaging/bitmap32.h"
+
+namespace quillane {
+
+// Replaces bitmap by its edge map, per colour channel independently. For an interior pixel
+// each of B, G, R becomes
+//   255 - max(clamp(A), clamp(B))
+// where A is the line kernel [-1 -1 -1; 0 6 0; -1 -1 -1] and B the left-minus-right kernel
+// [1 0 -1; 1 0 -1; 1 0 -1] over the 3 by 3 neighbourhood of the input, in integers, each
+// clamped to 0..255. Border pixels repeat their inner neighbours: first the left and right
+// columns take columns 1 and W-2 of their row, then rows 0 and H-1 take rows 1 and H-2, so the
+// corners equal the diagonal interior pixel. All bytes are then inverted; alpha is left to the
+// caller. A picture too small for a neighbour on one side repeats what it has: 1 wide or 1 high
+// gives the inverted input along that direction, 2 gives both lines the inverted second line.
+void picsobel(TBitmap32& bitmap);
+
+}  // namespace quillane

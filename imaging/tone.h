@@ -1,0 +1,59 @@
+// The integer colour model shared by the colour effects, and the tone passes of the pencil
+// drawing.
+#pragma once
+
+#include <array>
+#include <cstdint>
+
+#include "imaging/bitmap32.h"
+
+namespace quillane {
+
+struct Hsl {
+  int h = 0;  // whole degrees 0..359
+  int s = 0;  // whole percent 0..100
+  int l = 0;  // whole percent 0..100
+  friend bool operator==(const Hsl&, const Hsl&) = default;
+};
+
+struct Rgb {
+  int r = 0;
+  int g = 0;
+  int b = 0;
+  friend bool operator==(const Rgb&, const Rgb&) = default;
+};
+
+// RGB to HSL. Fractions are doubles (r = R / 255.0, mx, mn, l = (mx + mn) / 2, d = mx - mn,
+// s = d / (mx + mn) below l = 0.5 and d / (2 - mx - mn) from it, h from the largest channel
+// with red winning ties over green and green over blue, h / 6, plus 1 when negative). Then
+// H = Round(h * 360), S = Round(s * 100), L = Round(l * 100) in extended precision; a hue that
+// rounds to 360 is 0.
+Hsl RgbToHsl(int r, int g, int b);
+
+// HSL to RGB, not the textbook inverse: a pure hue from straight ramps with the factor 4.25
+// (each Round halves to even), blended towards 128 by f = |S - 100| / 100 as
+// Round(x - (x - 128) f), then towards white (t > 0: Round(x + (255 - x) t)) or black
+// (t < 0: Round(x + x t)) with t = (L - 50) / 50. Inputs outside H 0..359, S 0..100, L 0..100
+// give black.
+Rgb HslToRgb(int h, int s, int l);
+
+// The lightness contrast curve for L (0..100) and the contrast position c (0..89):
+// L1 = L - c + 45, k = tan(c pi / 180); L' = Round(k (L1 - 50)) + 50 for c >= 45 and
+// Round(k (L1 - P)) + P with P = 100 - c below; limited to 0..100. Extended precision.
+int LightnessContrast(int l, int c);
+
+// All 101 values of the curve for one position.
+std::array<std::uint8_t, 101> LightnessContrastTable(int c);
+
+// Every pixel through RGB to HSL, the lightness contrast curve with c, and back; alpha 255.
+// The input is not changed.
+TBitmap32 PencilContrastPass(const TBitmap32& input, int c);
+
+// Every pixel becomes its gray value plus 2 (v - 128), limited to 0..255, in B, G and R;
+// alpha 255. The input is not changed.
+TBitmap32 PencilLightingPass(const TBitmap32& input, int v);
+
+// Writes each pixel's gray value into B, G and R and 255 into alpha.
+void ConvertToGray(TBitmap32& bitmap);
+
+}  // namespace quillane

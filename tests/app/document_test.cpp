@@ -1,0 +1,105 @@
+#include "app/document.h"
+
+#include <gtest/gtest.h>
+
+namespace quillane {
+namespace {
+
+TBitmap32 Flat(int w, int h, std::uint8_t v) { return TBitmap32(w, h, Pixel{v, v, v, 255}); }
+
+TEST(PictureDocument, StartsWithOnePictureEverywhere) {
+  PictureDocument doc(TBitmap32(3, 2, Pixel{1, 2, 3, 0}));
+  const TBitmap32 expected(3, 2, Pixel{1, 2, 3, 255});
+  EXPECT_EQ(doc.Working(), expected);
+  EXPECT_EQ(doc.Source(), expected);
+  EXPECT_EQ(doc.Opened(), expected);
+  EXPECT_EQ(doc.Slot(1), expected);
+  EXPECT_FALSE(doc.CanUndo());
+  EXPECT_FALSE(doc.CanRedo());
+  EXPECT_EQ(doc.CurrentSlot(), 1);
+}
+
+TEST(PictureDocument, TwentyFiveStepsKeepTwentyUndos) {
+  PictureDocument doc(Flat(2, 2, 0));
+  for (int i = 1; i <= 25; ++i) {
+    doc.SetWorking(Flat(2, 2, static_cast<std::uint8_t>(i)));
+    doc.Backup();
+    EXPECT_EQ(doc.Slot(doc.CurrentSlot()), doc.Working());
+  }
+  EXPECT_EQ(doc.UndoCount(), 20);
+  for (int i = 0; i < 20; ++i) {
+    ASSERT_TRUE(doc.Undo());
+    EXPECT_EQ(doc.UndoCount() + doc.RedoCount(), 20);
+  }
+  EXPECT_EQ(doc.Working(), Flat(2, 2, 5));
+  EXPECT_FALSE(doc.Undo());
+  EXPECT_EQ(doc.Working(), Flat(2, 2, 5));
+  for (int i = 0; i < 20; ++i) ASSERT_TRUE(doc.Redo());
+  EXPECT_EQ(doc.Working(), Flat(2, 2, 25));
+  EXPECT_FALSE(doc.Redo());
+}
+
+TEST(PictureDocument, NewStepAfterUndoDiscardsRedo) {
+  PictureDocument doc(Flat(2, 2, 0));
+  doc.SetWorking(Flat(2, 2, 1));
+  doc.Backup();
+  doc.SetWorking(Flat(2, 2, 2));
+  doc.Backup();
+  doc.Undo();
+  doc.Undo();
+  EXPECT_EQ(doc.Working(), Flat(2, 2, 0));
+  EXPECT_EQ(doc.RedoCount(), 2);
+  doc.SetWorking(Flat(2, 2, 9));
+  doc.Backup();
+  EXPECT_FALSE(doc.CanRedo());
+  EXPECT_EQ(doc.CurrentSlot(), 2);
+  EXPECT_EQ(doc.Slot(2), Flat(2, 2, 9));
+  doc.Undo();
+  EXPECT_EQ(doc.Working(), Flat(2, 2, 0));
+}
+
+TEST(PictureDocument, UndoAfterResizeResamplesSourceOnlyWhenWidthDiffers) {
+  PictureDocument doc(Flat(10, 10, 0));
+  // A smaller picture recorded, then the larger state restored by Undo: the source follows.
+  doc.SetWorking(Flat(7, 7, 1));
+  doc.SetSource(Flat(7, 7, 1));
+  doc.Backup();
+  doc.Undo();
+  EXPECT_EQ(doc.Working().Width(), 10);
+  // 7 * (10 / 7) may land just below 10 and truncate: that size or one less.
+  EXPECT_GE(doc.Source().Width(), 9);
+  EXPECT_LE(doc.Source().Width(), 10);
+
+  PictureDocument tall(Flat(10, 10, 0));
+  tall.SetWorking(Flat(10, 4, 1));
+  tall.SetSource(Flat(10, 4, 1));
+  tall.Backup();
+  tall.Undo();
+  EXPECT_EQ(tall.Working().Height(), 10);
+  EXPECT_EQ(tall.Source().Height(), 4);  // heights are not compared
+}
+
+TEST(PictureDocument, RenewRestoresOpenedPictureAndResetsHistory) {
+  PictureDocument doc(Flat(4, 3, 5));
+  doc.SetWorking(Flat(3, 4, 6));
+  doc.SetSource(Flat(3, 4, 6));
+  doc.Backup();
+  doc.Renew();
+  EXPECT_EQ(doc.Working(), Flat(4, 3, 5));
+  EXPECT_EQ(doc.Source(), Flat(4, 3, 5));
+  EXPECT_FALSE(doc.CanUndo());
+  EXPECT_EQ(doc.CurrentSlot(), 1);
+  EXPECT_EQ(doc.Slot(1), Flat(4, 3, 5));
+}
+
+TEST(PictureDocument, LoadReplacesPicturesButKeepsHistory) {
+  PictureDocument doc(Flat(2, 2, 0));
+  doc.SetWorking(Flat(2, 2, 1));
+  doc.Backup();
+  doc.Load(TBitmap32(5, 1, Pixel{1, 1, 1, 0}));
+  EXPECT_EQ(doc.Opened(), TBitmap32(5, 1, Pixel{1, 1, 1, 255}));
+  EXPECT_EQ(doc.UndoCount(), 1);
+}
+
+}  // namespace
+}  // namespace quillane
