@@ -1,0 +1,47 @@
+// Reading and writing picture files. The loader chooses its decoder by the last four
+// characters of the name; the writers never leave a half-written file behind.
+#pragma once
+
+#include <functional>
+#include <optional>
+#include <stdexcept>
+#include <string>
+
+#include "imaging/bitmap32.h"
+
+namespace quillane {
+
+// A decoder or encoder failure (corrupt or hostile file, picture beyond the size limit, write
+// error, full disk). what() is the text shown to the user.
+class PictureFileError : public std::runtime_error {
+ public:
+  using std::runtime_error::runtime_error;
+};
+
+// Receives the loader's own message boxes (caption, text): an icon that cannot be read.
+using LoaderNotice = std::function<void(const std::string& caption, const std::string& text)>;
+
+// Loads the picture at path with the decoder chosen by the last four characters of the path
+// in upper case: ".BMP", ".ICO", ".JPG" or "JPEG", ".GIF", ".WMF" or ".EMF".
+// - std::nullopt when no file exists at path;
+// - an empty bitmap for any other ending;
+// - otherwise the decoded 32-bit picture. Its alpha bytes are whatever the decoder gives;
+//   callers set them to 255.
+// A corrupt file or a picture larger than TBitmap32::kMaxPixels throws PictureFileError; an
+// icon that cannot be read is reported through notice (caption "Exit") and gives an empty
+// bitmap.
+std::optional<TBitmap32> LoadPictureFile(const std::string& path,
+                                         const LoaderNotice& notice = nullptr);
+
+// Writers. Each writes beside the target and renames over it only when complete, so a failed
+// write leaves any existing file as it was. They throw PictureFileError.
+void SaveJpeg(const TBitmap32& picture, const std::string& path, int quality = 90);
+void SaveBitmap24(const TBitmap32& picture, const std::string& path);
+void SaveMetafile(const TBitmap32& picture, const std::string& path);
+void SavePng(const TBitmap32& picture, const std::string& path);  // keeps the alpha byte
+
+// If the name's last ".", "\" or "/" or ":" is a ".", everything from that dot on is replaced
+// by extension (given with its dot); otherwise extension is appended.
+std::string ReplaceExtension(const std::string& name, const std::string& extension);
+
+}  // namespace quillane
