@@ -1,0 +1,93 @@
+#include "data/startup_picture.h"
+
+#include <gtest/gtest.h>
+
+#include <set>
+#include <stdexcept>
+#include <vector>
+
+namespace quillane {
+namespace {
+
+TEST(StartupPicture, IsAnOpaqueDetailedPictureOfTheFixedSize) {
+  const TBitmap32 picture = StartupPicture();
+  ASSERT_EQ(picture.Width(), 521);
+  ASSERT_EQ(picture.Height(), 346);
+  std::set<std::uint32_t> colours;
+  long darkToLight = 0;
+  for (int y = 0; y < picture.Height(); ++y) {
+    const Pixel* row = picture.ScanLine(y);
+    for (int x = 0; x < picture.Width(); ++x) {
+      ASSERT_EQ(row[x].a, 255) << x << "," << y;
+      colours.insert(ColorRefFromPixel(row[x]));
+      if (x > 0 && std::abs(row[x].g - row[x - 1].g) > 40) ++darkToLight;
+    }
+  }
+  // A real scene: many colours, and strong edges for the drawing effects to find.
+  EXPECT_GT(colours.size(), 20000u);
+  EXPECT_GT(darkToLight, 500);
+  // Every call gives the same picture.
+  EXPECT_EQ(StartupPicture(), picture);
+}
+
+// A small 24-bit BMP: 14 + 40 header bytes, then rows padded to four bytes.
+std::vector<std::uint8_t> SmallBitmap(int width, int height, bool topDown) {
+  const int stride = (width * 3 + 3) & ~3;
+  const int absHeight = height < 0 ? -height : height;
+  std::vector<std::uint8_t> b(54 + static_cast<std::size_t>(stride * absHeight), 0);
+  const auto put = [&](std::size_t at, std::uint32_t v, int n) {
+    for (int i = 0; i < n; ++i) b[at + i] = static_cast<std::uint8_t>(v >> (8 * i));
+  };
+  b[0] = 'B';
+  b[1] = 'M';
+  put(2, static_cast<std::uint32_t>(b.size()), 4);
+  put(10, 54, 4);
+  put(14, 40, 4);
+  put(18, static_cast<std::uint32_t>(width), 4);
+  put(22, static_cast<std::uint32_t>(topDown ? -height : height), 4);
+  put(26, 1, 2);
+  put(28, 24, 2);
+  // Pixel (x, row in file order) = (B x, G file row, R 200).
+  for (int row = 0; row < absHeight; ++row)
+    for (int x = 0; x < width; ++x) {
+      const std::size_t at = 54 + static_cast<std::size_t>(row * stride + x * 3);
+      b[at] = static_cast<std::uint8_t>(x);
+      b[at + 1] = static_cast<std::uint8_t>(row);
+      b[at + 2] = 200;
+    }
+  return b;
+}
+
+TEST(DecodeBitmap24, ReadsBottomUpAndTopDownRowsWithPadding) {
+  const TBitmap32 bottomUp = DecodeBitmap24(SmallBitmap(3, 2, false));
+  ASSERT_EQ(bottomUp.Width(), 3);
+  ASSERT_EQ(bottomUp.Height(), 2);
+  EXPECT_EQ(bottomUp.At(2, 0), (Pixel{2, 1, 200, 255}));  // the last file row is the top
+  EXPECT_EQ(bottomUp.At(1, 1), (Pixel{1, 0, 200, 255}));
+  const TBitmap32 topDown = DecodeBitmap24(SmallBitmap(3, 2, true));
+  EXPECT_EQ(topDown.At(2, 0), (Pixel{2, 0, 200, 255}));
+  EXPECT_EQ(topDown.At(1, 1), (Pixel{1, 1, 200, 255}));
+}
+
+TEST(DecodeBitmap24, RefusesDamagedAndForeignFiles) {
+  const std::vector<std::uint8_t> good = SmallBitmap(5, 3, false);
+  // Cut anywhere: the header, or the last row's last byte.
+  for (std::size_t cut : {std::size_t{0}, std::size_t{2}, std::size_t{53}, good.size() - 4})
+    EXPECT_THROW(DecodeBitmap24(std::span(good.data(), cut)), std::runtime_error) << cut;
+  const auto withField = [&](std::size_t at, std::uint32_t v, int n) {
+    std::vector<std::uint8_t> b = good;
+    for (int i = 0; i < n; ++i) b[at + i] = static_cast<std::uint8_t>(v >> (8 * i));
+    return b;
+  };
+  EXPECT_THROW(DecodeBitmap24(withField(0, 'X', 1)), std::runtime_error);
+  EXPECT_THROW(DecodeBitmap24(withField(28, 32, 2)), std::runtime_error);  // 32-bit
+  EXPECT_THROW(DecodeBitmap24(withField(30, 1, 4)), std::runtime_error);   // compressed
+  EXPECT_THROW(DecodeBitmap24(withField(18, 0, 4)), std::runtime_error);   // width 0
+  EXPECT_THROW(DecodeBitmap24(withField(22, 0x80000000u, 4)), std::runtime_error);
+  EXPECT_THROW(DecodeBitmap24(withField(18, 0x7fffffffu, 4)), std::runtime_error);
+  EXPECT_THROW(DecodeBitmap24(withField(10, 0xfffffff0u, 4)), std::runtime_error);  // offset
+  EXPECT_THROW(DecodeBitmap24(withField(14, 0xffffff00u, 4)), std::runtime_error);  // info size
+}
+
+}  // namespace
+}  // namespace quillane
