@@ -265,32 +265,39 @@ void DrawSky(Canvas& cv) {
   }
 }
 
-// A mountain range whose ridge follows fractal noise; haze blends it towards the sky.
+// A mountain range whose ridge follows ridged fractal noise; haze blends it towards the sky.
 void DrawRange(Canvas& cv, float base, float amplitude, float period, std::uint32_t seed,
                Colour rock, float haze, bool snow) {
+  const auto ridgeAt = [&](float x) {
+    const float n = Fbm(x / period, 0.5f, seed, 6);
+    const float peaks = 1 - std::abs(2 * Fbm(x / (period * 0.6f), 1.5f, seed + 1, 4) - 1);
+    return base - amplitude * Clamp01((n - 0.3f) / 0.4f * 0.65f + peaks * 0.45f);
+  };
   cv.Region(0, base - amplitude - 2, kWidth, kWaterLine + 2, [&](float x, float y, float& a) {
-    const float ridge = base - amplitude * Fbm(x / period, 0.5f, seed, 6);
+    const float ridge = ridgeAt(x);
     if (y < ridge) {
       a = 0;
       return Colour{};
     }
     a = 1;
-    const float depth = (y - ridge);
-    // Slopes facing the sun are lit: the sign of the ridge's slope decides near the crest, and
-    // a gully pattern takes over further down.
-    const float slope = (base - amplitude * Fbm((x + 1.5f) / period, 0.5f, seed, 6)) - ridge;
-    const float gully = Fbm(x / 14.0f + depth / 30.0f, depth / 40.0f, seed + 7, 4) - 0.5f;
-    const float crestWeight = 1 - SmoothStep(0, 18, depth);
-    const float light = crestWeight * std::clamp(-slope * 0.5f, -0.3f, 0.3f) + gully * 0.5f;
+    const float depth = y - ridge;
+    // Faces rising towards the sun (on the right) are in shade. Near the crest the ridge's own
+    // slope decides; further down, the slope of an ever broader stretch of it, so the flanks
+    // form large faces instead of stripes.
+    const float span = 1.5f + depth * 0.9f;
+    const float slope = (ridgeAt(x + span) - ridgeAt(x - span)) / (2 * span);
+    const float rocks = Fbm(x / 5.0f, y / 4.0f, seed + 7, 4) - 0.5f;
+    const float light = std::clamp(slope * 1.6f, -0.35f, 0.35f) + rocks * 0.35f;
     Colour c = Scale(rock, 1 + light);
     // Snow above a fixed altitude, reaching further down in the gullies.
     if (snow) {
-      const float snowLine = base - amplitude * 0.62f + gully * 14.0f;
-      c = Mix(c, Colour{242, 240, 248}, 0.9f * SmoothStep(snowLine + 1.5f, snowLine - 1.5f, y));
+      const float snowLine = base - amplitude * 0.66f + rocks * 18.0f + slope * 6.0f;
+      const float cover = SmoothStep(snowLine + 1.2f, snowLine - 1.2f, y);
+      c = Mix(c, Scale(Colour{246, 244, 250}, 1 + std::min(0.0f, light) * 0.6f), 0.9f * cover);
     }
     // Haze thickens towards the foot of the range.
-    const float h = Clamp01(haze + SmoothStep(0, 70, depth) * 0.2f);
-    return Mix(c, Mix(kHaze, SkyAt(x, y), 0.4f), h);
+    const float h = Clamp01(haze + SmoothStep(0, 60, depth) * 0.25f);
+    return Mix(c, Mix(kHaze, SkyAt(x, y), 0.5f), h);
   });
 }
 
@@ -470,24 +477,33 @@ void DrawTree(Canvas& cv, float x, float base, float size, std::uint32_t seed) {
   cv.Line(x, base - size * 0.6f, x + size * 0.3f, base - size * 1.0f, size * 0.05f, trunk);
   const float cx = x, cy = base - size * 1.05f;
   const float rx = size * 0.55f, ry = size * 0.5f;
-  const Colour dark{38, 62, 30}, mid{72, 104, 44}, light{150, 170, 70};
-  // Shadow mass first, then clusters lit from the upper right.
-  cv.Ellipse(cx, cy, rx, ry, [&](float px, float py) {
-    return Scale(dark, 0.85f + 0.3f * Fbm(px / 1.5f, py / 1.5f, seed, 3));
-  });
-  const int clusters = static_cast<int>(size * 2.2f);
+  const Colour dark{34, 56, 28}, mid{84, 118, 48}, light{178, 192, 88};
+  // Leaves: a fine speckle of light and dark flecks, so the crown has texture up close.
+  const auto leaves = [seed](Colour c, float px, float py) {
+    const float fleck = ValueNoise(px * 2.7f, py * 2.7f, seed + 5);
+    return Scale(c, fleck > 0.72f ? 1.25f : (fleck < 0.25f ? 0.7f : 0.85f + 0.3f * fleck));
+  };
+  // An irregular shadow mass of overlapping clumps, then clumps lit from the upper right.
+  for (int i = 0; i < static_cast<int>(size * 1.6f); ++i) {
+    const float ang = rnd.Range(0, 6.2832f), rad = std::sqrt(rnd.Next());
+    const float bx = cx + std::cos(ang) * rad * rx * 0.8f;
+    const float by = cy + std::sin(ang) * rad * ry * 0.8f;
+    const float br = size * rnd.Range(0.14f, 0.24f);
+    cv.Ellipse(bx, by, br, br * 0.85f, [&](float px, float py) { return leaves(dark, px, py); });
+  }
+  const int clusters = static_cast<int>(size * 3.5f);
   for (int i = 0; i < clusters; ++i) {
     const float ang = rnd.Range(0, 6.2832f), rad = std::sqrt(rnd.Next());
-    const float bx = cx + std::cos(ang) * rad * rx * 0.9f;
-    const float by = cy + std::sin(ang) * rad * ry * 0.9f;
-    const float br = size * rnd.Range(0.1f, 0.2f);
+    const float bx = cx + std::cos(ang) * rad * rx * 0.85f + size * 0.03f;
+    const float by = cy + std::sin(ang) * rad * ry * 0.85f - size * 0.03f;
+    const float br = size * rnd.Range(0.07f, 0.15f);
+    const float sideLight = Clamp01(0.45f + 0.6f * ((bx - cx) / rx - (by - cy) / ry) * 0.5f);
     cv.Ellipse(bx, by, br, br * 0.85f, [&](float px, float py) {
       const float nx = (px - bx) / br, ny = (py - by) / br;
       const float toward = Clamp01(0.5f + 0.5f * (nx * 0.7f - ny * 0.7f));
-      const float sideLight = Clamp01(0.5f + 0.5f * ((bx - cx) / rx - (by - cy) / ry) * 0.8f);
-      Colour c = Mix(Mix(dark, mid, toward), light, toward * toward * sideLight);
-      // Leaf speckle.
-      return Scale(c, 0.8f + 0.4f * ValueNoise(px * 1.6f, py * 1.6f, seed + 5));
+      const Colour c = Mix(Mix(dark, mid, toward * (0.4f + 0.6f * sideLight)), light,
+                           toward * toward * sideLight * sideLight);
+      return leaves(c, px, py);
     });
   }
 }
@@ -603,8 +619,8 @@ void DrawForeground(Canvas& cv) {
 
 void Draw(Canvas& cv) {
   DrawSky(cv);
-  DrawRange(cv, 176, 70, 95, 3, Colour{118, 124, 150}, 0.58f, true);
-  DrawRange(cv, 196, 46, 70, 5, Colour{82, 100, 110}, 0.42f, false);
+  DrawRange(cv, 172, 78, 90, 3, Colour{104, 112, 144}, 0.42f, true);
+  DrawRange(cv, 194, 44, 64, 5, Colour{76, 96, 106}, 0.36f, false);
   DrawRange(cv, 212, 30, 42, 9, Colour{62, 88, 70}, 0.28f, false);
   DrawHills(cv);
   // Distant tree lines along the hills.
@@ -612,6 +628,12 @@ void Draw(Canvas& cv) {
     const float x = 6 + i * 8.6f + 3 * std::sin(i * 1.7f);
     const float y = HillLine(x) + 2;
     DrawConifer(cv, x, y + 1, 7 + 4 * Hash01(static_cast<std::uint32_t>(i), 7), 200 + i);
+  }
+  // Bushes and small trees along the far shore, so the lake has something to mirror.
+  Random shore(77);
+  for (float x = -4; x < 214; x += shore.Range(4, 9)) {
+    const float size = shore.Range(4, 9);
+    DrawTree(cv, x, kWaterLine + 0.5f, size, 600 + static_cast<std::uint32_t>(x + 10));
   }
   DrawLake(cv);
   // The village on the slope to the right of the road.
