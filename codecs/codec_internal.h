@@ -1,0 +1,81 @@
+// The decoders and encoders behind picture_file.h, working on bytes in memory so that the
+// tests and the fuzz targets can drive each one directly.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <span>
+#include <string>
+#include <vector>
+
+#include "codecs/picture_file.h"
+#include "imaging/bitmap32.h"
+
+namespace quillane::codecs {
+
+using Bytes = std::span<const std::uint8_t>;
+
+// Receives encoded bytes as they are produced. Write throws PictureFileError on failure.
+class ByteSink {
+ public:
+  virtual ~ByteSink() = default;
+  virtual void Write(const void* data, std::size_t size) = 0;
+};
+
+class MemorySink : public ByteSink {
+ public:
+  void Write(const void* data, std::size_t size) override {
+    const auto* bytes = static_cast<const std::uint8_t*>(data);
+    bytes_.insert(bytes_.end(), bytes, bytes + size);
+  }
+  std::vector<std::uint8_t>& bytes() { return bytes_; }
+
+ private:
+  std::vector<std::uint8_t> bytes_;
+};
+
+// Every decoder refuses a picture of more than maxPixels (or of a width or height of 0 or
+// below) from its header, before any pixel memory is allocated, and throws PictureFileError
+// for anything it cannot read completely.
+
+// JPEG through libjpeg-turbo: baseline, progressive, grayscale, RGB, CMYK and YCCK (Adobe
+// files store inverted inks; both forms give the right colours). Alpha is 255.
+TBitmap32 DecodeJpeg(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels);
+
+// The formats read through Qt's image readers, each with its own reader only (the content is
+// not sniffed, so a PNG named .bmp is refused as a bad bitmap).
+enum class QtFormat {
+  kBitmap,  // every BMP depth, RLE4/RLE8, bit fields, top-down and bottom-up, v3 to v5 headers
+  kIcon,    // the entry with the most pixels, and of those the deepest, is taken
+  kGif,     // the first frame as rendered on the logical screen
+};
+// For icons and GIFs, transparent and partly transparent pixels are composited over white (the
+// background a freshly made bitmap shows); the alpha bytes are returned as the decoder gives
+// them. Bitmaps keep their stored colours and alpha.
+TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels = TBitmap32::kMaxPixels);
+
+// Metafiles are told apart by their content: an enhanced metafile starts with an EMR_HEADER
+// record carrying the " EMF" signature; anything else must be a Windows metafile (placeable
+// or not). The picture is played onto a white background; alpha is 255.
+TBitmap32 DecodeMetafile(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels);
+bool LooksLikeEnhancedMetafile(Bytes data);
+TBitmap32 DecodeEnhancedMetafile(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels);
+TBitmap32 DecodeWindowsMetafile(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels);
+
+// Encoders. quality is clamped to 1..100.
+std::vector<std::uint8_t> EncodeJpeg(const TBitmap32& picture, int quality);
+void EncodeBitmap24(const TBitmap32& picture, ByteSink& sink);
+void EncodeEnhancedMetafile(const TBitmap32& picture, ByteSink& sink);
+std::vector<std::uint8_t> EncodePng(const TBitmap32& picture);
+
+// The pixel size a Windows playing device at 96 dots per inch gives an enhanced metafile.
+inline constexpr int kMetafileDotsPerInch = 96;
+
+// Reads a whole file; throws PictureFileError when it cannot.
+std::vector<std::uint8_t> ReadWholeFile(const std::string& path);
+
+// Throws PictureFileError when a width by height picture cannot be held.
+void CheckPictureSize(std::int64_t width, std::int64_t height, std::int64_t maxPixels,
+                      const char* what);
+
+}  // namespace quillane::codecs

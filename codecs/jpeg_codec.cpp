@@ -1,0 +1,266 @@
+// JPEG through libjpeg-turbo. libjpeg reports errors through a callback that must not return;
+// it longjmps back to the one function that owns the libjpeg object, and only after that
+// function has left the libjpeg frames does anything throw. Objects with destructors live
+// outside the region a longjmp can skip.
+// jpeglib.h needs size_t and FILE declared first.
+#include <cstddef>
+#include <cstdio>
+// clang-format off
+#include <jpeglib.h>
+#include <jerror.h>
+// clang-format on
+
+#include <algorithm>
+#include <csetjmp>
+#include <cstring>
+#include <new>
+#include <string>
+
+#include "codecs/codec_internal.h"
+
+namespace quillane::codecs {
+namespace {
+
+// Far more scans than any encoder writes; a crafted progressive file with thousands of tiny
+// scans would otherwise take minutes.
+constexpr int kMaxScans = 500;
+constexpr JDIMENSION kRowsPerRead = 16;
+
+struct ErrorManager {
+  jpeg_error_mgr pub;
+  std::jmp_buf jump;
+  char message[JMSG_LENGTH_MAX + 64];
+};
+
+[[noreturn]] void Fail(j_common_ptr cinfo, const char* text) {
+  auto* err = reinterpret_cast<ErrorManager*>(cinfo->err);
+  std::snprintf(err->message, sizeof err->message, "%s", text);
+  std::longjmp(err->jump, 1);
+}
+
+[[noreturn]] void ErrorExit(j_common_ptr cinfo) {
+  auto* err = reinterpret_cast<ErrorManager*>(cinfo->err);
+  (*cinfo->err->format_message)(cinfo, err->message);
+  std::longjmp(err->jump, 1);
+}
+
+// Warnings about damaged entropy data are tolerated (the damaged blocks decode as gray, as
+// every viewer shows them), but running out of data means the picture is not all there.
+void EmitMessage(j_common_ptr cinfo, int level) {
+  if (level >= 0) return;
+  if (cinfo->err->msg_code == JWRN_JPEG_EOF) {
+    Fail(cinfo, "The JPEG file is truncated (premature end of data)");
+  }
+  cinfo->err->num_warnings++;
+}
+
+void OutputMessage(j_common_ptr) {}
+
+void LimitScans(j_common_ptr cinfo) {
+  if (!cinfo->is_decompressor) return;
+  const auto* dinfo = reinterpret_cast<j_decompress_ptr>(cinfo);
+  if (dinfo->input_scan_number > kMaxScans) {
+    Fail(cinfo, "The JPEG file has too many progressive scans to be a real picture");
+  }
+}
+
+void InstallErrorManager(ErrorManager& err) {
+  jpeg_std_error(&err.pub);
+  err.pub.error_exit = ErrorExit;
+  err.pub.emit_message = EmitMessage;
+  err.pub.output_message = OutputMessage;
+  err.message[0] = '\0';
+}
+
+std::uint8_t MulDiv255(unsigned a, unsigned b) {
+  return static_cast<std::uint8_t>((a * b * 2 + 255) / 510);
+}
+
+struct Decompressor {
+  jpeg_decompress_struct cinfo{};
+  ErrorManager err{};
+  jpeg_progress_mgr progress{};
+  bool created = false;
+  ~Decompressor() {
+    if (created) jpeg_destroy_decompress(&cinfo);
+  }
+};
+
+// Everything libjpeg touches happens here; returns false with err.message set on failure.
+bool RunDecoder(Decompressor& d, Bytes data, std::int64_t maxPixels, TBitmap32& result,
+                std::vector<JSAMPLE>& inkRows, std::string& sizeProblem) {
+  if (setjmp(d.err.jump)) return false;
+  jpeg_create_decompress(&d.cinfo);
+  d.created = true;
+  d.progress.progress_monitor = LimitScans;
+  d.cinfo.progress = &d.progress;
+  jpeg_mem_src(&d.cinfo, data.data(), static_cast<unsigned long>(data.size()));
+  jpeg_read_header(&d.cinfo, TRUE);
+
+  const std::int64_t width = d.cinfo.image_width;
+  const std::int64_t height = d.cinfo.image_height;
+  if (width <= 0 || height <= 0 || width * height > maxPixels) {
+    sizeProblem = "JPEG";
+    return true;
+  }
+  const bool inks = d.cinfo.jpeg_color_space == JCS_CMYK || d.cinfo.jpeg_color_space == JCS_YCCK;
+  d.cinfo.out_color_space = inks ? JCS_CMYK : JCS_EXT_BGRA;
+  d.cinfo.dct_method = JDCT_ISLOW;
+  jpeg_start_decompress(&d.cinfo);
+  if (d.cinfo.output_width != d.cinfo.image_width ||
+      d.cinfo.output_height != d.cinfo.image_height) {
+    Fail(reinterpret_cast<j_common_ptr>(&d.cinfo), "The JPEG decoder changed the picture size");
+  }
+  result.SetSize(static_cast<int>(width), static_cast<int>(height));
+  const auto w = static_cast<std::size_t>(width);
+  if (inks) inkRows.resize(w * 4 * kRowsPerRead);
+
+  // Adobe writers store inverted inks (0 = full ink); everyone else stores plain inks.
+  const bool inverted = d.cinfo.saw_Adobe_marker;
+  JSAMPROW rows[kRowsPerRead];
+  while (d.cinfo.output_scanline < d.cinfo.output_height) {
+    const JDIMENSION first = d.cinfo.output_scanline;
+    const JDIMENSION count = std::min(kRowsPerRead, d.cinfo.output_height - first);
+    for (JDIMENSION i = 0; i < count; ++i) {
+      rows[i] = inks ? inkRows.data() + i * w * 4
+                     : reinterpret_cast<JSAMPROW>(result.ScanLine(static_cast<int>(first + i)));
+    }
+    const JDIMENSION got = jpeg_read_scanlines(&d.cinfo, rows, count);
+    if (got == 0) Fail(reinterpret_cast<j_common_ptr>(&d.cinfo), "The JPEG decoder stalled");
+    if (!inks) continue;
+    for (JDIMENSION i = 0; i < got; ++i) {
+      const JSAMPLE* ink = rows[i];
+      Pixel* out = result.ScanLine(static_cast<int>(first + i));
+      for (std::size_t x = 0; x < w; ++x, ink += 4) {
+        unsigned c = ink[0], m = ink[1], y = ink[2], k = ink[3];
+        if (!inverted) {
+          c = 255 - c;
+          m = 255 - m;
+          y = 255 - y;
+          k = 255 - k;
+        }
+        out[x] = Pixel{MulDiv255(y, k), MulDiv255(m, k), MulDiv255(c, k), 255};
+      }
+    }
+  }
+  // Every row is in; whatever follows the last scan (or a missing end marker) does not matter.
+  return true;
+}
+
+struct VectorDestination {
+  jpeg_destination_mgr pub;
+  std::vector<std::uint8_t>* out;
+  std::size_t used;
+  bool outOfMemory;
+};
+
+constexpr std::size_t kDestinationChunk = 1 << 16;
+
+bool Grow(VectorDestination* dest) {
+  try {
+    dest->out->resize(dest->out->size() + kDestinationChunk);
+    return true;
+  } catch (const std::bad_alloc&) {
+    return false;
+  }
+}
+
+void InitDestination(j_compress_ptr cinfo) {
+  auto* dest = reinterpret_cast<VectorDestination*>(cinfo->dest);
+  if (!Grow(dest)) Fail(reinterpret_cast<j_common_ptr>(cinfo), "Out of memory");
+  dest->pub.next_output_byte = dest->out->data();
+  dest->pub.free_in_buffer = dest->out->size();
+}
+
+boolean EmptyDestination(j_compress_ptr cinfo) {
+  auto* dest = reinterpret_cast<VectorDestination*>(cinfo->dest);
+  const std::size_t used = dest->out->size();
+  if (!Grow(dest)) Fail(reinterpret_cast<j_common_ptr>(cinfo), "Out of memory");
+  dest->pub.next_output_byte = dest->out->data() + used;
+  dest->pub.free_in_buffer = dest->out->size() - used;
+  return TRUE;
+}
+
+void TermDestination(j_compress_ptr cinfo) {
+  auto* dest = reinterpret_cast<VectorDestination*>(cinfo->dest);
+  dest->out->resize(dest->out->size() - dest->pub.free_in_buffer);
+}
+
+struct Compressor {
+  jpeg_compress_struct cinfo{};
+  ErrorManager err{};
+  VectorDestination dest{};
+  bool created = false;
+  ~Compressor() {
+    if (created) jpeg_destroy_compress(&cinfo);
+  }
+};
+
+bool RunEncoder(Compressor& c, const TBitmap32& picture, int quality,
+                std::vector<std::uint8_t>& out) {
+  if (setjmp(c.err.jump)) return false;
+  jpeg_create_compress(&c.cinfo);
+  c.created = true;
+  c.dest.pub.init_destination = InitDestination;
+  c.dest.pub.empty_output_buffer = EmptyDestination;
+  c.dest.pub.term_destination = TermDestination;
+  c.dest.out = &out;
+  c.cinfo.dest = &c.dest.pub;
+  c.cinfo.image_width = static_cast<JDIMENSION>(picture.Width());
+  c.cinfo.image_height = static_cast<JDIMENSION>(picture.Height());
+  c.cinfo.input_components = 4;
+  c.cinfo.in_color_space = JCS_EXT_BGRX;
+  jpeg_set_defaults(&c.cinfo);
+  jpeg_set_quality(&c.cinfo, quality, TRUE);
+  jpeg_start_compress(&c.cinfo, TRUE);
+  JSAMPROW rows[kRowsPerRead];
+  while (c.cinfo.next_scanline < c.cinfo.image_height) {
+    const JDIMENSION first = c.cinfo.next_scanline;
+    const JDIMENSION count = std::min(kRowsPerRead, c.cinfo.image_height - first);
+    for (JDIMENSION i = 0; i < count; ++i) {
+      // libjpeg only reads input rows; its interface just lacks the const.
+      rows[i] = reinterpret_cast<JSAMPROW>(
+          const_cast<Pixel*>(picture.ScanLine(static_cast<int>(first + i))));
+    }
+    jpeg_write_scanlines(&c.cinfo, rows, count);
+  }
+  jpeg_finish_compress(&c.cinfo);
+  return true;
+}
+
+}  // namespace
+
+TBitmap32 DecodeJpeg(Bytes data, std::int64_t maxPixels) {
+  if (data.empty()) throw PictureFileError("The JPEG file is empty");
+  Decompressor d;
+  InstallErrorManager(d.err);
+  d.cinfo.err = &d.err.pub;
+  TBitmap32 result;
+  std::vector<JSAMPLE> inkRows;
+  std::string sizeProblem;
+  if (!RunDecoder(d, data, maxPixels, result, inkRows, sizeProblem)) {
+    throw PictureFileError(std::string("Cannot read the JPEG picture: ") + d.err.message);
+  }
+  if (!sizeProblem.empty()) {
+    CheckPictureSize(d.cinfo.image_width, d.cinfo.image_height, maxPixels, "JPEG");
+  }
+  return result;
+}
+
+std::vector<std::uint8_t> EncodeJpeg(const TBitmap32& picture, int quality) {
+  if (picture.Empty()) throw PictureFileError("There is no picture to save");
+  if (picture.Width() > JPEG_MAX_DIMENSION || picture.Height() > JPEG_MAX_DIMENSION) {
+    throw PictureFileError("The picture is too large for a JPEG file (at most " +
+                           std::to_string(JPEG_MAX_DIMENSION) + " pixels a side)");
+  }
+  Compressor c;
+  InstallErrorManager(c.err);
+  c.cinfo.err = &c.err.pub;
+  std::vector<std::uint8_t> out;
+  if (!RunEncoder(c, picture, std::clamp(quality, 1, 100), out)) {
+    throw PictureFileError(std::string("Cannot write the JPEG picture: ") + c.err.message);
+  }
+  return out;
+}
+
+}  // namespace quillane::codecs

@@ -1,0 +1,213 @@
+#include "codecs/picture_file.h"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cctype>
+#include <cerrno>
+#include <cstring>
+#include <new>
+
+#include "codecs/atomic_file.h"
+#include "codecs/codec_internal.h"
+
+namespace quillane {
+namespace codecs {
+
+void CheckPictureSize(std::int64_t width, std::int64_t height, std::int64_t maxPixels,
+                      const char* what) {
+  if (width <= 0 || height <= 0) {
+    throw PictureFileError(std::string("The ") + what + " picture has no valid size (" +
+                           std::to_string(width) + " by " + std::to_string(height) + ")");
+  }
+  // Each side is at most 2^32 here, so the product cannot overflow.
+  if (width > 0xFFFFFFFFll || height > 0xFFFFFFFFll || width * height > maxPixels) {
+    throw PictureFileError(std::string("The ") + what + " picture is " + std::to_string(width) +
+                           " by " + std::to_string(height) + " pixels, more than the " +
+                           std::to_string(maxPixels) + " pixels a picture may have");
+  }
+}
+
+std::vector<std::uint8_t> ReadWholeFile(const std::string& path) {
+  // Far beyond the largest picture file of any accepted size.
+  constexpr std::int64_t kMaxFileSize = std::int64_t{2} << 30;
+  const int fd = ::open(path.c_str(), O_RDONLY | O_CLOEXEC);
+  if (fd < 0) throw PictureFileError(std::string("Cannot read the file: ") + std::strerror(errno));
+  struct Closer {
+    int fd;
+    ~Closer() { ::close(fd); }
+  } closer{fd};
+  struct stat info {};
+  if (::fstat(fd, &info) != 0) {
+    throw PictureFileError(std::string("Cannot read the file: ") + std::strerror(errno));
+  }
+  if (!S_ISREG(info.st_mode)) throw PictureFileError("Cannot read the file: not a regular file");
+  if (info.st_size > kMaxFileSize) throw PictureFileError("The file is too large to be a picture");
+  std::vector<std::uint8_t> bytes(static_cast<std::size_t>(info.st_size));
+  std::size_t done = 0;
+  while (done < bytes.size()) {
+    const ssize_t got = ::read(fd, bytes.data() + done, bytes.size() - done);
+    if (got < 0) {
+      if (errno == EINTR) continue;
+      throw PictureFileError(std::string("Cannot read the file: ") + std::strerror(errno));
+    }
+    if (got == 0) break;  // the file shrank while being read
+    done += static_cast<std::size_t>(got);
+  }
+  bytes.resize(done);
+  return bytes;
+}
+
+// A bottom-up 24-bit BMP with a 40-byte info header; rows padded to four bytes.
+void EncodeBitmap24(const TBitmap32& picture, ByteSink& sink) {
+  if (picture.Empty()) throw PictureFileError("There is no picture to save");
+  const auto w = static_cast<std::uint32_t>(picture.Width());
+  const auto h = static_cast<std::uint32_t>(picture.Height());
+  const std::uint64_t stride = (std::uint64_t{w} * 3 + 3) / 4 * 4;
+  const std::uint64_t bitsSize = stride * h;
+  const std::uint64_t fileSize = 54 + bitsSize;
+  if (fileSize > 0xFFFFFFFFull) throw PictureFileError("The picture is too large for a bitmap");
+
+  std::uint8_t header[54] = {};
+  std::uint8_t* at = header;
+  const auto put16 = [&at](std::uint16_t v) {
+    *at++ = static_cast<std::uint8_t>(v);
+    *at++ = static_cast<std::uint8_t>(v >> 8);
+  };
+  const auto put32 = [&at](std::uint32_t v) {
+    for (int i = 0; i < 4; ++i) *at++ = static_cast<std::uint8_t>(v >> (8 * i));
+  };
+  *at++ = 'B';
+  *at++ = 'M';
+  put32(static_cast<std::uint32_t>(fileSize));
+  put32(0);
+  put32(54);
+  put32(40);
+  put32(w);
+  put32(h);
+  put16(1);
+  put16(24);
+  put32(0);  // BI_RGB
+  put32(static_cast<std::uint32_t>(bitsSize));
+  put32(3780);  // 96 dpi in pixels per metre
+  put32(3780);
+  put32(0);
+  put32(0);
+  sink.Write(header, sizeof header);
+
+  std::vector<std::uint8_t> row(static_cast<std::size_t>(stride), 0);
+  for (std::int64_t y = h; y-- > 0;) {
+    const Pixel* source = picture.ScanLine(static_cast<int>(y));
+    for (std::uint32_t x = 0; x < w; ++x) {
+      row[3 * x] = source[x].b;
+      row[3 * x + 1] = source[x].g;
+      row[3 * x + 2] = source[x].r;
+    }
+    sink.Write(row.data(), row.size());
+  }
+}
+
+}  // namespace codecs
+
+namespace {
+
+std::string TypeKey(const std::string& path) {
+  std::string key = path.size() > 4 ? path.substr(path.size() - 4) : path;
+  for (char& c : key) c = static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
+  return key;
+}
+
+bool FileExists(const std::string& path) {
+  struct stat info {};
+  return ::stat(path.c_str(), &info) == 0 && S_ISREG(info.st_mode);
+}
+
+template <typename Decoder>
+TBitmap32 Decode(const std::string& path, Decoder decode) {
+  try {
+    const std::vector<std::uint8_t> bytes = codecs::ReadWholeFile(path);
+    return decode(codecs::Bytes(bytes));
+  } catch (const PictureFileError& error) {
+    throw PictureFileError("\"" + path + "\": " + error.what());
+  } catch (const std::bad_alloc&) {
+    throw PictureFileError("\"" + path + "\": there is not enough memory to open the picture");
+  }
+}
+
+template <typename Encoder>
+void SaveAtomically(const TBitmap32& picture, const std::string& path, Encoder encode) {
+  const std::string prefix = "Cannot save \"" + path + "\": ";
+  if (picture.Empty()) throw PictureFileError(prefix + "there is no picture to save");
+  try {
+    codecs::AtomicFile file(path);
+    encode(file);
+    file.Commit();
+  } catch (const PictureFileError& error) {
+    throw PictureFileError(prefix + error.what());
+  } catch (const std::bad_alloc&) {
+    throw PictureFileError(prefix + "there is not enough memory");
+  }
+}
+
+}  // namespace
+
+std::optional<TBitmap32> LoadPictureFile(const std::string& path, const LoaderNotice& notice) {
+  if (!FileExists(path)) return std::nullopt;
+  const std::string key = TypeKey(path);
+  using codecs::Bytes;
+  if (key == ".BMP") {
+    return Decode(path, [](Bytes b) { return DecodeWithQt(b, codecs::QtFormat::kBitmap); });
+  }
+  if (key == ".ICO") {
+    try {
+      const std::vector<std::uint8_t> bytes = codecs::ReadWholeFile(path);
+      return codecs::DecodeWithQt(bytes, codecs::QtFormat::kIcon);
+    } catch (const std::exception& error) {
+      if (notice) notice("Exit", "Input picture" + path + "Error." + error.what());
+      return TBitmap32();
+    }
+  }
+  if (key == ".JPG" || key == "JPEG") {
+    return Decode(path, [](Bytes b) { return codecs::DecodeJpeg(b); });
+  }
+  if (key == ".GIF") {
+    return Decode(path, [](Bytes b) { return DecodeWithQt(b, codecs::QtFormat::kGif); });
+  }
+  if (key == ".WMF" || key == ".EMF") {
+    return Decode(path, [](Bytes b) { return codecs::DecodeMetafile(b); });
+  }
+  return TBitmap32();
+}
+
+void SaveJpeg(const TBitmap32& picture, const std::string& path, int quality) {
+  SaveAtomically(picture, path, [&](codecs::ByteSink& sink) {
+    const std::vector<std::uint8_t> bytes = codecs::EncodeJpeg(picture, quality);
+    sink.Write(bytes.data(), bytes.size());
+  });
+}
+
+void SaveBitmap24(const TBitmap32& picture, const std::string& path) {
+  SaveAtomically(picture, path,
+                 [&](codecs::ByteSink& sink) { codecs::EncodeBitmap24(picture, sink); });
+}
+
+void SaveMetafile(const TBitmap32& picture, const std::string& path) {
+  SaveAtomically(picture, path,
+                 [&](codecs::ByteSink& sink) { codecs::EncodeEnhancedMetafile(picture, sink); });
+}
+
+void SavePng(const TBitmap32& picture, const std::string& path) {
+  SaveAtomically(picture, path, [&](codecs::ByteSink& sink) {
+    const std::vector<std::uint8_t> bytes = codecs::EncodePng(picture);
+    sink.Write(bytes.data(), bytes.size());
+  });
+}
+
+std::string ReplaceExtension(const std::string& name, const std::string& extension) {
+  const auto last = name.find_last_of(".\\/:");
+  if (last != std::string::npos && name[last] == '.') return name.substr(0, last) + extension;
+  return name + extension;
+}
+
+}  // namespace quillane

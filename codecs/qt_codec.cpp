@@ -1,0 +1,179 @@
+// Bitmaps, icons and GIFs through Qt's image readers; PNG writing through Qt's writer.
+#include <QBuffer>
+#include <QByteArray>
+#include <QImage>
+#include <QImageReader>
+#include <QImageWriter>
+#include <cstring>
+#include <limits>
+#include <mutex>
+
+#include "codecs/codec_internal.h"
+
+namespace quillane::codecs {
+namespace {
+
+const char* FormatName(QtFormat format) {
+  switch (format) {
+    case QtFormat::kBitmap:
+      return "bmp";
+    case QtFormat::kIcon:
+      return "ico";
+    case QtFormat::kGif:
+      return "gif";
+  }
+  return "";
+}
+
+const char* FamilyName(QtFormat format) {
+  switch (format) {
+    case QtFormat::kBitmap:
+      return "bitmap";
+    case QtFormat::kIcon:
+      return "icon";
+    case QtFormat::kGif:
+      return "GIF";
+  }
+  return "";
+}
+
+// Qt refuses decoded images above a process-wide limit (256 MB by default, less than a
+// 50-megapixel photo in 32 bits). Our own limit is checked from the header before reading, so
+// Qt's is raised to exactly what the largest accepted picture needs in 32 bits.
+void RaiseQtAllocationLimit() {
+  static std::once_flag once;
+  std::call_once(once, [] {
+    constexpr std::int64_t kMegabyte = 1024 * 1024;
+    QImageReader::setAllocationLimit(static_cast<int>(TBitmap32::kMaxPixels * 4 / kMegabyte + 1));
+  });
+}
+
+int BitDepth(QImage::Format format) {
+  switch (format) {
+    case QImage::Format_Mono:
+    case QImage::Format_MonoLSB:
+      return 1;
+    case QImage::Format_Indexed8:
+    case QImage::Format_Grayscale8:
+      return 8;
+    case QImage::Format_RGB16:
+    case QImage::Format_RGB555:
+      return 16;
+    case QImage::Format_RGB888:
+    case QImage::Format_BGR888:
+      return 24;
+    case QImage::Format_RGB32:
+      return 24;  // 32 bits of storage but no alpha: an icon's alpha makes it deeper
+    case QImage::Format_Invalid:
+      return 0;
+    default:
+      return 32;
+  }
+}
+
+// The largest entry wins, and of equally large ones the deepest; the first of equals.
+int ChooseIconEntry(QImageReader& reader) {
+  const int count = reader.imageCount();
+  int best = -1;
+  std::int64_t bestArea = -1;
+  int bestDepth = -1;
+  for (int i = 0; i < count; ++i) {
+    if (!reader.jumpToImage(i)) continue;
+    const QSize size = reader.size();
+    if (!size.isValid()) continue;
+    const std::int64_t area = std::int64_t{size.width()} * size.height();
+    const int depth = BitDepth(reader.imageFormat());
+    if (area > bestArea || (area == bestArea && depth > bestDepth)) {
+      best = i;
+      bestArea = area;
+      bestDepth = depth;
+    }
+  }
+  return best;
+}
+
+std::uint8_t OverWhite(unsigned channel, unsigned alpha) {
+  // 255 is odd, so adding 127 before dividing rounds to nearest without ties.
+  return static_cast<std::uint8_t>((channel * alpha + 255 * (255 - alpha) + 127) / 255);
+}
+
+void CompositeOverWhite(TBitmap32& bitmap) {
+  for (int y = 0; y < bitmap.Height(); ++y) {
+    Pixel* row = bitmap.ScanLine(y);
+    for (int x = 0; x < bitmap.Width(); ++x) {
+      Pixel& p = row[x];
+      if (p.a == 255) continue;
+      p = Pixel{OverWhite(p.b, p.a), OverWhite(p.g, p.a), OverWhite(p.r, p.a), p.a};
+    }
+  }
+}
+
+}  // namespace
+
+TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
+  RaiseQtAllocationLimit();
+  const char* family = FamilyName(format);
+  if (data.empty()) throw PictureFileError(std::string("The ") + family + " file is empty");
+  if (data.size() > static_cast<std::size_t>(std::numeric_limits<int>::max())) {
+    throw PictureFileError(std::string("The ") + family + " file is too large");
+  }
+  // The reader only looks at the bytes; no copy is made.
+  const QByteArray bytes = QByteArray::fromRawData(reinterpret_cast<const char*>(data.data()),
+                                                   static_cast<qsizetype>(data.size()));
+  QBuffer buffer;
+  buffer.setData(bytes);
+  buffer.open(QIODevice::ReadOnly);
+  QImageReader reader(&buffer, FormatName(format));
+  reader.setAutoDetectImageFormat(false);
+  reader.setDecideFormatFromContent(false);
+  reader.setAutoTransform(false);
+  if (!reader.canRead()) {
+    throw PictureFileError(std::string("The file is not a valid ") + family + " picture");
+  }
+  if (format == QtFormat::kIcon) {
+    const int entry = ChooseIconEntry(reader);
+    if (entry < 0 || !reader.jumpToImage(entry)) {
+      throw PictureFileError("The icon file holds no readable picture");
+    }
+  }
+  const QSize size = reader.size();
+  if (!size.isValid()) {
+    throw PictureFileError(std::string("The ") + family + " picture has no valid size");
+  }
+  CheckPictureSize(size.width(), size.height(), maxPixels, family);
+
+  QImage image;
+  if (!reader.read(&image) || image.isNull()) {
+    throw PictureFileError(std::string("Cannot read the ") + family +
+                           " picture: " + reader.errorString().toStdString());
+  }
+  CheckPictureSize(image.width(), image.height(), maxPixels, family);
+  if (image.format() != QImage::Format_ARGB32) {
+    image.convertTo(QImage::Format_ARGB32);
+    if (image.isNull()) throw PictureFileError("Out of memory");
+  }
+  TBitmap32 result(image.width(), image.height());
+  const std::size_t rowBytes = static_cast<std::size_t>(image.width()) * sizeof(Pixel);
+  for (int y = 0; y < image.height(); ++y) {
+    std::memcpy(result.ScanLine(y), image.constScanLine(y), rowBytes);
+  }
+  if (format != QtFormat::kBitmap) CompositeOverWhite(result);
+  return result;
+}
+
+std::vector<std::uint8_t> EncodePng(const TBitmap32& picture) {
+  if (picture.Empty()) throw PictureFileError("There is no picture to save");
+  const QImage image(reinterpret_cast<const uchar*>(picture.Data()), picture.Width(),
+                     picture.Height(), static_cast<qsizetype>(picture.Width()) * 4,
+                     QImage::Format_ARGB32);
+  QByteArray bytes;
+  QBuffer buffer(&bytes);
+  buffer.open(QIODevice::WriteOnly);
+  QImageWriter writer(&buffer, "png");
+  if (!writer.write(image)) {
+    throw PictureFileError("Cannot write the PNG picture: " + writer.errorString().toStdString());
+  }
+  return std::vector<std::uint8_t>(bytes.begin(), bytes.end());
+}
+
+}  // namespace quillane::codecs

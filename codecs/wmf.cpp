@@ -1,0 +1,169 @@
+// Windows metafiles through libwmf, played by its gd device into an in-memory true-colour
+// image. libwmf reads the bytes through its own bounds-checked memory stream; the header is
+// checked here first so that only plausible files reach it, and a status callback stops
+// playback that runs on without end.
+#include <libwmf/api.h>
+#include <libwmf/gd.h>
+
+#include <chrono>
+#include <cmath>
+
+#include "codecs/codec_internal.h"
+
+namespace quillane::codecs {
+namespace {
+
+constexpr std::uint32_t kPlaceableKey = 0x9AC6CDD7;
+constexpr std::size_t kPlaceableSize = 22;
+constexpr std::size_t kStandardHeaderSize = 18;
+
+std::uint16_t ReadWord(Bytes d, std::size_t at) {
+  return static_cast<std::uint16_t>(d[at] | d[at + 1] << 8);
+}
+std::uint32_t ReadDword(Bytes d, std::size_t at) {
+  return static_cast<std::uint32_t>(ReadWord(d, at)) |
+         static_cast<std::uint32_t>(ReadWord(d, at + 2)) << 16;
+}
+
+// The standard header: type 1 (memory) or 2 (disk), a header of 9 words, and a version.
+bool StandardHeaderAt(Bytes data, std::size_t at) {
+  if (data.size() < at + kStandardHeaderSize) return false;
+  const std::uint16_t type = ReadWord(data, at);
+  return (type == 1 || type == 2) && ReadWord(data, at + 2) == 9 &&
+         (ReadWord(data, at + 4) == 0x0100 || ReadWord(data, at + 4) == 0x0300);
+}
+
+// Walks the records so that a file whose record sizes run past its end is refused here
+// rather than left to the player.
+void CheckRecords(Bytes data, std::size_t at) {
+  at += kStandardHeaderSize;
+  while (true) {
+    if (data.size() - at < 6) throw PictureFileError("The metafile ends inside a record");
+    const std::uint64_t words = ReadDword(data, at);
+    const std::uint16_t function = ReadWord(data, at + 4);
+    if (words < 3 || words * 2 > data.size() - at) {
+      throw PictureFileError("The metafile has a record of a bad size");
+    }
+    if (function == 0) return;  // META_EOF
+    at += static_cast<std::size_t>(words * 2);
+  }
+}
+
+struct Playback {
+  std::chrono::steady_clock::time_point deadline;
+  bool timedOut = false;
+};
+
+int Status(void* context, float) {
+  auto* playback = static_cast<Playback*>(context);
+  if (std::chrono::steady_clock::now() > playback->deadline) playback->timedOut = true;
+  return playback->timedOut ? 1 : 0;
+}
+
+class WmfApi {
+ public:
+  WmfApi() {
+    wmfAPI_Options options{};
+    options.function = wmf_gd_function;
+    const unsigned long flags =
+        WMF_OPT_FUNCTION | WMF_OPT_IGNORE_NONFATAL | WMF_OPT_NO_ERROR | WMF_OPT_NO_DEBUG;
+    if (wmf_api_create(&api_, flags, &options) != wmf_E_None) {
+      if (api_ != nullptr) wmf_api_destroy(api_);
+      api_ = nullptr;
+      throw PictureFileError("The metafile reader could not start");
+    }
+  }
+  ~WmfApi() {
+    if (opened_) wmf_mem_close(api_);
+    wmf_api_destroy(api_);  // frees everything the player allocated, the gd image included
+  }
+  WmfApi(const WmfApi&) = delete;
+  WmfApi& operator=(const WmfApi&) = delete;
+
+  wmfAPI* get() { return api_; }
+  void Open(Bytes data) {
+    // libwmf only reads through this pointer; its interface lacks the const.
+    if (wmf_mem_open(api_, const_cast<unsigned char*>(data.data()),
+                     static_cast<long>(data.size())) != wmf_E_None) {
+      throw PictureFileError("The metafile cannot be opened");
+    }
+    opened_ = true;
+  }
+
+ private:
+  wmfAPI* api_ = nullptr;
+  bool opened_ = false;
+};
+
+}  // namespace
+
+TBitmap32 DecodeWindowsMetafile(Bytes data, std::int64_t maxPixels) {
+  std::size_t header = 0;
+  if (data.size() >= 4 && ReadDword(data, 0) == kPlaceableKey) header = kPlaceableSize;
+  if (!StandardHeaderAt(data, header)) {
+    throw PictureFileError("The file is not a Windows metafile");
+  }
+  if (data.size() > 0x7FFFFFFF) throw PictureFileError("The metafile is too large");
+  CheckRecords(data, header);
+
+  WmfApi api;
+  api.Open(data);
+  Playback playback;
+  playback.deadline = std::chrono::steady_clock::now() + std::chrono::seconds(20);
+  wmf_status_function(api.get(), &playback, Status);
+
+  wmfD_Rect bounds{};
+  if (wmf_scan(api.get(), 0, &bounds) != wmf_E_None) {
+    throw PictureFileError(playback.timedOut ? "The metafile takes too long to read"
+                                             : "The metafile is damaged");
+  }
+  unsigned int width = 0, height = 0;
+  if (wmf_display_size(api.get(), &width, &height, kMetafileDotsPerInch, kMetafileDotsPerInch) !=
+      wmf_E_None) {
+    throw PictureFileError("The metafile has no picture size");
+  }
+  if (!(std::isfinite(bounds.TL.x) && std::isfinite(bounds.TL.y) && std::isfinite(bounds.BR.x) &&
+        std::isfinite(bounds.BR.y)) ||
+      !(bounds.BR.x > bounds.TL.x) || !(bounds.BR.y > bounds.TL.y)) {
+    throw PictureFileError("The metafile has no picture size");
+  }
+  CheckPictureSize(width, height, maxPixels, "metafile");
+
+  auto* device = WMF_GD_GetData(api.get());
+  device->type = wmf_gd_image;
+  device->bbox = bounds;
+  device->width = width;
+  device->height = height;
+  if (wmf_play(api.get(), 0, &bounds) != wmf_E_None || device->gd_image == nullptr) {
+    throw PictureFileError(playback.timedOut ? "The metafile takes too long to draw"
+                                             : "The metafile cannot be drawn");
+  }
+  const int* pixels = wmf_gd_image_pixels(device->gd_image);
+  if (pixels == nullptr) throw PictureFileError("The metafile cannot be drawn");
+
+  // gd keeps 0x7F-scaled transparency in the top byte (0 opaque); paint it over white.
+  TBitmap32 result(static_cast<int>(width), static_cast<int>(height));
+  for (int y = 0; y < result.Height(); ++y) {
+    Pixel* row = result.ScanLine(y);
+    const int* source = pixels + static_cast<std::size_t>(y) * width;
+    for (int x = 0; x < result.Width(); ++x) {
+      const auto value = static_cast<std::uint32_t>(source[x]);
+      const unsigned transparency = (value >> 24) & 0x7F;
+      const unsigned alpha = 255 - (transparency * 255 + 63) / 127;
+      const auto over = [alpha](unsigned c) {
+        return static_cast<std::uint8_t>((c * alpha + 255 * (255 - alpha) + 127) / 255);
+      };
+      row[x] =
+          Pixel{over(value & 0xFF), over((value >> 8) & 0xFF), over((value >> 16) & 0xFF), 255};
+    }
+  }
+  return result;
+}
+
+TBitmap32 DecodeMetafile(Bytes data, std::int64_t maxPixels) {
+  if (data.empty()) throw PictureFileError("The metafile is empty");
+  if (LooksLikeEnhancedMetafile(data)) return DecodeEnhancedMetafile(data, maxPixels);
+  return DecodeWindowsMetafile(data, maxPixels);
+}
+
+}  // namespace quillane::codecs
