@@ -1,0 +1,453 @@
+#include "app/main_window.h"
+
+#include <QAction>
+#include <QCloseEvent>
+#include <QLabel>
+#include <QLocale>
+#include <QMenu>
+#include <QMenuBar>
+#include <QPainter>
+#include <QScrollArea>
+#include <QScrollBar>
+#include <QStatusBar>
+#include <QToolButton>
+#include <exception>
+#include <iterator>
+
+#include "app/glyphs.h"
+#include "app/picture_view.h"
+#include "app/platform.h"
+#include "app/tool_window.h"
+#include "data/startup_picture.h"
+#include "imaging/numeric.h"
+
+namespace quillane {
+namespace {
+
+constexpr int kInitialWidth = 540;
+constexpr int kInitialHeight = 473;
+constexpr int kBandGrip = 11;  // room left of each toolbar band for its grip
+constexpr int kButtonSide = 25;
+const QColor kStatusGray(128, 128, 128);
+const QColor kScrollBoxBackground(96, 100, 106);
+
+// The toolbar strip: bands (the panels inside it), each with a grip drawn to its left.
+class ControlBar : public QFrame {
+ public:
+  using QFrame::QFrame;
+
+ protected:
+  void paintEvent(QPaintEvent* event) override {
+    QFrame::paintEvent(event);
+    QPainter p(this);
+    const QColor light = palette().color(QPalette::Light);
+    const QColor dark = palette().color(QPalette::Mid);
+    for (const QObject* child : children()) {
+      const auto* band = qobject_cast<const QFrame*>(child);
+      if (band == nullptr || !band->isVisible()) continue;
+      const int x = band->x() - kBandGrip + 3;
+      for (int i = 0; i < 2; ++i) {
+        p.setPen(light);
+        p.drawLine(x + 3 * i, band->y() + 2, x + 3 * i, band->y() + band->height() - 3);
+        p.setPen(dark);
+        p.drawLine(x + 3 * i + 1, band->y() + 2, x + 3 * i + 1, band->y() + band->height() - 3);
+      }
+    }
+  }
+};
+
+QFrame* Band(QWidget* parent, const char* name, int x, int width) {
+  auto* band = new QFrame(parent);
+  band->setObjectName(name);
+  band->setGeometry(x, 2, width, 26);
+  return band;
+}
+
+}  // namespace
+
+TMyPicture::TMyPicture(PlatformServices& platform) : TMyPicture(platform, StartupPicture()) {}
+
+TMyPicture::TMyPicture(PlatformServices& platform, TBitmap32 picture)
+    : platform_(platform), document_(std::move(picture)), toolWindows_(Effects().size() + 1) {
+  setObjectName("TMyPicture");
+  setWindowTitle("Quillane v4.36");
+
+  auto* central = new QWidget(this);
+  central->setObjectName("centralWidget");
+  setCentralWidget(central);
+  BuildMenus();
+  BuildToolbar(central);
+  BuildView(central);
+
+  statusLine_ = new QLabel("New picture", central);
+  statusLine_->setObjectName("Label1");
+  QPalette gray = statusLine_->palette();
+  gray.setColor(QPalette::WindowText, kStatusGray);
+  statusLine_->setPalette(gray);
+
+  // A plain strip at the bottom edge with the size grip; it never shows a message.
+  statusBar()->setObjectName("StatusBar1");
+
+  // The arrow glyphs the tool windows copy onto their batch toggles.
+  auto* panel1 = new QWidget(central);
+  panel1->setObjectName("Panel1");
+  downArrow_ = new QToolButton(panel1);
+  downArrow_->setObjectName("dd");
+  downArrow_->setIcon(GlyphIcon(Glyph::ArrowDown));
+  upArrow_ = new QToolButton(panel1);
+  upArrow_->setObjectName("uu");
+  upArrow_->setIcon(GlyphIcon(Glyph::ArrowUp));
+  panel1->hide();
+
+  ShowWorking(zoomPercent_);
+  UpdateHistoryControls();
+  move(4, 3);
+  resize(kInitialWidth, kInitialHeight);
+}
+
+TMyPicture::~TMyPicture() = default;
+
+// --- Construction ----------------------------------------------------------------------------
+
+void TMyPicture::BuildMenus() {
+  QMenuBar* bar = menuBar();
+  bar->setObjectName("MainMenu1");
+  auto addMenu = [&](const QString& caption, const char* name) {
+    QMenu* menu = bar->addMenu(caption);
+    menu->setObjectName(name);
+    return menu;
+  };
+  auto addEntry = [](QMenu* menu, const QString& caption, const char* name) {
+    QAction* action = menu->addAction(caption);
+    action->setObjectName(name);
+    return action;
+  };
+
+  QMenu* file = addMenu(" File", "File1");
+  connect(addEntry(file, "Open", "Open1"), &QAction::triggered, this,
+          &TMyPicture::SpeedButton1Click);
+  connect(addEntry(file, "Save", "Save1"), &QAction::triggered, this,
+          &TMyPicture::SpeedButton2Click);
+  connect(addEntry(file, "Exit", "Exit1"), &QAction::triggered, this, &TMyPicture::Exit1Click);
+
+  QMenu* edit = addMenu(" Edit", "Edit1");
+  undoAction_ = addEntry(edit, "Undo", "Undo1");
+  connect(undoAction_, &QAction::triggered, this, &TMyPicture::SpeedButton3Click);
+  redoAction_ = addEntry(edit, "Redo", "Redo1");
+  connect(redoAction_, &QAction::triggered, this, &TMyPicture::SpeedButton18Click);
+  addEntry(edit, "Image size", "Imagesize1");
+
+  static const char* const kMenuNames[] = {"BW1", "Color1", "ColorAdjust1", "Veins1"};
+  int menuIndex = 0;
+  for (const MenuSpec& menuSpec : EffectMenus()) {
+    QMenu* menu = addMenu(QString::fromStdString(menuSpec.caption), kMenuNames[menuIndex++]);
+    for (int number : menuSpec.toolNumbers) {
+      const EffectSpec* spec = FindEffect(number);
+      // The entry is named after its handler without "Click", as every other entry is.
+      QString name = QString::fromStdString(spec->menuHandler);
+      name.chop(static_cast<int>(QStringLiteral("Click").size()));
+      QAction* entry =
+          addEntry(menu, QString::fromStdString(spec->menuEntry), name.toUtf8().constData());
+      connect(entry, &QAction::triggered, this, [this, number] { OpenTool(number); });
+    }
+  }
+
+  QMenu* help = addMenu(" Help", "Help1");
+  addEntry(help, "Online", "Online1");
+  addEntry(help, "About", "About1");
+
+  popupMenu_ = new QMenu(this);
+  popupMenu_->setObjectName("PopupMenu1");
+  connect(addEntry(popupMenu_, "Open a new picture", "Openanewpicture1"), &QAction::triggered, this,
+          &TMyPicture::SpeedButton1Click);
+  addEntry(popupMenu_, "Image size", "Imagesize2");
+  connect(addEntry(popupMenu_, "Save as", "Saveas1"), &QAction::triggered, this,
+          &TMyPicture::SpeedButton2Click);
+}
+
+QToolButton* TMyPicture::AddSpeedButton(QWidget* panel, const char* name, const QString& hint,
+                                        int x) {
+  auto* button = new QToolButton(panel);
+  button->setObjectName(name);
+  button->setToolTip(hint);
+  button->setAutoRaise(true);
+  button->setIconSize(QSize(20, 20));
+  button->setGeometry(x, 0, kButtonSide, kButtonSide + 1);
+  return button;
+}
+
+void TMyPicture::BuildToolbar(QWidget* central) {
+  controlBar_ = new ControlBar(central);
+  controlBar_->setObjectName("ControlBar1");
+  controlBar_->setFrameShape(QFrame::StyledPanel);
+  controlBar_->setFrameShadow(QFrame::Raised);
+
+  struct ButtonSpec {
+    const char* name;
+    const char* hint;
+    Glyph glyph;
+  };
+  static const ButtonSpec kPanel4[] = {
+      {"SpeedButton1", "Open a picture as foreground", Glyph::Open},
+      {"SpeedButton2", "Save", Glyph::Save},
+      {"SpeedButton7", "Renew", Glyph::Renew},
+      {"SpeedButton3", "Undo", Glyph::Undo},
+      {"SpeedButton18", "Redo", Glyph::Redo},
+      {"SpeedButton4", "Image size", Glyph::ImageSize},
+      {"SpeedButton5", "Zoom out the view", Glyph::ZoomOut},
+      {"SpeedButton6", "Zoom in the view", Glyph::ZoomIn},
+  };
+  static const ButtonSpec kPanel8[] = {
+      {"SpeedButton12", "Rotate Clockwise", Glyph::RotateClockwise},
+      {"SpeedButton8", "Rotate anticlockwise", Glyph::RotateAnticlockwise},
+      {"SpeedButton9", "Set as wallpaper", Glyph::Wallpaper},
+      {"SpeedButton10", "Print", Glyph::Print},
+      {"SpeedButton11", "Mail to friend", Glyph::Mail},
+  };
+
+  const int panel4Width = static_cast<int>(std::size(kPanel4)) * kButtonSide + 2;
+  panel4_ = Band(controlBar_, "Panel4", kBandGrip, panel4Width);
+  int x = 1;
+  for (const ButtonSpec& b : kPanel4) {
+    AddSpeedButton(panel4_, b.name, b.hint, x)->setIcon(GlyphIcon(b.glyph));
+    x += kButtonSide;
+  }
+
+  panel8_ = Band(controlBar_, "Panel8", kBandGrip + panel4Width + kBandGrip, 200);
+  zoomLabel_ = new QLabel("100%", panel8_);
+  zoomLabel_->setObjectName("Label5");
+  zoomLabel_->setAlignment(Qt::AlignCenter);
+  zoomLabel_->setGeometry(1, 0, 56, kButtonSide + 1);
+  x = 1 + 56 + 4;
+  for (const ButtonSpec& b : kPanel8) {
+    AddSpeedButton(panel8_, b.name, b.hint, x)->setIcon(GlyphIcon(b.glyph));
+    x += kButtonSide;
+  }
+
+  auto* open = panel4_->findChild<QToolButton*>("SpeedButton1");
+  connect(open, &QToolButton::clicked, this, &TMyPicture::SpeedButton1Click);
+  auto* save = panel4_->findChild<QToolButton*>("SpeedButton2");
+  connect(save, &QToolButton::clicked, this, &TMyPicture::SpeedButton2Click);
+  auto* renew = panel4_->findChild<QToolButton*>("SpeedButton7");
+  connect(renew, &QToolButton::clicked, this, &TMyPicture::SpeedButton7Click);
+  undoButton_ = panel4_->findChild<QToolButton*>("SpeedButton3");
+  connect(undoButton_, &QToolButton::clicked, this, &TMyPicture::SpeedButton3Click);
+  redoButton_ = panel4_->findChild<QToolButton*>("SpeedButton18");
+  connect(redoButton_, &QToolButton::clicked, this, &TMyPicture::SpeedButton18Click);
+}
+
+void TMyPicture::BuildView(QWidget* central) {
+  scrollBox_ = new QScrollArea(central);
+  scrollBox_->setObjectName("ScrollBox1");
+  scrollBox_->setWidgetResizable(false);
+  scrollBox_->setAlignment(Qt::AlignLeft | Qt::AlignTop);
+  QPalette background = scrollBox_->palette();
+  background.setColor(QPalette::Window, kScrollBoxBackground);
+  scrollBox_->setPalette(background);
+  scrollBox_->setBackgroundRole(QPalette::Window);
+  scrollBox_->viewport()->setAutoFillBackground(true);
+
+  image1_ = new PictureView;
+  image1_->setObjectName("Image1");
+  image1_->setToolTip("scroll the mouse-wheel to zoom out or zoom in");
+  image1_->setContextMenuPolicy(Qt::CustomContextMenu);
+  connect(image1_, &QWidget::customContextMenuRequested, this,
+          [this](const QPoint& pos) { popupMenu_->popup(image1_->mapToGlobal(pos)); });
+  scrollBox_->setWidget(image1_);
+}
+
+// --- Layout and lifecycle --------------------------------------------------------------------
+
+void TMyPicture::resizeEvent(QResizeEvent* event) {
+  QMainWindow::resizeEvent(event);
+  const int w = width();
+  const int h = height();
+  controlBar_->setGeometry(0, 0, w - 10, 30);
+  panel8_->resize(controlBar_->width() - panel4_->width() - 32, panel8_->height());
+  scrollBox_->setGeometry(2, 32, w - 13, h - 120);
+  statusLine_->move(5, scrollBox_->height() + 34);
+  statusLine_->adjustSize();
+}
+
+void TMyPicture::closeEvent(QCloseEvent* event) {
+  QMainWindow::closeEvent(event);
+  if (event->isAccepted()) emit closed();
+}
+
+void TMyPicture::Exit1Click() {
+  close();
+}
+
+// --- Document --------------------------------------------------------------------------------
+
+void TMyPicture::ShowWorking(double zoom) {
+  image1_->SetPicture(document_.Working());
+  SetDisplaySize(zoom);
+}
+
+void TMyPicture::SetDisplaySize(double zoom) {
+  const TBitmap32& picture = document_.Working();
+  const Extended z = zoom;
+  image1_->resize(Round(picture.Width() * z / 100), Round(picture.Height() * z / 100));
+}
+
+double TMyPicture::ZoomFromLabel() const {
+  QString number = zoomLabel_->text();
+  number.chop(1);
+  bool ok = false;
+  const double z = QLocale().toDouble(number, &ok);
+  if (ok) return z;
+  // The zoom commands write the label with the locale's separator; a label written in the C
+  // locale still reads.
+  const double c = QLocale::c().toDouble(number, &ok);
+  return ok ? c : zoomPercent_;
+}
+
+void TMyPicture::ShowNewPicture(TBitmap32 picture, bool resetHistory) {
+  document_.Load(std::move(picture));
+  if (resetHistory) document_.ResetHistory();
+  ShowWorking(zoomPercent_);
+  scrollBox_->horizontalScrollBar()->setValue(0);
+  scrollBox_->verticalScrollBar()->setValue(0);
+  UpdateHistoryControls();
+}
+
+bool TMyPicture::ApplyEffect(const EffectRoutine& routine, const EffectParams& params,
+                             const QString& status, bool recordHistory) {
+  TBitmap32 result;
+  try {
+    result = routine(EffectInput{document_.Source(), document_.Working(), params});
+  } catch (const std::exception& e) {
+    platform_.ShowError(QString::fromStdString(e.what()));
+    return false;
+  } catch (...) {
+    platform_.ShowError("The effect failed.");
+    return false;
+  }
+  document_.SetWorking(std::move(result));
+  ShowWorking(zoomPercent_);
+  if (recordHistory) backup();
+  SetStatusText(status);
+  return true;
+}
+
+void TMyPicture::backup() {
+  document_.Backup();
+  UpdateHistoryControls();
+}
+
+void TMyPicture::UpdateHistoryControls() {
+  undoButton_->setEnabled(document_.CanUndo());
+  undoAction_->setEnabled(document_.CanUndo());
+  redoButton_->setEnabled(document_.CanRedo());
+  redoAction_->setEnabled(document_.CanRedo());
+}
+
+void TMyPicture::SpeedButton3Click() {
+  if (document_.Undo()) {
+    ShowWorking(ZoomFromLabel());
+    SetStatusText("Undo");
+  }
+  UpdateHistoryControls();
+}
+
+void TMyPicture::SpeedButton18Click() {
+  if (document_.Redo()) {
+    ShowWorking(ZoomFromLabel());
+    SetStatusText("Redo");
+  }
+  UpdateHistoryControls();
+}
+
+void TMyPicture::SpeedButton7Click() {
+  document_.Renew();
+  ShowWorking(zoomPercent_);
+  scrollBox_->horizontalScrollBar()->setValue(0);
+  scrollBox_->verticalScrollBar()->setValue(0);
+  UpdateHistoryControls();
+}
+
+// Opening and saving files arrive with the picture codecs; until then the commands are there
+// and do nothing.
+void TMyPicture::SpeedButton1Click() {}
+void TMyPicture::SpeedButton2Click() {}
+
+QString TMyPicture::StatusText() const {
+  return statusLine_->text();
+}
+
+void TMyPicture::SetStatusText(const QString& text) {
+  statusLine_->setText(text);
+  statusLine_->adjustSize();
+}
+
+// --- Tool windows ----------------------------------------------------------------------------
+
+void TMyPicture::RegisterToolWindow(ToolWindow* window) {
+  const int number = window->Number();
+  if (number < 1 || number >= static_cast<int>(toolWindows_.size())) return;
+  toolWindows_[static_cast<std::size_t>(number)] = window;
+}
+
+ToolWindow* TMyPicture::ToolWindowAt(int number) const {
+  if (number < 1 || number >= static_cast<int>(toolWindows_.size())) return nullptr;
+  return toolWindows_[static_cast<std::size_t>(number)];
+}
+
+void TMyPicture::closetool() {
+  if (ToolWindow* open = ToolWindowAt(activeTool_)) open->close();
+}
+
+void TMyPicture::OpenTool(int number) {
+  closetool();
+  ToolWindow* window = ToolWindowAt(number);
+  if (window == nullptr) return;
+  const QRect main = frameGeometry();
+  // A window that was never shown has no frame yet; its frame is taken to be as wide as ours.
+  const int toolFrameWidth = window->width() + (main.width() - width());
+  window->move(main.left() + main.width() - toolFrameWidth - 25, main.top() + 84);
+  window->show();
+  window->raise();
+  window->activateWindow();
+}
+
+QIcon TMyPicture::DownArrowIcon() const {
+  return downArrow_->icon();
+}
+QIcon TMyPicture::UpArrowIcon() const {
+  return upArrow_->icon();
+}
+
+QRect TMyPicture::DisplayImageGeometry(int pictureWidth, int pictureHeight) {
+  if (pictureWidth < 1 || pictureHeight < 1) return QRect(2, 2, 0, 0);
+  if (static_cast<Extended>(pictureWidth) / pictureHeight >= 1) {
+    const int h = MulDiv(105, pictureHeight, pictureWidth);
+    const int t = (105 - h) / 2;
+    return QRect(2, t + 2, 105, h + 2);
+  }
+  const int w = MulDiv(105, pictureWidth, pictureHeight);
+  const int l = (105 - w) / 2;
+  return QRect(l + 2, 2, w + 2, 105);
+}
+
+void TMyPicture::DisplayImage(PictureView& control) const {
+  const QSize size = control.PictureSize();
+  control.setGeometry(DisplayImageGeometry(size.width(), size.height()));
+}
+
+void TMyPicture::OpenDir() {
+  const std::optional<QString> folder =
+      platform_.BrowseFolder("Open a directory to input pictures to convert.", inputFolder_);
+  if (!folder) return;
+  inputFolder_ = *folder;
+}
+
+void TMyPicture::OpenDir2() {
+  // Opens at the input folder, as the batch panels always have.
+  const std::optional<QString> folder =
+      platform_.BrowseFolder("Open a directory to output pictures.", inputFolder_);
+  if (!folder) return;
+  outputFolder_ = *folder;
+}
+
+}  // namespace quillane

@@ -1,0 +1,149 @@
+// The main window: the picture document with its history, the view of the working picture,
+// the menus and toolbar, and the shared state the tool windows work on (active tool number,
+// batch folders, line-art flag).
+#pragma once
+
+#include <QMainWindow>
+#include <QRect>
+#include <QString>
+#include <vector>
+
+#include "app/document.h"
+#include "effects/registry.h"
+
+class QAction;
+class QLabel;
+class QMenu;
+class QScrollArea;
+class QToolButton;
+class QFrame;
+
+namespace quillane {
+
+class PictureView;
+class PlatformServices;
+class ToolWindow;
+
+class TMyPicture : public QMainWindow {
+  Q_OBJECT
+
+ public:
+  // Starts on the program's built-in picture.
+  explicit TMyPicture(PlatformServices& platform);
+  // Starts on picture instead (its alpha set to 255).
+  TMyPicture(PlatformServices& platform, TBitmap32 picture);
+  ~TMyPicture() override;
+
+  PlatformServices& Platform() { return platform_; }
+  const PictureDocument& Document() const { return document_; }
+
+  // --- Document -----------------------------------------------------------------------------
+
+  // Makes picture the working, source and opened picture, shows it at the current zoom from
+  // the top-left corner, and (for a file the user opened) resets the history. The status line
+  // is left as it is.
+  void ShowNewPicture(TBitmap32 picture, bool resetHistory);
+
+  // Runs routine on the document (source picture in) and makes its result the working picture,
+  // then records a history step if asked and sets the status line to status. If the routine
+  // throws, the standard error box shows its message and document, history and status line
+  // stay as they were; the result is then false.
+  bool ApplyEffect(const EffectRoutine& routine, const EffectParams& params, const QString& status,
+                   bool recordHistory);
+
+  // The history step after a tool has written the working picture.
+  void backup();
+
+  // --- Status line and zoom -----------------------------------------------------------------
+
+  QString StatusText() const;
+  void SetStatusText(const QString& text);
+  double ZoomPercent() const { return zoomPercent_; }
+  // The number the zoom label shows (its caption without the "%").
+  double ZoomFromLabel() const;
+  // Size of Image1 for the working picture at zoom: Round(w * zoom / 100) by Round(h * ...).
+  void SetDisplaySize(double zoom);
+
+  // --- Tool windows -------------------------------------------------------------------------
+
+  void RegisterToolWindow(ToolWindow* window);
+  ToolWindow* ToolWindowAt(int number) const;
+  int ActiveTool() const { return activeTool_; }
+  void SetActiveTool(int number) { activeTool_ = number; }
+  // Closes the open tool window, if any.
+  void closetool();
+  // What a menu entry does: close the open tool window, place this one beside the main window
+  // and show it.
+  void OpenTool(int number);
+  // The arrows the batch toggles show, taken from the hidden buttons dd and uu.
+  QIcon DownArrowIcon() const;
+  QIcon UpArrowIcon() const;
+
+  // Fits a thumbnail control into a 105 by 105 area by its picture's proportions.
+  void DisplayImage(PictureView& control) const;
+  static QRect DisplayImageGeometry(int pictureWidth, int pictureHeight);
+
+  // --- Shared tool-window settings ------------------------------------------------------------
+
+  QString InputFolder() const { return inputFolder_; }
+  QString OutputFolder() const { return outputFolder_; }
+  void SetInputFolder(const QString& folder) { inputFolder_ = folder; }
+  void SetOutputFolder(const QString& folder) { outputFolder_ = folder; }
+  // The batch panels' Browse buttons: choose the input or output folder.
+  void OpenDir();
+  void OpenDir2();
+
+  bool LineArt() const { return lineArt_; }
+  void SetLineArt(bool on) { lineArt_ = on; }
+
+ public slots:
+  void SpeedButton1Click();   // open a picture
+  void SpeedButton2Click();   // save the working picture
+  void SpeedButton3Click();   // Undo
+  void SpeedButton18Click();  // Redo
+  void SpeedButton7Click();   // Renew
+  void Exit1Click();
+
+ signals:
+  // The main window has closed: the program ends.
+  void closed();
+
+ protected:
+  void resizeEvent(QResizeEvent* event) override;
+  void closeEvent(QCloseEvent* event) override;
+
+ private:
+  void BuildMenus();
+  void BuildToolbar(QWidget* central);
+  void BuildView(QWidget* central);
+  QToolButton* AddSpeedButton(QWidget* panel, const char* name, const QString& hint, int x);
+  // Image1 shows the working picture again, at the display size of zoom.
+  void ShowWorking(double zoom);
+  void UpdateHistoryControls();
+
+  PlatformServices& platform_;
+  PictureDocument document_;
+  double zoomPercent_ = 100.0;
+  int activeTool_ = 0;
+  QString inputFolder_;
+  QString outputFolder_;
+  bool lineArt_ = false;
+  std::vector<ToolWindow*> toolWindows_;  // owned as child widgets
+
+  QFrame* controlBar_ = nullptr;
+  QFrame* panel4_ = nullptr;
+  QFrame* panel8_ = nullptr;
+  QLabel* zoomLabel_ = nullptr;
+  QScrollArea* scrollBox_ = nullptr;
+  PictureView* image1_ = nullptr;
+  QLabel* statusLine_ = nullptr;
+  QMenu* popupMenu_ = nullptr;
+  QToolButton* undoButton_ = nullptr;
+  QToolButton* redoButton_ = nullptr;
+  QAction* undoAction_ = nullptr;
+  QAction* redoAction_ = nullptr;
+  QToolButton* downArrow_ = nullptr;
+  QToolButton* upArrow_ = nullptr;
+};
+
+}  // namespace quillane

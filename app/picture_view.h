@@ -1,0 +1,34 @@
+// An image control: shows a picture stretched to the control's own size, pixel by nearest
+// pixel, and opaque (the alpha byte is ignored, as a plain bitmap shows it).
+#pragma once
+
+#include <QImage>
+#include <QWidget>
+
+#include "imaging/bitmap32.h"
+
+namespace quillane {
+
+class PictureView : public QWidget {
+  Q_OBJECT
+
+ public:
+  explicit PictureView(QWidget* parent = nullptr);
+
+  // Takes a copy of picture; the control's size is left to the caller.
+  void SetPicture(const TBitmap32& picture);
+  // Size of the picture (not of the control).
+  QSize PictureSize() const { return image_.size(); }
+  const QImage& Image() const { return image_; }
+
+ protected:
+  void paintEvent(QPaintEvent* event) override;
+
+ private:
+  QImage image_;
+};
+
+// The picture as a QImage that ignores alpha, sharing nothing with picture.
+QImage OpaqueImage(const TBitmap32& picture);
+
+}  // namespace quillane

@@ -1,0 +1,74 @@
+#include "effects/mono/bw_sketch_window.h"
+
+#include <QLabel>
+#include <QPainter>
+#include <QVBoxLayout>
+
+#include "app/main_window.h"
+
+namespace quillane {
+namespace {
+
+const QColor kUnchosenGray(128, 128, 128);
+
+// The dashed line that separates the two sliders.
+class DashedSeparator : public QLabel {
+ public:
+  explicit DashedSeparator(QWidget* parent) : QLabel(parent) { setFixedHeight(7); }
+
+ protected:
+  void paintEvent(QPaintEvent*) override {
+    QPainter p(this);
+    p.setPen(QPen(palette().color(QPalette::Mid), 1, Qt::DashLine));
+    const int y = height() / 2;
+    p.drawLine(0, y, width() - 1, y);
+  }
+};
+
+void SetTextColor(QLabel* label, const QColor& color) {
+  if (label == nullptr) return;
+  QPalette palette = label->palette();
+  palette.setColor(QPalette::WindowText, color);
+  label->setPalette(palette);
+}
+
+}  // namespace
+
+TBack_and_White_Sketch::TBack_and_White_Sketch(TMyPicture& main)
+    : ToolWindow(*FindEffect(1), main) {
+  auto* separator = new DashedSeparator(this);
+  separator->setObjectName("Label5");
+  ControlsLayout()->insertWidget(1, separator);
+  MarkToneMode(PencilToneMode::Contrast);
+}
+
+PencilToneMode TBack_and_White_Sketch::ToneMode() const {
+  return static_cast<PencilToneMode>(Params().GetInt("tone-mode"));
+}
+
+void TBack_and_White_Sketch::FormShow() {
+  ToolWindow::FormShow();
+  SetHiddenParam("tone-mode", static_cast<int>(PencilToneMode::Contrast));
+  // The labels follow the mode, so a showing that chooses Contrast also shows it.
+  MarkToneMode(PencilToneMode::Contrast);
+  Main().SetLineArt(false);
+}
+
+void TBack_and_White_Sketch::AfterApply() {
+  Main().SetLineArt(false);
+}
+
+void TBack_and_White_Sketch::ControlChanged(const ControlSpec&, int) {
+  MarkToneMode(ToneMode());
+}
+
+void TBack_and_White_Sketch::MarkToneMode(PencilToneMode mode) {
+  const QColor text = palette().color(QPalette::WindowText);
+  const bool contrast = mode == PencilToneMode::Contrast;
+  SetTextColor(FindLabel("Label1"), contrast ? text : kUnchosenGray);
+  SetTextColor(FindLabel("Label4"), contrast ? text : kUnchosenGray);
+  SetTextColor(FindLabel("Label2"), contrast ? kUnchosenGray : text);
+  SetTextColor(FindLabel("Label3"), contrast ? kUnchosenGray : text);
+}
+
+}  // namespace quillane

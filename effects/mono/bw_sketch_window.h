@@ -1,0 +1,29 @@
+// The pencil sketch window: two sliders, of which the one moved last chooses the tone
+// adjustment; its labels are drawn in the window-text colour and the other slider's in gray.
+#pragma once
+
+#include "app/tool_window.h"
+#include "effects/mono/bw_sketch.h"
+
+namespace quillane {
+
+class TBack_and_White_Sketch : public ToolWindow {
+  Q_OBJECT
+
+ public:
+  explicit TBack_and_White_Sketch(TMyPicture& main);
+
+  PencilToneMode ToneMode() const;
+
+ protected:
+  void FormShow() override;
+  void AfterApply() override;
+  void ControlChanged(const ControlSpec& control, int value) override;
+
+ private:
+  // Label1 and Label4 for Contrast, Label2 and Label3 for Lighting: the chosen pair in the
+  // window-text colour, the other in gray.
+  void MarkToneMode(PencilToneMode mode);
+};
+
+}  // namespace quillane

@@ -1,0 +1,69 @@
+// Shared set-up of the window tests: one QApplication for the test program, and a main window
+// with all its tool windows on a scripted platform.
+#pragma once
+
+#include <gtest/gtest.h>
+
+#include <QApplication>
+#include <QMenuBar>
+#include <QString>
+#include <memory>
+
+#include "app/main_window.h"
+#include "app/tool_window.h"
+#include "app/tool_windows.h"
+#include "tests/gui/scripted_platform.h"
+
+namespace quillane {
+
+inline QApplication& Application() {
+  static int argc = 1;
+  static char name[] = "gui_tests";
+  static char* argv[] = {name, nullptr};
+  static QApplication app(argc, argv);
+  return app;
+}
+
+// A small picture with a different colour in every pixel, so effects change it visibly.
+inline TBitmap32 TestPicture(int width = 24, int height = 16) {
+  TBitmap32 picture(width, height);
+  for (int y = 0; y < height; ++y)
+    for (int x = 0; x < width; ++x)
+      picture.At(x, y) = Pixel{static_cast<std::uint8_t>(x * 10), static_cast<std::uint8_t>(y * 15),
+                               static_cast<std::uint8_t>((x * y) % 256), 255};
+  return picture;
+}
+
+class GuiTest : public ::testing::Test {
+ protected:
+  void SetUp() override {
+    Application();
+    main_ = std::make_unique<TMyPicture>(platform_, TestPicture());
+    CreateToolWindows(*main_);
+    main_->show();
+  }
+
+  void TearDown() override { main_.reset(); }
+
+  TMyPicture& Main() { return *main_; }
+
+  // A widget of the main window itself (not of a tool window) by object name.
+  template <typename T>
+  T* MainChild(const char* name) {
+    return Main().centralWidget()->findChild<T*>(name);
+  }
+
+  QAction* MenuAction(const QString& name) { return Main().menuBar()->findChild<QAction*>(name); }
+
+  ToolWindow& Tool(int number) { return *Main().ToolWindowAt(number); }
+
+  template <typename T>
+  T* ToolChild(int number, const char* name) {
+    return Tool(number).findChild<T*>(name);
+  }
+
+  ScriptedPlatform platform_;
+  std::unique_ptr<TMyPicture> main_;
+};
+
+}  // namespace quillane

@@ -1,0 +1,152 @@
+#include <QLabel>
+#include <QPushButton>
+#include <QSlider>
+#include <QToolButton>
+
+#include "app/picture_view.h"
+#include "effects/mono/bw_sketch.h"
+#include "effects/mono/bw_sketch_window.h"
+#include "tests/gui/gui_fixture.h"
+
+namespace quillane {
+namespace {
+
+class PencilWindow : public GuiTest {
+ protected:
+  void SetUp() override {
+    GuiTest::SetUp();
+    MenuAction("Pencilsketch1")->trigger();
+  }
+
+  TBack_and_White_Sketch& Pencil() { return dynamic_cast<TBack_and_White_Sketch&>(Tool(1)); }
+  QSlider* Slider(const char* name) { return ToolChild<QSlider>(1, name); }
+  QLabel* Label(const char* name) { return ToolChild<QLabel>(1, name); }
+  QString Text(const char* name) { return Label(name)->text(); }
+  QColor Color(const char* name) { return Label(name)->palette().color(QPalette::WindowText); }
+  void PressOk() { ToolChild<QPushButton>(1, "Button1")->click(); }
+
+  // Contrast chosen: its labels in the window's text colour, Lighting's in gray.
+  void ExpectContrastMarked(bool contrast) {
+    const QColor text = Pencil().palette().color(QPalette::WindowText);
+    const QColor gray(128, 128, 128);
+    EXPECT_EQ(Color("Label1"), contrast ? text : gray);
+    EXPECT_EQ(Color("Label4"), contrast ? text : gray);
+    EXPECT_EQ(Color("Label2"), contrast ? gray : text);
+    EXPECT_EQ(Color("Label3"), contrast ? gray : text);
+  }
+};
+
+TEST_F(PencilWindow, ShowsItsControlsAsDesigned) {
+  EXPECT_EQ(Pencil().windowTitle(), "Pencil_Sketch");
+  EXPECT_EQ(Text("Label1"), "Contrast:");
+  EXPECT_EQ(Text("Label2"), "Lighting:");
+  EXPECT_EQ(Text("Label4"), "50");
+  EXPECT_EQ(Text("Label3"), "50");
+  ASSERT_NE(Label("Label5"), nullptr);
+  EXPECT_GT(Label("Label5")->y(), Slider("TrackBar1")->y());
+  EXPECT_LT(Label("Label5")->y(), Slider("TrackBar2")->y());
+  EXPECT_EQ(Slider("TrackBar1")->minimum(), 0);
+  EXPECT_EQ(Slider("TrackBar1")->maximum(), 89);
+  EXPECT_EQ(Slider("TrackBar1")->value(), 45);
+  EXPECT_EQ(Slider("TrackBar2")->minimum(), 0);
+  EXPECT_EQ(Slider("TrackBar2")->maximum(), 255);
+  EXPECT_EQ(Slider("TrackBar2")->value(), 128);
+  auto* colorUp = ToolChild<QToolButton>(1, "Button2");
+  EXPECT_EQ(colorUp->toolTip(), "Color up");
+  EXPECT_FALSE(colorUp->isEnabled());
+  ExpectContrastMarked(true);
+}
+
+TEST_F(PencilWindow, NumberLabelsShowPercentOfTheRange) {
+  Slider("TrackBar1")->setValue(46);
+  EXPECT_EQ(Text("Label4"), "52");
+  Slider("TrackBar1")->setValue(45);
+  EXPECT_EQ(Text("Label4"), "51");  // not the "50" it started with
+  Slider("TrackBar1")->setValue(0);
+  EXPECT_EQ(Text("Label4"), "0");
+  Slider("TrackBar1")->setValue(89);
+  EXPECT_EQ(Text("Label4"), "100");
+
+  Slider("TrackBar2")->setValue(255);
+  EXPECT_EQ(Text("Label3"), "100");
+  Slider("TrackBar2")->setValue(0);
+  EXPECT_EQ(Text("Label3"), "0");
+  Slider("TrackBar2")->setValue(128);
+  EXPECT_EQ(Text("Label3"), "50");
+  EXPECT_EQ(Text("Label4"), "100");
+}
+
+TEST_F(PencilWindow, OkDrawsThePictureAndRecordsIt) {
+  Main().SetLineArt(true);
+  const TBitmap32 source = Main().Document().Source();
+  PressOk();
+  const TBitmap32 expected = peccilsketch(source, PencilToneMode::Contrast, 45, 128);
+  EXPECT_EQ(Main().Document().Working(), expected);
+  EXPECT_NE(Main().Document().Working(), source);
+  EXPECT_EQ(Main().Document().Source(), source);
+  EXPECT_EQ(Main().Document().UndoCount(), 1);
+  EXPECT_EQ(Main().Document().Slot(Main().Document().CurrentSlot()), expected);
+  EXPECT_EQ(Main().StatusText(), "Pencil Sketch");
+  EXPECT_FALSE(Main().LineArt());
+  EXPECT_TRUE(ToolChild<QToolButton>(1, "Button2")->isEnabled());
+  EXPECT_TRUE(Main().centralWidget()->findChild<QToolButton*>("SpeedButton3")->isEnabled());
+  EXPECT_EQ(Main().findChild<PictureView*>("Image1")->Image(), OpaqueImage(expected));
+
+  // Applying again starts from the source picture, not from the drawing.
+  PressOk();
+  EXPECT_EQ(Main().Document().Working(), expected);
+  EXPECT_EQ(Main().Document().UndoCount(), 2);
+
+  Main().SpeedButton3Click();
+  Main().SpeedButton3Click();
+  EXPECT_EQ(Main().Document().Working(), source);
+  EXPECT_EQ(Main().StatusText(), "Undo");
+}
+
+TEST_F(PencilWindow, TheSliderMovedLastChoosesTheTone) {
+  const TBitmap32 source = Main().Document().Source();
+  Slider("TrackBar1")->setValue(30);
+  EXPECT_EQ(Pencil().ToneMode(), PencilToneMode::Contrast);
+  Slider("TrackBar2")->setValue(90);
+  EXPECT_EQ(Pencil().ToneMode(), PencilToneMode::Lighting);
+  ExpectContrastMarked(false);
+  PressOk();
+  EXPECT_EQ(Main().Document().Working(), peccilsketch(source, PencilToneMode::Lighting, 30, 90));
+
+  Slider("TrackBar1")->setValue(60);
+  ExpectContrastMarked(true);
+  PressOk();
+  EXPECT_EQ(Main().Document().Working(), peccilsketch(source, PencilToneMode::Contrast, 60, 90));
+}
+
+TEST_F(PencilWindow, ShowingTheWindowAgainChoosesContrast) {
+  Slider("TrackBar2")->setValue(200);
+  ExpectContrastMarked(false);
+  Pencil().close();
+  Main().SetLineArt(true);
+  MenuAction("Pencilsketch1")->trigger();
+
+  EXPECT_EQ(Pencil().ToneMode(), PencilToneMode::Contrast);
+  ExpectContrastMarked(true);
+  EXPECT_FALSE(Main().LineArt());
+  // The slider keeps its place between showings.
+  EXPECT_EQ(Slider("TrackBar2")->value(), 200);
+  EXPECT_EQ(Text("Label3"), "78");
+  PressOk();
+  EXPECT_EQ(Main().Document().Working(),
+            peccilsketch(Main().Document().Source(), PencilToneMode::Contrast, 45, 200));
+}
+
+TEST_F(PencilWindow, TheBatchRoutineLeavesTheHistoryAlone) {
+  Main().SetLineArt(true);
+  ASSERT_TRUE(Pencil().BatchRoutine());
+  EXPECT_EQ(Main().Document().Working(),
+            peccilsketch(Main().Document().Source(), PencilToneMode::Contrast, 45, 128));
+  EXPECT_EQ(Main().Document().UndoCount(), 0);
+  EXPECT_EQ(Main().StatusText(), "Pencil Sketch");
+  EXPECT_FALSE(Main().LineArt());
+  EXPECT_TRUE(ToolChild<QToolButton>(1, "Button2")->isEnabled());
+}
+
+}  // namespace
+}  // namespace quillane

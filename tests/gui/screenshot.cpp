@@ -1,0 +1,33 @@
+// Not a test: shows the main window with the pencil window (batch panel open) on a real
+// display and saves the screen as a PNG, to look at the windows as a user sees them.
+//   xvfb-run -a -s "-screen 0 1280x1024x24" ./gui_screenshot out.png
+#include <QApplication>
+#include <QScreen>
+#include <QTimer>
+
+#include "app/main_window.h"
+#include "app/qt_platform.h"
+#include "app/tool_window.h"
+#include "app/tool_windows.h"
+
+int main(int argc, char* argv[]) {
+  QApplication app(argc, argv);
+  const QString out = argc > 1 ? QString::fromLocal8Bit(argv[1]) : "quillane.png";
+  quillane::QtPlatformServices platform;
+  quillane::TMyPicture window(platform);
+  quillane::CreateToolWindows(window);
+  window.show();
+  window.OpenTool(1);
+  if (argc > 2) {
+    window.ToolWindowAt(1)->SpeedButton1Click();
+    window.ToolWindowAt(1)->Button1Click();
+  }
+  QTimer::singleShot(700, [&] {
+    const QPixmap screen = QApplication::primaryScreen()->grabWindow(0);
+    screen.copy(0, 0, 580, 500).save(out);
+    // The toolbar three times as large, to judge the glyphs.
+    screen.copy(0, 20, 560, 40).scaled(1680, 120).save(out + ".toolbar.png");
+    app.quit();
+  });
+  return app.exec();
+}

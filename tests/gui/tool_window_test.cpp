@@ -1,0 +1,206 @@
+#include <QFrame>
+#include <QLabel>
+#include <QLineEdit>
+#include <QPushButton>
+#include <QSignalSpy>
+#include <QToolButton>
+
+#include "tests/gui/gui_fixture.h"
+
+namespace quillane {
+namespace {
+
+using ToolWindows = GuiTest;
+
+QString EntryName(const EffectSpec& spec) {
+  QString name = QString::fromStdString(spec.menuHandler);
+  name.chop(5);  // "Click"
+  return name;
+}
+
+int VisibleToolWindows(TMyPicture& main) {
+  int visible = 0;
+  for (const EffectSpec& spec : Effects())
+    if (main.ToolWindowAt(spec.toolNumber)->isVisible()) ++visible;
+  return visible;
+}
+
+TEST_F(ToolWindows, EveryMenuEntryOpensItsOwnWindowAlone) {
+  ASSERT_EQ(Effects().size(), 17u);
+  for (const EffectSpec& spec : Effects()) {
+    QAction* entry = MenuAction(EntryName(spec));
+    ASSERT_NE(entry, nullptr) << spec.menuHandler;
+    entry->trigger();
+    ToolWindow& window = Tool(spec.toolNumber);
+    EXPECT_TRUE(window.isVisible()) << spec.windowClass;
+    EXPECT_EQ(window.objectName().toStdString(), spec.windowClass);
+    EXPECT_EQ(window.windowTitle().toStdString(), spec.caption);
+    EXPECT_EQ(Main().ActiveTool(), spec.toolNumber) << spec.windowClass;
+    EXPECT_EQ(VisibleToolWindows(Main()), 1) << spec.windowClass;
+
+    const Qt::WindowFlags flags = window.windowFlags();
+    EXPECT_EQ(flags & Qt::WindowType_Mask, Qt::Tool);
+    EXPECT_TRUE(flags & Qt::WindowStaysOnTopHint);
+    EXPECT_TRUE(flags & Qt::WindowCloseButtonHint);
+    EXPECT_FALSE(flags & (Qt::WindowMinimizeButtonHint | Qt::WindowMaximizeButtonHint));
+    ASSERT_NE(window.findChild<QPushButton*>("Button1"), nullptr);
+    EXPECT_EQ(window.findChild<QPushButton*>("Button1")->text(), "OK");
+    EXPECT_EQ(window.findChild<QToolButton*>("Button2") != nullptr, spec.colorUp);
+  }
+}
+
+TEST_F(ToolWindows, OpeningAnotherWindowClosesTheOpenOne) {
+  MenuAction("Pencilsketch1")->trigger();
+  ASSERT_EQ(Main().ActiveTool(), 1);
+
+  // The pencil window closes first (the number is 0 then), and only then Emboss opens.
+  int activeWhenPencilClosed = -1;
+  struct CloseWatcher : QObject {
+    TMyPicture* main;
+    int* seen;
+    bool eventFilter(QObject*, QEvent* event) override {
+      if (event->type() == QEvent::Hide) *seen = main->ActiveTool();
+      return false;
+    }
+  } watcher;
+  watcher.main = &Main();
+  watcher.seen = &activeWhenPencilClosed;
+  Tool(1).installEventFilter(&watcher);
+
+  MenuAction("Emboss1")->trigger();
+  EXPECT_EQ(activeWhenPencilClosed, 0);
+  EXPECT_FALSE(Tool(1).isVisible());
+  EXPECT_TRUE(Tool(15).isVisible());
+  EXPECT_EQ(Main().ActiveTool(), 15);
+  Tool(1).removeEventFilter(&watcher);
+}
+
+TEST_F(ToolWindows, TheCloseBoxClearsTheActiveTool) {
+  MenuAction("Verticalstria1")->trigger();
+  ASSERT_EQ(Main().ActiveTool(), 17);
+  Tool(17).close();
+  EXPECT_EQ(Main().ActiveTool(), 0);
+  EXPECT_FALSE(Tool(17).isVisible());
+  // Nothing is open, so closing the open tool closes nothing.
+  Main().closetool();
+  EXPECT_EQ(Main().ActiveTool(), 0);
+}
+
+TEST_F(ToolWindows, ChoosingTheOpenWindowAgainShowsItAfresh) {
+  MenuAction("Pencilsketch1")->trigger();
+  Tool(1).findChild<QPushButton*>("Button1")->click();
+  auto* colorUp = Tool(1).findChild<QToolButton*>("Button2");
+  ASSERT_TRUE(colorUp->isEnabled());
+  MenuAction("Pencilsketch1")->trigger();
+  EXPECT_TRUE(Tool(1).isVisible());
+  EXPECT_EQ(Main().ActiveTool(), 1);
+  EXPECT_FALSE(colorUp->isEnabled());
+}
+
+TEST_F(ToolWindows, WindowsOpenBesideTheMainWindow) {
+  MenuAction("Emboss1")->trigger();
+  const QRect main = Main().frameGeometry();
+  const ToolWindow& emboss = Tool(15);
+  EXPECT_EQ(
+      emboss.frameGeometry().topLeft(),
+      QPoint(main.left() + main.width() - emboss.frameGeometry().width() - 25, main.top() + 84));
+}
+
+TEST_F(ToolWindows, BatchPanelFoldsOutAndBackIn) {
+  for (const EffectSpec& spec : Effects()) {
+    ToolWindow& window = Tool(spec.toolNumber);
+    auto* toggle = window.findChild<QToolButton*>("SpeedButton1");
+    auto* panel = window.findChild<QFrame*>("Panel2");
+    if (!spec.HasBatchPanel()) {
+      EXPECT_EQ(toggle, nullptr) << spec.windowClass;
+      EXPECT_EQ(panel, nullptr) << spec.windowClass;
+      EXPECT_GE(window.height(), 90) << spec.windowClass;
+      continue;
+    }
+    ASSERT_NE(toggle, nullptr) << spec.windowClass;
+    ASSERT_NE(panel, nullptr) << spec.windowClass;
+    MenuAction(EntryName(spec))->trigger();
+    EXPECT_EQ(window.height(), spec.collapsedHeight) << spec.windowClass;
+    EXPECT_FALSE(panel->isVisible());
+    EXPECT_EQ(toggle->toolTip(), "Show batch convert");
+    EXPECT_EQ(toggle->icon().cacheKey(), Main().DownArrowIcon().cacheKey());
+
+    toggle->click();
+    EXPECT_EQ(window.height(), spec.expandedHeight) << spec.windowClass;
+    EXPECT_TRUE(panel->isVisible());
+    EXPECT_EQ(toggle->toolTip(), "Hide batch convert");
+    EXPECT_EQ(toggle->icon().cacheKey(), Main().UpArrowIcon().cacheKey());
+
+    toggle->click();
+    EXPECT_EQ(window.height(), spec.collapsedHeight) << spec.windowClass;
+    EXPECT_FALSE(panel->isVisible());
+    EXPECT_EQ(toggle->toolTip(), "Show batch convert");
+    EXPECT_EQ(toggle->icon().cacheKey(), Main().DownArrowIcon().cacheKey());
+  }
+}
+
+TEST_F(ToolWindows, BatchPanelHasItsFieldsAndButtons) {
+  ToolWindow& window = Tool(15);
+  EXPECT_EQ(window.findChild<QLabel*>("Label6")->text(), "Input:");
+  EXPECT_EQ(window.findChild<QLabel*>("Label7")->text(), "Output:");
+  EXPECT_NE(window.findChild<QLineEdit*>("Edit1"), nullptr);
+  EXPECT_NE(window.findChild<QLineEdit*>("Edit2"), nullptr);
+  EXPECT_EQ(window.findChild<QToolButton*>("SpeedButton2")->text(), "Browse");
+  EXPECT_EQ(window.findChild<QToolButton*>("SpeedButton3")->text(), "Browse");
+  EXPECT_EQ(window.findChild<QToolButton*>("SpeedButton4")->text(), "Convert");
+
+  QSignalSpy convert(&window, &ToolWindow::batchConvertRequested);
+  window.findChild<QToolButton*>("SpeedButton4")->click();
+  EXPECT_EQ(convert.count(), 1);
+}
+
+TEST_F(ToolWindows, FoldersAreSharedBetweenWindows) {
+  MenuAction("Emboss1")->trigger();
+  platform_.folderAnswers.push_back(QString("/photos/in"));
+  ToolChild<QToolButton>(15, "SpeedButton2")->click();
+  EXPECT_EQ(ToolChild<QLineEdit>(15, "Edit1")->text(), "/photos/in");
+  ASSERT_EQ(platform_.folderRequests.size(), 1u);
+  EXPECT_EQ(platform_.folderRequests[0].title, "Open a directory to input pictures to convert.");
+  EXPECT_EQ(platform_.folderRequests[0].startFolder, "");
+
+  // The output folder dialog opens at the input folder.
+  platform_.folderAnswers.push_back(QString("/photos/out"));
+  ToolChild<QToolButton>(15, "SpeedButton3")->click();
+  EXPECT_EQ(ToolChild<QLineEdit>(15, "Edit2")->text(), "/photos/out");
+  EXPECT_EQ(platform_.folderRequests[1].title, "Open a directory to output pictures.");
+  EXPECT_EQ(platform_.folderRequests[1].startFolder, "/photos/in");
+
+  MenuAction("Pencilsketch1")->trigger();
+  EXPECT_EQ(ToolChild<QLineEdit>(1, "Edit1")->text(), "/photos/in");
+  EXPECT_EQ(ToolChild<QLineEdit>(1, "Edit2")->text(), "/photos/out");
+
+  // A cancelled dialog keeps the folder, and the field shows the shared folder again.
+  ToolChild<QLineEdit>(1, "Edit1")->setText("typed");
+  ToolChild<QToolButton>(1, "SpeedButton2")->click();
+  EXPECT_EQ(Main().InputFolder(), "/photos/in");
+  EXPECT_EQ(ToolChild<QLineEdit>(1, "Edit1")->text(), "/photos/in");
+}
+
+TEST_F(ToolWindows, AWindowWhoseEffectIsNotThereYetOnlyOpensAndCloses) {
+  for (const EffectSpec& spec : Effects()) {
+    if (spec.routine) continue;
+    MenuAction(EntryName(spec))->trigger();
+    Tool(spec.toolNumber).findChild<QPushButton*>("Button1")->click();
+    EXPECT_EQ(Main().StatusText(), "New picture") << spec.windowClass;
+    EXPECT_FALSE(Main().Document().CanUndo()) << spec.windowClass;
+    Tool(spec.toolNumber).close();
+    EXPECT_EQ(Main().ActiveTool(), 0);
+  }
+}
+
+TEST_F(ToolWindows, ColorUpAsksForTheFreehandWindows) {
+  MenuAction("Pencilsketch1")->trigger();
+  QSignalSpy colorUp(&Tool(1), &ToolWindow::colorUpRequested);
+  Tool(1).findChild<QPushButton*>("Button1")->click();
+  Tool(1).findChild<QToolButton*>("Button2")->click();
+  EXPECT_EQ(colorUp.count(), 1);
+  EXPECT_TRUE(Tool(1).isVisible());
+}
+
+}  // namespace
+}  // namespace quillane
