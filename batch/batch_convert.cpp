@@ -1,0 +1,178 @@
+#include "batch/batch_convert.h"
+
+#include <algorithm>
+#include <exception>
+#include <filesystem>
+#include <optional>
+#include <stdexcept>
+#include <system_error>
+#include <utility>
+
+#include "codecs/picture_file.h"
+
+namespace quillane {
+namespace fs = std::filesystem;
+
+namespace {
+
+char LowerAscii(char c) {
+  return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c;
+}
+
+// "*.jpg" matches every name that ends with ".jpg" in any case; only the extension is compared,
+// so "*.jpg" does not also catch "x.jpeg".
+bool MatchesMask(const std::string& name, std::string_view mask) {
+  const std::string_view tail = mask.substr(1);  // ".jpg"
+  if (name.size() < tail.size()) return false;
+  const std::size_t start = name.size() - tail.size();
+  for (std::size_t i = 0; i < tail.size(); ++i)
+    if (LowerAscii(name[start + i]) != tail[i]) return false;
+  return true;
+}
+
+std::string JoinPath(const std::string& folder, const std::string& name) {
+  if (!folder.empty() && folder.back() == '/') return folder + name;
+  return folder + "/" + name;
+}
+
+std::string NotValidFormat(const std::string& path) {
+  return path + " is not a valid format";
+}
+
+}  // namespace
+
+std::string NamingTheFile(const std::string& path, const std::string& message) {
+  if (message.find(path) != std::string::npos) return message;
+  return path + ": " + message;
+}
+
+std::vector<std::string> ScanBatchFolder(const std::string& folder) {
+  std::vector<std::string> names;
+  std::error_code ec;
+  fs::directory_iterator it(folder, ec);
+  if (ec) return {};
+  for (const fs::directory_iterator end; it != end; it.increment(ec)) {
+    if (ec) break;
+    std::error_code typeError;
+    if (!it->is_regular_file(typeError)) continue;
+    names.push_back(it->path().filename().string());
+  }
+  std::sort(names.begin(), names.end());
+
+  std::vector<std::string> list;
+  for (std::string_view mask : kBatchMasks)
+    for (const std::string& name : names)
+      if (MatchesMask(name, mask)) list.push_back(name);
+  return list;
+}
+
+std::string TrimBlanks(const std::string& text) {
+  // Spaces and control characters, the blanks a pasted path picks up.
+  auto blank = [](char c) { return static_cast<unsigned char>(c) <= ' '; };
+  std::size_t first = 0;
+  std::size_t last = text.size();
+  while (first < last && blank(text[first])) ++first;
+  while (last > first && blank(text[last - 1])) --last;
+  return text.substr(first, last - first);
+}
+
+std::string BatchOutputName(const std::string& outputFolder, const std::string& inputName,
+                            const std::string& tag) {
+  const std::string stem = inputName.size() > 4 ? inputName.substr(0, inputName.size() - 4) : "";
+  return JoinPath(outputFolder, stem + "-" + tag + ".jpg");
+}
+
+BatchResult ConvertBatch(PictureDocument& document, const EffectSpec& effect,
+                         const EffectParams& params, const BatchJob& job,
+                         const BatchObserver& observer) {
+  if (!effect.routine) throw std::invalid_argument(effect.cliName + " is not available yet");
+  if (!effect.HasBatchPanel())
+    throw std::invalid_argument(effect.cliName + " has no batch conversion");
+
+  BatchResult result;
+  auto refuse = [&](const std::string& text) {
+    if (observer.message) observer.message("Sorry", text);
+    result.end = BatchResult::End::Refused;
+    return result;
+  };
+  auto stop = [&](std::string error) {
+    result.end = BatchResult::End::Stopped;
+    result.error = std::move(error);
+    return result;
+  };
+
+  const std::string inputFolder = TrimBlanks(job.inputFolder);
+  std::error_code ec;
+  if (inputFolder.empty() || !fs::is_directory(inputFolder, ec))
+    return refuse("Input Director in not exist.");
+  if (job.files.empty()) return refuse("There is no picture to convert.");
+
+  const std::string outputFolder = TrimBlanks(job.outputFolder);
+  if (outputFolder.empty()) return stop("No output folder was given.");
+  if (!fs::is_directory(outputFolder, ec)) {
+    fs::create_directories(outputFolder, ec);
+    if (ec || !fs::is_directory(outputFolder))
+      return stop("Cannot create the output folder " + outputFolder +
+                  (ec ? ": " + ec.message() : std::string(": a file of that name exists")));
+  }
+
+  // Settings the caller left out keep their defaults, so every routine finds all it reads.
+  EffectParams settings = effect.Defaults();
+  for (const auto& [name, value] : params.Values()) settings.Set(name, value);
+
+  const int count = static_cast<int>(job.files.size());
+  const LoaderNotice notice = observer.message;
+  for (int i = 1; i <= count; ++i) {
+    BatchProgress progress;
+    progress.index = i;
+    progress.count = count;
+    progress.name = job.files[static_cast<std::size_t>(i - 1)];
+    progress.outputPath = BatchOutputName(outputFolder, progress.name, effect.batchTag);
+    auto report = [&](BatchProgress::Step step) {
+      progress.step = step;
+      if (observer.progress) observer.progress(progress);
+    };
+    report(BatchProgress::Step::Loading);
+
+    // Loaded into a bitmap of its own first: an entry that cannot be read must leave the
+    // document, and with it the previous result, untouched and write no file.
+    const std::string path = JoinPath(inputFolder, progress.name);
+    std::optional<TBitmap32> picture;
+    std::string reason;
+    try {
+      picture = LoadPictureFile(path, notice);
+      if (!picture || picture->Width() < 1) reason = NotValidFormat(path);
+    } catch (const std::exception& e) {
+      reason = NamingTheFile(path, e.what());
+    }
+    if (!reason.empty()) {
+      result.skipped.push_back({progress.name, reason});
+      progress.reason = std::move(reason);
+      report(BatchProgress::Step::Skipped);
+      continue;
+    }
+    document.Load(std::move(*picture));
+    picture.reset();
+    report(BatchProgress::Step::Loaded);
+
+    try {
+      document.SetWorking(effect.routine({document.Source(), document.Working(), settings}));
+    } catch (const std::exception& e) {
+      return stop(NamingTheFile(path, e.what()));
+    }
+    if (effect.batchPushesHistory) document.Backup();
+    if (observer.afterEffect) observer.afterEffect(progress, document);
+    report(BatchProgress::Step::Converted);
+
+    try {
+      SaveJpeg(document.Working(), progress.outputPath, 90);
+    } catch (const std::exception& e) {
+      return stop("Cannot write " + progress.outputPath + ": " + e.what());
+    }
+    result.outputs.push_back(progress.outputPath);
+    report(BatchProgress::Step::Written);
+  }
+  return result;
+}
+
+}  // namespace quillane

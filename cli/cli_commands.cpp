@@ -1,0 +1,446 @@
+#include "cli/cli_commands.h"
+
+#include <QFile>
+#include <QImage>
+#include <QImageReader>
+#include <QString>
+#include <exception>
+#include <filesystem>
+#include <fstream>
+#include <sstream>
+#include <vector>
+
+#include "app/document.h"
+#include "batch/batch_convert.h"
+#include "codecs/picture_file.h"
+#include "data/startup_picture.h"
+
+namespace quillane::cli {
+namespace fs = std::filesystem;
+
+namespace {
+
+bool EndsWithPng(const std::string& path) {
+  if (path.size() < 4) return false;
+  std::string tail = path.substr(path.size() - 4);
+  for (char& c : tail)
+    if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
+  return tail == ".png";
+}
+
+// PNG is not one of the program's own input types, so it is read here through Qt.
+std::optional<TBitmap32> LoadPng(const std::string& path, std::string& error) {
+  QImageReader reader(QFile::decodeName(path.c_str()), "png");
+  const QSize size = reader.size();
+  if (size.isValid() &&
+      static_cast<std::int64_t>(size.width()) * size.height() > TBitmap32::kMaxPixels) {
+    error = path + ": the picture is too large";
+    return std::nullopt;
+  }
+  // Qt's own cap is below ours; the size was checked above.
+  QImageReader::setAllocationLimit(
+      static_cast<int>(TBitmap32::kMaxPixels * 4 / (1024 * 1024) + 64));
+  QImage image = reader.read();
+  if (image.isNull()) {
+    error = path + ": " + reader.errorString().toStdString();
+    return std::nullopt;
+  }
+  image = image.convertToFormat(QImage::Format_ARGB32);  // B, G, R, A in memory, like Pixel
+  TBitmap32 picture(image.width(), image.height());
+  for (int y = 0; y < image.height(); ++y) {
+    const auto* from = reinterpret_cast<const Pixel*>(image.constScanLine(y));
+    std::copy(from, from + image.width(), picture.ScanLine(y));
+  }
+  return picture;
+}
+
+int ApplyCommand(const Options& o, std::ostream& out, std::ostream& err) {
+  TBitmap32 picture;
+  if (o.input.empty()) {
+    picture = StartupPicture();
+  } else {
+    std::string error;
+    std::optional<TBitmap32> loaded = LoadInputPicture(o.input, error, err);
+    if (!loaded) {
+      err << "quillane-cli: " << error << "\n";
+      return kExitFailed;
+    }
+    picture = std::move(*loaded);
+  }
+  // Through a document, as the program does it: alpha 255, source in, working out.
+  PictureDocument document(std::move(picture));
+  try {
+    document.SetWorking(o.effect->routine({document.Source(), document.Working(), o.params}));
+  } catch (const std::exception& e) {
+    err << "quillane-cli: " << o.effect->cliName << ": " << e.what() << "\n";
+    return kExitFailed;
+  }
+  try {
+    SaveOutputPicture(document.Working(), o.output);
+  } catch (const std::exception& e) {
+    err << "quillane-cli: cannot write " << o.output << ": " << e.what() << "\n";
+    return kExitFailed;
+  }
+  out << o.output << "\n";
+  return kExitOk;
+}
+
+// Batch progress on a terminal: one line redrawn in place.
+class ProgressBar {
+ public:
+  explicit ProgressBar(std::ostream& err) : err_(err) {}
+  ~ProgressBar() { Finish(); }
+
+  void Draw(int index, int count, const std::string& name) {
+    constexpr int kWidth = 30;
+    const int filled = count > 0 ? (index - 1) * kWidth / count : 0;
+    err_ << "\r[" << std::string(static_cast<std::size_t>(filled), '#')
+         << std::string(static_cast<std::size_t>(kWidth - filled), '.') << "] " << index << "/"
+         << count << " " << name << "\x1b[K" << std::flush;
+    drawn_ = true;
+  }
+  // A line of its own above the bar.
+  void Print(const std::string& line) {
+    if (drawn_) err_ << "\r\x1b[K";
+    err_ << line << "\n" << std::flush;
+    drawn_ = false;
+  }
+  void Finish() {
+    if (drawn_) err_ << "\r\x1b[K" << std::flush;
+    drawn_ = false;
+  }
+
+ private:
+  std::ostream& err_;
+  bool drawn_ = false;
+};
+
+int BatchCommand(const Options& o, std::ostream& out, std::ostream& err, bool terminal) {
+  const std::string inputFolder = TrimBlanks(o.input);
+  BatchJob job{o.input, o.output, ScanBatchFolder(inputFolder)};
+  PictureDocument document;
+  ProgressBar bar(err);
+
+  BatchObserver observer;
+  observer.message = [&](const std::string& caption, const std::string& text) {
+    bar.Print(caption + ": " + text);
+  };
+  observer.progress = [&](const BatchProgress& p) {
+    const std::string position =
+        "picture " + std::to_string(p.index) + " of " + std::to_string(p.count) + ": ";
+    switch (p.step) {
+      case BatchProgress::Step::Loading:
+        if (terminal) bar.Draw(p.index, p.count, p.name);
+        break;
+      case BatchProgress::Step::Written:
+        if (!terminal) bar.Print(position + p.name + " -> " + p.outputPath);
+        break;
+      case BatchProgress::Step::Skipped:
+        bar.Print(position + p.name + " skipped: " + p.reason);
+        break;
+      default:
+        break;
+    }
+  };
+  const BatchResult result = ConvertBatch(document, *o.effect, o.params, job, observer);
+  bar.Finish();
+
+  if (result.end == BatchResult::End::Refused) return kExitFailed;
+  const std::size_t listed = job.files.size();
+  if (result.end == BatchResult::End::Stopped) err << "quillane-cli: " << result.error << "\n";
+  out << "Converted " << result.outputs.size() << " of " << listed
+      << (listed == 1 ? " picture" : " pictures") << " into " << TrimBlanks(o.output) << "\n";
+  if (!result.skipped.empty()) {
+    err << "Skipped " << result.skipped.size()
+        << (result.skipped.size() == 1 ? " picture:\n" : " pictures:\n");
+    for (const BatchSkipped& s : result.skipped) err << "  " << s.name << ": " << s.reason << "\n";
+  }
+  if (result.end == BatchResult::End::Stopped) {
+    err << "Stopped before the end; " << (listed - result.outputs.size() - result.skipped.size())
+        << " pictures were not converted.\n";
+    return kExitFailed;
+  }
+  if (!result.AllConverted()) return kExitFailed;
+  out << "The batch convert is successful.\n";
+  return kExitOk;
+}
+
+struct GalleryEntry {
+  std::string title;
+  std::string file;
+};
+
+std::string GalleryHtml(const std::string& sourceName, const GalleryEntry& original,
+                        const std::vector<std::pair<std::string, std::vector<GalleryEntry>>>& menus,
+                        const std::vector<std::string>& unavailable) {
+  auto figure = [](const GalleryEntry& e) {
+    const std::string file = HtmlEscape(e.file);
+    const std::string title = HtmlEscape(e.title);
+    return "<figure><a href=\"" + file + "\"><img src=\"" + file + "\" alt=\"" + title +
+           "\"></a><figcaption>" + title + "</figcaption></figure>\n";
+  };
+  std::ostringstream html;
+  html << "<!DOCTYPE html>\n<html lang=\"en\">\n<head>\n<meta charset=\"utf-8\">\n"
+          "<title>Quillane effects</title>\n<style>\n"
+          "body { font-family: sans-serif; margin: 2em; background: #f3f3f0; color: #222; }\n"
+          ".sheet { display: flex; flex-wrap: wrap; gap: 1.5em; }\n"
+          "figure { margin: 0; padding: 0.6em; background: #fff; "
+          "box-shadow: 0 1px 4px rgba(0,0,0,.2); }\n"
+          "img { display: block; max-width: 360px; height: auto; }\n"
+          "figcaption { margin-top: 0.4em; text-align: center; }\n"
+          "</style>\n</head>\n<body>\n<h1>Quillane effects</h1>\n<p>Every effect with its "
+          "default settings, applied to "
+       << HtmlEscape(sourceName) << ".</p>\n";
+  html << "<h2>Original</h2>\n<div class=\"sheet\">\n" << figure(original) << "</div>\n";
+  for (const auto& [menu, entries] : menus) {
+    if (entries.empty()) continue;
+    html << "<h2>" << HtmlEscape(menu) << "</h2>\n<div class=\"sheet\">\n";
+    for (const GalleryEntry& e : entries) html << figure(e);
+    html << "</div>\n";
+  }
+  if (!unavailable.empty()) {
+    html << "<p>Not yet available: ";
+    for (std::size_t i = 0; i < unavailable.size(); ++i)
+      html << (i ? ", " : "") << HtmlEscape(unavailable[i]);
+    html << ".</p>\n";
+  }
+  html << "</body>\n</html>\n";
+  return html.str();
+}
+
+int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
+  TBitmap32 picture;
+  std::string sourceName = "the built-in picture";
+  if (o.input.empty()) {
+    picture = StartupPicture();
+  } else {
+    std::string error;
+    std::optional<TBitmap32> loaded = LoadInputPicture(o.input, error, err);
+    if (!loaded) {
+      err << "quillane-cli: " << error << "\n";
+      return kExitFailed;
+    }
+    picture = std::move(*loaded);
+    sourceName = fs::path(o.input).filename().string();
+  }
+  std::error_code ec;
+  fs::create_directories(o.output, ec);
+  if (!fs::is_directory(o.output)) {
+    err << "quillane-cli: cannot create the folder " << o.output
+        << (ec ? ": " + ec.message() : std::string()) << "\n";
+    return kExitFailed;
+  }
+
+  const fs::path folder(o.output);
+  PictureDocument document(std::move(picture));
+  int status = kExitOk;
+  auto write = [&](const TBitmap32& p, const std::string& file) {
+    try {
+      SavePng(p, (folder / file).string());
+      return true;
+    } catch (const std::exception& e) {
+      err << "quillane-cli: cannot write " << (folder / file).string() << ": " << e.what() << "\n";
+      status = kExitFailed;
+      return false;
+    }
+  };
+  if (!write(document.Working(), "original.png")) return kExitFailed;
+
+  std::vector<std::pair<std::string, std::vector<GalleryEntry>>> menus;
+  std::vector<std::string> unavailable;
+  int written = 0;
+  for (const MenuSpec& menu : EffectMenus()) {
+    menus.push_back({DisplayedCaption(menu.caption), {}});
+    for (int number : menu.toolNumbers) {
+      const EffectSpec& effect = *FindEffect(number);
+      const std::string title = DisplayedCaption(effect.menuEntry);
+      if (!effect.routine) {
+        unavailable.push_back(title);
+        continue;
+      }
+      const std::string file = effect.cliName + ".png";
+      try {
+        const TBitmap32 result =
+            effect.routine({document.Source(), document.Working(), effect.Defaults()});
+        if (!write(result, file)) continue;
+      } catch (const std::exception& e) {
+        err << "quillane-cli: " << effect.cliName << ": " << e.what() << "\n";
+        status = kExitFailed;
+        continue;
+      }
+      menus.back().second.push_back({title, file});
+      ++written;
+    }
+  }
+
+  const std::string index = (folder / "index.html").string();
+  std::ofstream html(index, std::ios::binary | std::ios::trunc);
+  html << GalleryHtml(sourceName, {"Original", "original.png"}, menus, unavailable);
+  html.close();
+  if (!html) {
+    err << "quillane-cli: cannot write " << index << "\n";
+    return kExitFailed;
+  }
+  out << "Wrote " << written << (written == 1 ? " effect" : " effects") << " and the original into "
+      << o.output << "; open " << index << " to see them.\n";
+  return status;
+}
+
+}  // namespace
+
+std::optional<TBitmap32> LoadInputPicture(const std::string& path, std::string& error,
+                                          std::ostream& notices) {
+  std::error_code ec;
+  if (!fs::is_regular_file(path, ec)) {
+    error = fs::exists(path, ec) ? path + " is not a file" : path + ": no such file";
+    return std::nullopt;
+  }
+  try {
+    if (EndsWithPng(path)) return LoadPng(path, error);
+    std::optional<TBitmap32> picture =
+        LoadPictureFile(path, [&](const std::string& caption, const std::string& text) {
+          notices << caption << ": " << text << "\n";
+        });
+    if (!picture) {
+      error = path + ": no such file";
+      return std::nullopt;
+    }
+    if (picture->Width() < 1) {
+      error = path + " is not a valid format";
+      return std::nullopt;
+    }
+    return picture;
+  } catch (const std::exception& e) {
+    error = NamingTheFile(path, e.what());
+    return std::nullopt;
+  }
+}
+
+void SaveOutputPicture(const TBitmap32& picture, const std::string& path) {
+  switch (OutputTypeFor(path)) {
+    case OutputType::Jpeg:
+      SaveJpeg(picture, path, 90);
+      return;
+    case OutputType::Bitmap:
+      SaveBitmap24(picture, path);
+      return;
+    case OutputType::Metafile:
+      SaveMetafile(picture, path);
+      return;
+    case OutputType::Png:
+      SavePng(picture, path);
+      return;
+    case OutputType::Unknown:
+      break;
+  }
+  throw PictureFileError("unknown output type: " + path);
+}
+
+std::string DisplayedCaption(const std::string& caption) {
+  std::string shown;
+  for (std::size_t i = 0; i < caption.size(); ++i) {
+    if (caption[i] != '&') {
+      shown += caption[i];
+    } else if (i + 1 < caption.size() && caption[i + 1] == '&') {
+      shown += '&';
+      ++i;
+    }
+  }
+  return TrimBlanks(shown);
+}
+
+std::string HtmlEscape(const std::string& text) {
+  std::string escaped;
+  escaped.reserve(text.size());
+  for (char c : text) {
+    switch (c) {
+      case '&':
+        escaped += "&amp;";
+        break;
+      case '<':
+        escaped += "&lt;";
+        break;
+      case '>':
+        escaped += "&gt;";
+        break;
+      case '"':
+        escaped += "&quot;";
+        break;
+      case '\'':
+        escaped += "&#39;";
+        break;
+      default:
+        escaped += c;
+    }
+  }
+  return escaped;
+}
+
+std::string EffectListText() {
+  std::ostringstream text;
+  text << "Effects (quillane-cli apply EFFECT [--PARAM VALUE ...]); parameters not given keep "
+          "their defaults.\n";
+  for (const MenuSpec& menu : EffectMenus()) {
+    text << "\n" << DisplayedCaption(menu.caption) << "\n";
+    for (int number : menu.toolNumbers) {
+      const EffectSpec& e = *FindEffect(number);
+      text << "  " << e.cliName << "  (" << DisplayedCaption(e.menuEntry) << ")";
+      if (!e.routine) {
+        text << "  not yet available\n";
+        continue;
+      }
+      text << (e.HasBatchPanel() ? "  batch output NAME-" + e.batchTag + ".jpg"
+                                 : std::string("  no batch conversion"))
+           << "\n";
+      bool any = false;
+      for (const ControlSpec& c : e.controls) {
+        if (c.kind == ControlKind::Hidden) continue;
+        any = true;
+        std::string option = "--" + c.param + " N";
+        if (option.size() < 18) option.resize(18, ' ');
+        text << "      " << option << c.minimum << ".." << c.maximum << ", default "
+             << c.defaultValue;
+        if (c.kind == ControlKind::CheckBox) text << " (0 off, 1 on)";
+        if (!c.help.empty()) text << "; " << c.help;
+        text << "\n";
+      }
+      for (const ControlSpec& h : e.controls) {
+        if (h.kind != ControlKind::Hidden) continue;
+        std::string selectors;
+        for (const ControlSpec& c : e.controls)
+          if (c.selects == h.param) selectors += (selectors.empty() ? "--" : " or --") + c.param;
+        text << "      " << h.param << " is not an option of its own: ";
+        if (!selectors.empty()) text << "giving " << selectors << " chooses it; ";
+        text << "default " << h.defaultValue;
+        if (!h.help.empty()) text << " (" << h.help << ")";
+        text << "\n";
+        any = true;
+      }
+      if (!any) text << "      no parameters\n";
+    }
+  }
+  return text.str();
+}
+
+int RunCommand(const Options& options, std::ostream& out, std::ostream& err, bool terminal) {
+  switch (options.command) {
+    case Command::Help:
+      out << UsageText();
+      return kExitOk;
+    case Command::Version:
+      out << VersionText() << "\n";
+      return kExitOk;
+    case Command::List:
+      out << EffectListText();
+      return kExitOk;
+    case Command::Apply:
+      return ApplyCommand(options, out, err);
+    case Command::Batch:
+      return BatchCommand(options, out, err, terminal);
+    case Command::Gallery:
+      return GalleryCommand(options, out, err);
+  }
+  return kExitUsage;
+}
+
+}  // namespace quillane::cli

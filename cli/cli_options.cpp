@@ -1,0 +1,288 @@
+#include "cli/cli_options.h"
+
+#include <charconv>
+#include <cstdint>
+#include <optional>
+
+#ifndef QUILLANE_VERSION
+#define QUILLANE_VERSION "4.36"
+#endif
+
+namespace quillane::cli {
+namespace {
+
+ParseResult Fail(std::string message, int exitCode = kExitUsage) {
+  ParseResult r;
+  r.error = std::move(message);
+  r.exitCode = exitCode;
+  return r;
+}
+
+ParseResult Plain(Command command) {
+  ParseResult r;
+  r.options.command = command;
+  return r;
+}
+
+std::optional<std::int64_t> ParseInteger(std::string_view text) {
+  if (!text.empty() && text.front() == '+') text.remove_prefix(1);
+  if (text.empty() || text.front() == '+') return std::nullopt;
+  std::int64_t value = 0;
+  const char* end = text.data() + text.size();
+  const auto [ptr, ec] = std::from_chars(text.data(), end, value);
+  if (ec != std::errc() || ptr != end) return std::nullopt;
+  return value;
+}
+
+std::string Lower(std::string s) {
+  for (char& c : s)
+    if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
+  return s;
+}
+
+// The parameters a user can give for effect: its sliders and check boxes.
+std::string SettableList(const EffectSpec& effect) {
+  std::string list;
+  for (const ControlSpec& c : effect.controls) {
+    if (c.kind == ControlKind::Hidden) continue;
+    if (!list.empty()) list += ", ";
+    list += "--" + c.param;
+  }
+  return list.empty() ? "none" : list;
+}
+
+// Walks the arguments after the command: options with values, and positional arguments.
+class ArgumentWalker {
+ public:
+  explicit ArgumentWalker(const std::vector<std::string>& args, std::size_t first)
+      : args_(args), next_(first) {}
+
+  bool Done() const { return next_ >= args_.size(); }
+  // The next argument; an option "--name=value" is split and its value held for TakeValue.
+  std::string Take() {
+    std::string arg = args_[next_++];
+    inlineValue_.reset();
+    if (arg.size() > 2 && arg.compare(0, 2, "--") == 0) {
+      const std::size_t eq = arg.find('=');
+      if (eq != std::string::npos) {
+        inlineValue_ = arg.substr(eq + 1);
+        arg.resize(eq);
+      }
+    }
+    return arg;
+  }
+  std::optional<std::string> TakeValue() {
+    if (inlineValue_) {
+      std::string v = std::move(*inlineValue_);
+      inlineValue_.reset();
+      return v;
+    }
+    if (Done()) return std::nullopt;
+    return args_[next_++];
+  }
+
+ private:
+  const std::vector<std::string>& args_;
+  std::size_t next_;
+  std::optional<std::string> inlineValue_;
+};
+
+bool IsOption(const std::string& arg) {
+  return arg.size() > 1 && arg.front() == '-';
+}
+
+// Sets one effect parameter from "--name value"; an error message, or empty.
+std::string SetParameter(const EffectSpec& effect, const std::string& name,
+                         const std::string& value, EffectParams& params) {
+  const ControlSpec* control = effect.FindControl(name);
+  if (control == nullptr)
+    return "unknown option --" + name + " for " + effect.cliName +
+           " (its parameters: " + SettableList(effect) + ")";
+  if (control->kind == ControlKind::Hidden) {
+    std::string selectors;
+    for (const ControlSpec& c : effect.controls)
+      if (c.selects == name) selectors += (selectors.empty() ? "--" : " or --") + c.param;
+    return "--" + name + " is not an option: it is chosen by " +
+           (selectors.empty() ? std::string("the other parameters") : "giving " + selectors);
+  }
+  const std::string range =
+      std::to_string(control->minimum) + " to " + std::to_string(control->maximum);
+  const std::optional<std::int64_t> number = ParseInteger(value);
+  if (!number || *number < control->minimum || *number > control->maximum)
+    return "--" + name + " must be an integer from " + range + ", not '" + value + "'";
+  params.Set(name, *number);
+  if (!control->selects.empty()) params.Set(control->selects, control->selectValue);
+  return {};
+}
+
+// "apply", "batch": EFFECT first, then options and positional arguments.
+ParseResult ParseEffectCommand(Command command, const std::vector<std::string>& args) {
+  const std::string& verb = args[0];
+  if (args.size() < 2 || IsOption(args[1]))
+    return Fail(verb + ": name an effect first (quillane-cli list shows them)");
+  const EffectSpec* effect = FindEffectByCliName(args[1]);
+  if (effect == nullptr)
+    return Fail("unknown effect '" + args[1] + "' (quillane-cli list shows them)");
+  if (!effect->routine) return Fail(effect->cliName + " is not yet available");
+  if (command == Command::Batch && !effect->HasBatchPanel())
+    return Fail(effect->cliName + " has no batch conversion; use apply on each picture");
+
+  ParseResult result;
+  Options& o = result.options;
+  o.command = command;
+  o.effect = effect;
+  o.params = effect->Defaults();
+  bool haveInput = false;
+  bool haveOutput = false;
+
+  ArgumentWalker walker(args, 2);
+  while (!walker.Done()) {
+    const std::string arg = walker.Take();
+    if (!IsOption(arg) || arg == "-") {
+      if (command == Command::Batch)
+        return Fail("batch: unexpected argument '" + arg + "' (use --input DIR --output DIR)");
+      if (haveInput) return Fail("apply: only one input picture, but also got '" + arg + "'");
+      o.input = arg;
+      haveInput = true;
+      continue;
+    }
+    const bool isOutput = arg == "-o" || arg == "--output";
+    const bool isInput = command == Command::Batch && arg == "--input";
+    if (isOutput || isInput) {
+      const std::optional<std::string> value = walker.TakeValue();
+      if (!value || value->empty())
+        return Fail(arg + " needs a " +
+                    (isOutput && command == Command::Apply ? "file name" : "folder"));
+      bool& have = isOutput ? haveOutput : haveInput;
+      if (have) return Fail(arg + " given twice");
+      (isOutput ? o.output : o.input) = *value;
+      have = true;
+      continue;
+    }
+    if (arg.compare(0, 2, "--") != 0)
+      return Fail("unknown option " + arg + " (quillane-cli --help shows the usage)");
+    const std::string name = arg.substr(2);
+    const ControlSpec* control = effect->FindControl(name);
+    if (control == nullptr || control->kind == ControlKind::Hidden)
+      return Fail(SetParameter(*effect, name, "", o.params));
+    const std::optional<std::string> value = walker.TakeValue();
+    if (!value) return Fail(arg + " needs a value");
+    if (std::string error = SetParameter(*effect, name, *value, o.params); !error.empty())
+      return Fail(error);
+  }
+
+  if (command == Command::Apply) {
+    if (!haveOutput) return Fail("apply: say where to write the result with -o OUTPUT");
+    if (OutputTypeFor(o.output) == OutputType::Unknown)
+      return Fail("apply: cannot tell the output type of '" + o.output +
+                  "'; end it in .jpg, .jpeg, .bmp, .wmf, .emf or .png");
+  } else {
+    if (!haveInput) return Fail("batch: name the input folder with --input DIR");
+    if (!haveOutput) return Fail("batch: name the output folder with --output DIR");
+  }
+  return result;
+}
+
+ParseResult ParseGallery(const std::vector<std::string>& args) {
+  ParseResult result;
+  Options& o = result.options;
+  o.command = Command::Gallery;
+  bool haveFolder = false;
+  bool haveInput = false;
+  ArgumentWalker walker(args, 1);
+  while (!walker.Done()) {
+    const std::string arg = walker.Take();
+    if (arg == "--input") {
+      const std::optional<std::string> value = walker.TakeValue();
+      if (!value || value->empty()) return Fail("--input needs a file name");
+      if (haveInput) return Fail("--input given twice");
+      o.input = *value;
+      haveInput = true;
+    } else if (IsOption(arg) && arg != "-") {
+      return Fail("unknown option " + arg + " for gallery (quillane-cli --help shows the usage)");
+    } else if (haveFolder) {
+      return Fail("gallery: only one folder, but also got '" + arg + "'");
+    } else {
+      o.output = arg;
+      haveFolder = true;
+    }
+  }
+  if (!haveFolder) return Fail("gallery: name the folder to write into");
+  return result;
+}
+
+}  // namespace
+
+OutputType OutputTypeFor(const std::string& path) {
+  const std::size_t dot = path.find_last_of("./");
+  if (dot == std::string::npos || path[dot] != '.') return OutputType::Unknown;
+  const std::string ext = Lower(path.substr(dot));
+  if (ext == ".jpg" || ext == ".jpeg") return OutputType::Jpeg;
+  if (ext == ".bmp") return OutputType::Bitmap;
+  if (ext == ".wmf" || ext == ".emf") return OutputType::Metafile;
+  if (ext == ".png") return OutputType::Png;
+  return OutputType::Unknown;
+}
+
+ParseResult ParseCommandLine(const std::vector<std::string>& args) {
+  for (const std::string& arg : args)
+    if (arg == "--help" || arg == "-h") return Plain(Command::Help);
+  if (args.empty()) return Fail("no command given (quillane-cli --help shows the usage)");
+
+  const std::string& verb = args[0];
+  if (verb == "--version" || verb == "-V") {
+    if (args.size() > 1) return Fail("--version takes no arguments");
+    return Plain(Command::Version);
+  }
+  if (verb == "help") return Plain(Command::Help);
+  if (verb == "list") {
+    if (args.size() > 1) return Fail("list takes no arguments");
+    return Plain(Command::List);
+  }
+  if (verb == "apply") return ParseEffectCommand(Command::Apply, args);
+  if (verb == "batch") return ParseEffectCommand(Command::Batch, args);
+  if (verb == "gallery") return ParseGallery(args);
+  return Fail("unknown command '" + verb + "' (quillane-cli --help shows the usage)");
+}
+
+std::string VersionText() {
+  return std::string("quillane-cli ") + QUILLANE_VERSION;
+}
+
+std::string UsageText() {
+  return R"(Usage:
+  quillane-cli list
+  quillane-cli apply EFFECT [--PARAM VALUE ...] [INPUT] -o OUTPUT
+  quillane-cli batch EFFECT [--PARAM VALUE ...] --input DIR --output DIR
+  quillane-cli gallery DIR [--input FILE]
+  quillane-cli --help | --version
+
+Turns photographs into artwork with the effects of Quillane, without a window.
+
+  list     every effect with its parameters, their ranges and defaults
+  apply    one effect on one picture (the built-in picture when INPUT is left out);
+           OUTPUT ends in .jpg or .jpeg (JPEG, quality 90), .bmp (24-bit bitmap),
+           .wmf or .emf (metafile) or .png (lossless, keeps alpha)
+  batch    one effect over every *.jpg, *.jpeg, *.bmp and *.wmf file of DIR (any case,
+           sorted by name, subfolders not entered); each result is written as
+           NAME-Tag.jpg into the output folder, which is created when missing
+  gallery  the built-in picture (or FILE) through every effect with its defaults: one
+           PNG per effect, the original, and index.html to look at them side by side
+
+INPUT may be a .jpg, .jpeg, .bmp, .ico, .gif, .wmf, .emf or .png file. Parameters are
+whole numbers within the ranges "list" shows; unset ones keep their defaults. Values
+may also be written --PARAM=VALUE.
+
+Examples:
+  quillane-cli apply pencil-sketch --contrast 60 photo.jpg -o sketch.png
+  quillane-cli apply pencil-sketch --lighting 140 -o builtin-sketch.jpg
+  quillane-cli batch pencil-sketch --input ~/Pictures --output ~/Pictures/sketches
+  quillane-cli gallery gallery/
+
+Exit status: 0 done; 1 an input could not be read, an output could not be written,
+or a batch skipped or failed pictures; 2 the command line was wrong (unknown command,
+effect or option, or a value that is not a whole number within its range).
+)";
+}
+
+}  // namespace quillane::cli

@@ -1,0 +1,54 @@
+// The command line of quillane-cli, parsed into what to do. Kept apart from main() so that
+// every rule about names, ranges and exit codes can be tested without starting the program.
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include "effects/registry.h"
+
+namespace quillane::cli {
+
+// Exit codes of quillane-cli.
+enum ExitCode {
+  kExitOk = 0,
+  kExitFailed = 1,  // unreadable input, a write error, a batch with skipped or failed pictures
+  kExitUsage = 2,   // unknown command, effect or option; a bad or out-of-range value
+};
+
+enum class Command { Help, Version, List, Apply, Batch, Gallery };
+
+struct Options {
+  Command command = Command::Help;
+  const EffectSpec* effect = nullptr;  // Apply and Batch
+  // Every parameter of effect: its default, or the value given. A parameter that selects a
+  // hidden one (the pencil's --lighting selects the lighting tone) sets it when given; when
+  // several such options are given, the last one decides, as the slider moved last does.
+  EffectParams params;
+  std::string input;   // Apply: the picture (empty: the built-in one); Batch: the folder;
+                       // Gallery: --input FILE (empty: the built-in picture)
+  std::string output;  // Apply: the file written; Batch and Gallery: the folder
+};
+
+struct ParseResult {
+  Options options;
+  std::string error;  // empty when the command line was understood
+  int exitCode = kExitOk;
+  bool Ok() const { return error.empty(); }
+};
+
+// Parses the arguments after the program name. Values are written "--name value" or
+// "--name=value".
+ParseResult ParseCommandLine(const std::vector<std::string>& args);
+
+// The text of --help.
+std::string UsageText();
+
+// "quillane-cli 4.36".
+std::string VersionText();
+
+// The output types "apply" writes, chosen by the output file's extension (any case).
+enum class OutputType { Unknown, Jpeg, Bitmap, Metafile, Png };
+OutputType OutputTypeFor(const std::string& path);
+
+}  // namespace quillane::cli

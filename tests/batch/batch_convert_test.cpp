@@ -1,0 +1,348 @@
+#include "batch/batch_convert.h"
+
+#include <gtest/gtest.h>
+#include <stdlib.h>
+
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+#include <string>
+#include <vector>
+
+#include "codecs/picture_file.h"
+#include "effects/mono/bw_sketch.h"
+
+namespace quillane {
+namespace {
+
+namespace fs = std::filesystem;
+
+// A fresh folder per test, removed afterwards.
+class BatchFolder : public ::testing::Test {
+ protected:
+  void SetUp() override {
+    std::string pattern = (fs::temp_directory_path() / "quillane-batch-XXXXXX").string();
+    ASSERT_NE(mkdtemp(pattern.data()), nullptr);
+    root_ = pattern;
+    in_ = (root_ / "in").string();
+    out_ = (root_ / "out").string();
+    fs::create_directory(in_);
+  }
+  void TearDown() override { fs::remove_all(root_); }
+
+  std::string In(const std::string& name) const { return in_ + "/" + name; }
+  std::string Out(const std::string& name) const { return out_ + "/" + name; }
+
+  fs::path root_;
+  std::string in_;
+  std::string out_;
+};
+
+// A small picture with edges in every channel, different for each seed.
+TBitmap32 Picture(int width, int height, int seed) {
+  TBitmap32 p(width, height);
+  for (int y = 0; y < height; ++y) {
+    Pixel* row = p.ScanLine(y);
+    for (int x = 0; x < width; ++x)
+      row[x] = Pixel{static_cast<std::uint8_t>((x * 37 + seed * 11) & 255),
+                     static_cast<std::uint8_t>((y * 53 + x * x + seed) & 255),
+                     static_cast<std::uint8_t>(((x + y) % 3) * 120), 255};
+  }
+  return p;
+}
+
+std::string ReadBytes(const std::string& path) {
+  std::ifstream in(path, std::ios::binary);
+  return {std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
+}
+
+void WriteBytes(const std::string& path, const std::string& bytes) {
+  std::ofstream(path, std::ios::binary) << bytes;
+}
+
+const EffectSpec& Pencil() {
+  return *FindEffectByCliName("pencil-sketch");
+}
+
+EffectParams PencilLighting(int lighting) {
+  EffectParams p;
+  p.Set("tone-mode", static_cast<int>(PencilToneMode::Lighting));
+  p.Set("lighting", lighting);
+  return p;
+}
+
+// What the loop must write for the picture in file: the pencil sketch of it, as our own JPEG.
+std::string ExpectedJpeg(const std::string& file, const EffectParams& params,
+                         const std::string& scratch) {
+  TBitmap32 picture = *LoadPictureFile(file);
+  SetAlphaChannel(picture, 255);
+  EffectParams settings = Pencil().Defaults();
+  for (const auto& [name, value] : params.Values()) settings.Set(name, value);
+  SaveJpeg(Pencil().routine({picture, picture, settings}), scratch, 90);
+  return ReadBytes(scratch);
+}
+
+struct Recorder {
+  std::vector<std::string> messages;
+  std::vector<std::string> steps;
+  BatchObserver Observer() {
+    BatchObserver o;
+    o.message = [this](const std::string& caption, const std::string& text) {
+      messages.push_back(caption + "|" + text);
+    };
+    o.progress = [this](const BatchProgress& p) {
+      static const char* const names[] = {"load", "loaded", "converted", "written", "skipped"};
+      steps.push_back(std::string(names[static_cast<int>(p.step)]) + " " + std::to_string(p.index) +
+                      "/" + std::to_string(p.count) + " " + p.name);
+    };
+    return o;
+  }
+};
+
+TEST(BatchOutputNameTest, DropsFourCharactersAndAddsTheTag) {
+  EXPECT_EQ(BatchOutputName("out", "beach.jpg", "Emboss"), "out/beach-Emboss.jpg");
+  EXPECT_EQ(BatchOutputName("out", "c.jpeg", "Vuzorar"), "out/c.-Vuzorar.jpg");
+  EXPECT_EQ(BatchOutputName("/a/b/", "X.BMP", "Pop-art"), "/a/b/X-Pop-art.jpg");
+}
+
+TEST(TrimBlanksTest, RemovesSpacesAndControlCharactersAtBothEnds) {
+  EXPECT_EQ(TrimBlanks("  \t/tmp/my pictures \r\n"), "/tmp/my pictures");
+  EXPECT_EQ(TrimBlanks(" \t "), "");
+}
+
+TEST_F(BatchFolder, ScanListsEachMaskInTurnIgnoringCaseAndSortedByName) {
+  for (const char* name : {"b.JPG", "a.jpg", "A.JPG", "x.jpeg", "A.Jpeg", "c.bmp", "d.WMF", "e.emf",
+                           "f.gif", "g.ico", "h.jpg.txt", "jpg", ".jpgx"})
+    WriteBytes(In(name), "x");
+  fs::create_directory(In("folder.jpg"));
+  WriteBytes(In("folder.jpg") + "/inner.jpg", "x");
+  fs::create_symlink(In("a.jpg"), In("link.bmp"));
+  fs::create_symlink(In("missing"), In("dangling.jpg"));
+
+  // "*.jpg" does not also take the ".jpeg" names, so nothing is listed twice.
+  EXPECT_EQ(ScanBatchFolder(in_),
+            (std::vector<std::string>{"A.JPG", "a.jpg", "b.JPG", "A.Jpeg", "x.jpeg", "c.bmp",
+                                      "link.bmp", "d.WMF"}));
+  EXPECT_TRUE(ScanBatchFolder(in_ + "/nowhere").empty());
+}
+
+TEST_F(BatchFolder, ConvertsEveryPictureIntoAJpegNamedAfterItsInput) {
+  SaveJpeg(Picture(23, 17, 1), In("a.jpg"));
+  SaveBitmap24(Picture(19, 11, 2), In("b.bmp"));
+  SaveJpeg(Picture(9, 8, 3), In("c.jpeg"));
+  const std::vector<std::string> files = ScanBatchFolder(in_);
+  ASSERT_EQ(files, (std::vector<std::string>{"a.jpg", "c.jpeg", "b.bmp"}));
+
+  PictureDocument document;
+  Recorder recorder;
+  const EffectParams params = PencilLighting(150);
+  // Blanks around typed folders are ignored; the nested output folder is created.
+  const BatchResult result =
+      ConvertBatch(document, Pencil(), params, {" " + in_ + " ", "\t" + out_ + "/deep/er/ ", files},
+                   recorder.Observer());
+
+  EXPECT_EQ(result.end, BatchResult::End::Completed);
+  EXPECT_TRUE(result.AllConverted());
+  const std::string deep = out_ + "/deep/er";
+  EXPECT_EQ(result.outputs,
+            (std::vector<std::string>{deep + "/a-PencilSketch.jpg", deep + "/c.-PencilSketch.jpg",
+                                      deep + "/b-PencilSketch.jpg"}));
+  const std::string scratch = root_ / "expected.jpg";
+  EXPECT_EQ(ReadBytes(deep + "/a-PencilSketch.jpg"), ExpectedJpeg(In("a.jpg"), params, scratch));
+  EXPECT_EQ(ReadBytes(deep + "/b-PencilSketch.jpg"), ExpectedJpeg(In("b.bmp"), params, scratch));
+  EXPECT_EQ(ReadBytes(deep + "/c.-PencilSketch.jpg"), ExpectedJpeg(In("c.jpeg"), params, scratch));
+  EXPECT_TRUE(recorder.messages.empty());
+  EXPECT_EQ(recorder.steps, (std::vector<std::string>{
+                                "load 1/3 a.jpg", "loaded 1/3 a.jpg", "converted 1/3 a.jpg",
+                                "written 1/3 a.jpg", "load 2/3 c.jpeg", "loaded 2/3 c.jpeg",
+                                "converted 2/3 c.jpeg", "written 2/3 c.jpeg", "load 3/3 b.bmp",
+                                "loaded 3/3 b.bmp", "converted 3/3 b.bmp", "written 3/3 b.bmp"}));
+
+  // The document holds the last picture: its result as working, the input as source and opened.
+  TBitmap32 last = Picture(19, 11, 2);
+  EXPECT_EQ(document.Source(), last);
+  EXPECT_EQ(document.Opened(), last);
+  EXPECT_EQ(document.Working(), peccilsketch(last, PencilToneMode::Lighting, 45, 150));
+}
+
+TEST_F(BatchFolder, RerunReplacesEarlierOutputs) {
+  SaveBitmap24(Picture(12, 10, 4), In("a.bmp"));
+  fs::create_directory(out_);
+  WriteBytes(Out("a-PencilSketch.jpg"), "an older result");
+
+  PictureDocument document;
+  for (int lighting : {100, 200}) {
+    const EffectParams params = PencilLighting(lighting);
+    const BatchResult result = ConvertBatch(document, Pencil(), params, {in_, out_, {"a.bmp"}});
+    ASSERT_TRUE(result.AllConverted());
+    EXPECT_EQ(ReadBytes(Out("a-PencilSketch.jpg")),
+              ExpectedJpeg(In("a.bmp"), params, root_ / "expected.jpg"));
+  }
+}
+
+TEST_F(BatchFolder, RefusesAMissingInputFolderOrAnEmptyListWithoutTouchingAnything) {
+  const PictureDocument before(Picture(6, 5, 9));
+  PictureDocument document = before;
+  Recorder recorder;
+  EffectParams params;
+
+  BatchResult result = ConvertBatch(document, Pencil(), params, {in_ + "/missing", out_, {"a.jpg"}},
+                                    recorder.Observer());
+  EXPECT_EQ(result.end, BatchResult::End::Refused);
+  result = ConvertBatch(document, Pencil(), params, {"   ", out_, {"a.jpg"}}, recorder.Observer());
+  EXPECT_EQ(result.end, BatchResult::End::Refused);
+  // A typed folder without a list made by a scan has nothing to convert.
+  result = ConvertBatch(document, Pencil(), params, {in_, out_, {}}, recorder.Observer());
+  EXPECT_EQ(result.end, BatchResult::End::Refused);
+  EXPECT_FALSE(result.AllConverted());
+
+  EXPECT_EQ(recorder.messages, (std::vector<std::string>{"Sorry|Input Director in not exist.",
+                                                         "Sorry|Input Director in not exist.",
+                                                         "Sorry|There is no picture to convert."}));
+  EXPECT_TRUE(recorder.steps.empty());
+  EXPECT_FALSE(fs::exists(out_));
+  EXPECT_EQ(document.Working(), before.Working());
+  EXPECT_EQ(document.UndoCount(), 0);
+}
+
+// Regression: an entry that cannot be loaded used to be converted from the previous picture and
+// written under its own name.
+TEST_F(BatchFolder, UnloadableEntriesAreSkippedWithoutAnOutputFile) {
+  SaveJpeg(Picture(14, 9, 5), In("a.jpg"));
+  WriteBytes(In("x.jpg"), std::string("\xFF\xD8 this is no picture at all", 29));
+  WriteBytes(In("y.bmp"), "");
+  SaveBitmap24(Picture(8, 6, 6), In("z.bmp"));
+  const std::vector<std::string> files = {"a.jpg", "x.jpg", "gone.jpg", "y.bmp", "z.bmp"};
+
+  PictureDocument document;
+  Recorder recorder;
+  BatchObserver observer = recorder.Observer();
+  std::vector<TBitmap32> sources;
+  observer.afterEffect = [&](const BatchProgress&, const PictureDocument& d) {
+    sources.push_back(d.Source());
+  };
+  const BatchResult result =
+      ConvertBatch(document, Pencil(), EffectParams(), {in_, out_, files}, observer);
+
+  EXPECT_EQ(result.end, BatchResult::End::Completed);
+  EXPECT_FALSE(result.AllConverted());
+  EXPECT_EQ(result.outputs,
+            (std::vector<std::string>{Out("a-PencilSketch.jpg"), Out("z-PencilSketch.jpg")}));
+  ASSERT_EQ(result.skipped.size(), 3u);
+  EXPECT_EQ(result.skipped[0].name, "x.jpg");
+  EXPECT_NE(result.skipped[0].reason.find(In("x.jpg")), std::string::npos);
+  EXPECT_EQ(result.skipped[1].name, "gone.jpg");
+  EXPECT_EQ(result.skipped[1].reason, In("gone.jpg") + " is not a valid format");
+  EXPECT_EQ(result.skipped[2].name, "y.bmp");
+  EXPECT_NE(result.skipped[2].reason.find(In("y.bmp")), std::string::npos);
+  for (const char* name : {"x-PencilSketch.jpg", "gone-PencilSketch.jpg", "y-PencilSketch.jpg"})
+    EXPECT_FALSE(fs::exists(Out(name))) << name;
+
+  // The effect ran only on the pictures that loaded, each from its own source.
+  ASSERT_EQ(sources.size(), 2u);
+  EXPECT_EQ(sources[1], Picture(8, 6, 6));
+  EXPECT_EQ(std::count_if(recorder.steps.begin(), recorder.steps.end(),
+                          [](const std::string& s) { return s.rfind("skipped", 0) == 0; }),
+            3);
+  EXPECT_TRUE(recorder.messages.empty());
+}
+
+TEST_F(BatchFolder, HistoryGrowsPerPictureOnlyForEffectsThatRecordBatchSteps) {
+  SaveBitmap24(Picture(10, 7, 7), In("a.bmp"));
+  SaveBitmap24(Picture(11, 8, 8), In("b.bmp"));
+  WriteBytes(In("bad.bmp"), "BM");
+  const BatchJob job{in_, out_, {"a.bmp", "bad.bmp", "b.bmp"}};
+
+  // The pencil's batch routine records no step: the history is as it was before the batch,
+  // not reset either.
+  PictureDocument quiet(Picture(5, 5, 1));
+  quiet.SetWorking(Picture(5, 5, 2));
+  quiet.Backup();
+  ASSERT_FALSE(Pencil().batchPushesHistory);
+  ASSERT_TRUE(ConvertBatch(quiet, Pencil(), EffectParams(), job).end ==
+              BatchResult::End::Completed);
+  EXPECT_EQ(quiet.UndoCount(), 1);
+  EXPECT_EQ(quiet.Slot(quiet.CurrentSlot()), Picture(5, 5, 2));
+  ASSERT_TRUE(quiet.Undo());
+  EXPECT_EQ(quiet.Working(), Picture(5, 5, 1));
+
+  // One that does records one step per converted picture, holding that picture's result.
+  EffectSpec recording = Pencil();
+  recording.batchPushesHistory = true;
+  PictureDocument loud(Picture(5, 5, 1));
+  ASSERT_TRUE(ConvertBatch(loud, recording, EffectParams(), job).AllConverted() == false);
+  EXPECT_EQ(loud.UndoCount(), 2);
+  EXPECT_EQ(loud.Slot(loud.CurrentSlot()), loud.Working());
+  ASSERT_TRUE(loud.Undo());
+  TBitmap32 first = Picture(10, 7, 7);
+  EXPECT_EQ(loud.Working(), peccilsketch(first, PencilToneMode::Contrast, 45, 128));
+}
+
+TEST_F(BatchFolder, AFailedWriteStopsTheLoopAndKeepsWhatWasWritten) {
+  SaveBitmap24(Picture(9, 9, 1), In("a.bmp"));
+  SaveBitmap24(Picture(9, 9, 2), In("b.bmp"));
+  SaveBitmap24(Picture(9, 9, 3), In("c.bmp"));
+  fs::create_directories(Out("b-PencilSketch.jpg"));  // a folder where b's output should go
+
+  PictureDocument document;
+  const BatchResult result =
+      ConvertBatch(document, Pencil(), EffectParams(), {in_, out_, {"a.bmp", "b.bmp", "c.bmp"}});
+  EXPECT_EQ(result.end, BatchResult::End::Stopped);
+  EXPECT_NE(result.error.find(Out("b-PencilSketch.jpg")), std::string::npos) << result.error;
+  EXPECT_EQ(result.outputs, std::vector<std::string>{Out("a-PencilSketch.jpg")});
+  EXPECT_TRUE(fs::is_regular_file(Out("a-PencilSketch.jpg")));
+  EXPECT_TRUE(fs::is_directory(Out("b-PencilSketch.jpg")));
+  EXPECT_FALSE(fs::exists(Out("c-PencilSketch.jpg")));
+}
+
+TEST_F(BatchFolder, AnEffectErrorStopsTheLoopAtThatPicture) {
+  SaveBitmap24(Picture(9, 9, 1), In("a.bmp"));
+  SaveBitmap24(Picture(9, 1, 2), In("line.bmp"));
+  SaveBitmap24(Picture(9, 9, 3), In("c.bmp"));
+  // An effect that cannot work on a picture one pixel high, as some need three rows.
+  EffectSpec fussy = Pencil();
+  fussy.routine = [](const EffectInput& in) {
+    if (in.source.Height() < 3) throw ScanLineError();
+    return Pencil().routine(in);
+  };
+
+  PictureDocument document;
+  const BatchResult result =
+      ConvertBatch(document, fussy, EffectParams(), {in_, out_, {"a.bmp", "line.bmp", "c.bmp"}});
+  EXPECT_EQ(result.end, BatchResult::End::Stopped);
+  EXPECT_NE(result.error.find(In("line.bmp") + ": Scan line index out of range"), std::string::npos)
+      << result.error;
+  EXPECT_EQ(result.outputs, std::vector<std::string>{Out("a-PencilSketch.jpg")});
+  EXPECT_FALSE(fs::exists(Out("line-PencilSketch.jpg")));
+  EXPECT_FALSE(fs::exists(Out("c-PencilSketch.jpg")));
+  // The picture that failed is the document's; its working picture was not replaced.
+  EXPECT_EQ(document.Working(), Picture(9, 1, 2));
+}
+
+TEST_F(BatchFolder, AnOutputFolderThatCannotBeMadeStopsBeforeAnyPicture) {
+  SaveBitmap24(Picture(9, 9, 1), In("a.bmp"));
+  WriteBytes(root_ / "taken", "a file, not a folder");
+  PictureDocument document;
+  BatchResult result = ConvertBatch(document, Pencil(), EffectParams(),
+                                    {in_, (root_ / "taken").string() + "/sub", {"a.bmp"}});
+  EXPECT_EQ(result.end, BatchResult::End::Stopped);
+  EXPECT_NE(result.error.find("taken"), std::string::npos) << result.error;
+  result = ConvertBatch(document, Pencil(), EffectParams(), {in_, "  ", {"a.bmp"}});
+  EXPECT_EQ(result.end, BatchResult::End::Stopped);
+  EXPECT_TRUE(result.outputs.empty());
+}
+
+TEST(ConvertBatchTest, RefusesEffectsWithoutABatchRoutine) {
+  PictureDocument document;
+  EffectSpec none = Pencil();
+  none.routine = nullptr;
+  EXPECT_THROW(ConvertBatch(document, none, EffectParams(), {"/", "/tmp", {"a.jpg"}}),
+               std::invalid_argument);
+  const EffectSpec* hsl = FindEffectByCliName("hsl-adjust");
+  ASSERT_NE(hsl, nullptr);
+  EXPECT_THROW(ConvertBatch(document, *hsl, EffectParams(), {"/", "/tmp", {"a.jpg"}}),
+               std::invalid_argument);
+}
+
+}  // namespace
+}  // namespace quillane

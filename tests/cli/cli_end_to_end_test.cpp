@@ -1,0 +1,230 @@
+// Runs the built quillane-cli and checks what it writes against the routines run here.
+#include <gtest/gtest.h>
+#include <stdlib.h>
+#include <sys/wait.h>
+
+#include <QImage>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+#include <string>
+
+#include "codecs/picture_file.h"
+#include "data/startup_picture.h"
+#include "effects/mono/bw_sketch.h"
+#include "effects/registry.h"
+
+namespace quillane {
+namespace {
+
+namespace fs = std::filesystem;
+
+std::string ReadText(const std::string& path) {
+  std::ifstream in(path, std::ios::binary);
+  return {std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
+}
+
+class CliRun : public ::testing::Test {
+ protected:
+  void SetUp() override {
+    std::string pattern = (fs::temp_directory_path() / "quillane-cli-XXXXXX").string();
+    ASSERT_NE(mkdtemp(pattern.data()), nullptr);
+    dir_ = pattern;
+  }
+  void TearDown() override { fs::remove_all(dir_); }
+
+  std::string Path(const std::string& name) const { return dir_ + "/" + name; }
+
+  // Runs quillane-cli with arguments (already quoted as the shell needs); its exit code, with
+  // out_ and err_ holding what it printed.
+  int Run(const std::string& arguments) {
+    const std::string command = std::string("'") + QUILLANE_CLI_PATH + "' " + arguments + " >'" +
+                                Path("stdout.txt") + "' 2>'" + Path("stderr.txt") + "'";
+    const int status = std::system(command.c_str());
+    out_ = ReadText(Path("stdout.txt"));
+    err_ = ReadText(Path("stderr.txt"));
+    return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+  }
+
+  std::string dir_;
+  std::string out_;
+  std::string err_;
+};
+
+TBitmap32 Picture(int width, int height) {
+  TBitmap32 p(width, height);
+  for (int y = 0; y < height; ++y)
+    for (int x = 0; x < width; ++x)
+      p.At(x, y) = Pixel{static_cast<std::uint8_t>(x * 29 + y), static_cast<std::uint8_t>(y * 41),
+                         static_cast<std::uint8_t>((x * y * 7) & 255),
+                         static_cast<std::uint8_t>(255 - x * 5)};
+  return p;
+}
+
+TBitmap32 FromPng(const std::string& path) {
+  QImage image(QString::fromStdString(path), "png");
+  image = image.convertToFormat(QImage::Format_ARGB32);
+  TBitmap32 p(image.width(), image.height());
+  for (int y = 0; y < image.height(); ++y)
+    for (int x = 0; x < image.width(); ++x) {
+      const QRgb c = image.pixel(x, y);
+      p.At(x, y) = Pixel{static_cast<std::uint8_t>(qBlue(c)), static_cast<std::uint8_t>(qGreen(c)),
+                         static_cast<std::uint8_t>(qRed(c)), static_cast<std::uint8_t>(qAlpha(c))};
+    }
+  return p;
+}
+
+TBitmap32 Pencil(TBitmap32 picture, PencilToneMode mode, int contrast, int lighting) {
+  SetAlphaChannel(picture, 255);
+  return peccilsketch(picture, mode, contrast, lighting);
+}
+
+void ExpectSameColours(const TBitmap32& a, const TBitmap32& b) {
+  ASSERT_EQ(a.Width(), b.Width());
+  ASSERT_EQ(a.Height(), b.Height());
+  for (int y = 0; y < a.Height(); ++y)
+    for (int x = 0; x < a.Width(); ++x) {
+      const Pixel p = a.At(x, y);
+      const Pixel q = b.At(x, y);
+      ASSERT_TRUE(p.r == q.r && p.g == q.g && p.b == q.b) << x << "," << y;
+    }
+}
+
+TEST_F(CliRun, ApplyWritesExactlyWhatTheRoutineGives) {
+  const TBitmap32 input = Picture(31, 22);
+  SaveBitmap24(input, Path("in.bmp"));
+  TBitmap32 loaded = *LoadPictureFile(Path("in.bmp"));
+
+  ASSERT_EQ(Run("apply pencil-sketch --lighting 140 '" + Path("in.bmp") + "' -o '" +
+                Path("out.png") + "'"),
+            0)
+      << err_;
+  EXPECT_EQ(FromPng(Path("out.png")), Pencil(loaded, PencilToneMode::Lighting, 45, 140));
+
+  ASSERT_EQ(Run("apply pencil-sketch --contrast=30 '" + Path("in.bmp") + "' -o '" +
+                Path("out.BMP") + "'"),
+            0)
+      << err_;
+  ExpectSameColours(*LoadPictureFile(Path("out.BMP")),
+                    Pencil(loaded, PencilToneMode::Contrast, 30, 128));
+
+  // A JPEG output is the same file our own encoder makes of the result.
+  ASSERT_EQ(Run("apply pencil-sketch '" + Path("in.bmp") + "' -o '" + Path("out.jpeg") + "'"), 0)
+      << err_;
+  SaveJpeg(Pencil(loaded, PencilToneMode::Contrast, 45, 128), Path("expected.jpg"), 90);
+  EXPECT_EQ(ReadText(Path("out.jpeg")), ReadText(Path("expected.jpg")));
+}
+
+TEST_F(CliRun, ApplyReadsPngAndUsesTheBuiltInPictureWithoutInput) {
+  const TBitmap32 input = Picture(17, 13);  // alpha varies; the document makes it 255
+  SavePng(input, Path("in.png"));
+  ASSERT_EQ(Run("apply pencil-sketch '" + Path("in.png") + "' -o '" + Path("out.png") + "'"), 0)
+      << err_;
+  EXPECT_EQ(FromPng(Path("out.png")), Pencil(input, PencilToneMode::Contrast, 45, 128));
+
+  ASSERT_EQ(Run("apply pencil-sketch --lighting 90 -o '" + Path("builtin.png") + "'"), 0) << err_;
+  EXPECT_EQ(FromPng(Path("builtin.png")),
+            Pencil(StartupPicture(), PencilToneMode::Lighting, 45, 90));
+}
+
+TEST_F(CliRun, BadParametersExitWithTwoAndNameTheRange) {
+  EXPECT_EQ(Run("apply pencil-sketch --contrast 90 -o '" + Path("o.png") + "'"), 2);
+  EXPECT_NE(err_.find("--contrast must be an integer from 0 to 89"), std::string::npos) << err_;
+  EXPECT_EQ(Run("apply pencil-sketch --lighting 1.5 -o '" + Path("o.png") + "'"), 2);
+  EXPECT_NE(err_.find("--lighting must be an integer from 0 to 255"), std::string::npos) << err_;
+  EXPECT_EQ(Run("apply no-such-effect -o '" + Path("o.png") + "'"), 2);
+  EXPECT_NE(err_.find("no-such-effect"), std::string::npos) << err_;
+  EXPECT_EQ(Run("apply pencil-sketch --shade 3 -o '" + Path("o.png") + "'"), 2);
+  EXPECT_EQ(Run("frobnicate"), 2);
+  EXPECT_FALSE(fs::exists(Path("o.png")));
+}
+
+TEST_F(CliRun, UnreadableInputExitsWithOneAndWritesNothing) {
+  std::ofstream(Path("broken.jpg"), std::ios::binary) << "\xFF\xD8\xFF not really";
+  std::ofstream(Path("broken.png"), std::ios::binary) << "\x89PNG nothing";
+  std::ofstream(Path("picture.tga"), std::ios::binary) << "whatever";
+  for (const char* name : {"broken.jpg", "broken.png", "picture.tga", "missing.bmp"}) {
+    EXPECT_EQ(Run("apply pencil-sketch '" + Path(name) + "' -o '" + Path("o.png") + "'"), 1)
+        << name;
+    EXPECT_NE(err_.find(Path(name)), std::string::npos) << err_;
+  }
+  EXPECT_FALSE(fs::exists(Path("o.png")));
+}
+
+TEST_F(CliRun, ListShowsEveryEffectWithRangesAndDefaults) {
+  ASSERT_EQ(Run("list"), 0);
+  EXPECT_NE(out_.find("pencil-sketch"), std::string::npos);
+  EXPECT_NE(out_.find("--contrast N"), std::string::npos) << out_;
+  EXPECT_NE(out_.find("0..89, default 45"), std::string::npos) << out_;
+  EXPECT_NE(out_.find("0..255, default 128"), std::string::npos) << out_;
+  for (const EffectSpec& e : Effects()) {
+    const std::size_t at = out_.find("  " + e.cliName + "  ");
+    ASSERT_NE(at, std::string::npos) << e.cliName;
+    const std::string line = out_.substr(at, out_.find('\n', at) - at);
+    EXPECT_EQ(line.find("not yet available") != std::string::npos, !e.routine) << line;
+  }
+  ASSERT_EQ(Run("--version"), 0);
+  EXPECT_EQ(out_, "quillane-cli 4.36\n");
+  ASSERT_EQ(Run("--help"), 0);
+  EXPECT_NE(out_.find("Examples:"), std::string::npos);
+}
+
+TEST_F(CliRun, GalleryWritesAPngPerAvailableEffectAndAContactSheet) {
+  const std::string gallery = Path("gallery/nested");
+  ASSERT_EQ(Run("gallery '" + gallery + "'"), 0) << err_;
+  const std::string html = ReadText(gallery + "/index.html");
+  EXPECT_EQ(FromPng(gallery + "/original.png"), StartupPicture());
+  EXPECT_NE(html.find("src=\"original.png\""), std::string::npos);
+  EXPECT_NE(html.find("B&amp;W"), std::string::npos);
+  EXPECT_EQ(html.find("&&"), std::string::npos);
+  int pictures = 0;
+  for (const EffectSpec& e : Effects()) {
+    const std::string file = gallery + "/" + e.cliName + ".png";
+    EXPECT_EQ(fs::exists(file), static_cast<bool>(e.routine)) << file;
+    if (!e.routine) continue;
+    ++pictures;
+    EXPECT_NE(html.find("src=\"" + e.cliName + ".png\""), std::string::npos) << e.cliName;
+  }
+  EXPECT_GE(pictures, 1);
+  EXPECT_EQ(FromPng(gallery + "/pencil-sketch.png"),
+            Pencil(StartupPicture(), PencilToneMode::Contrast, 45, 128));
+
+  // Another picture, named in the sheet with its characters escaped.
+  SaveBitmap24(Picture(12, 9), Path("a<b>.bmp"));
+  ASSERT_EQ(Run("gallery '" + Path("g2") + "' --input '" + Path("a<b>.bmp") + "'"), 0) << err_;
+  EXPECT_NE(ReadText(Path("g2/index.html")).find("a&lt;b&gt;.bmp"), std::string::npos);
+}
+
+TEST_F(CliRun, BatchConvertsTheFolderAndListsSkippedFiles) {
+  fs::create_directory(Path("in"));
+  SaveJpeg(Picture(20, 15), Path("in/a.jpg"));
+  SaveBitmap24(Picture(9, 7), Path("in/b.BMP"));
+  const std::string out = Path("out/deep");
+
+  ASSERT_EQ(
+      Run("batch pencil-sketch --lighting 100 --input '" + Path("in") + "' --output '" + out + "'"),
+      0)
+      << err_;
+  EXPECT_NE(out_.find("The batch convert is successful."), std::string::npos) << out_;
+  // Not a terminal: one plain line per picture.
+  EXPECT_NE(err_.find("picture 1 of 2: a.jpg -> " + out + "/a-PencilSketch.jpg"), std::string::npos)
+      << err_;
+  SaveJpeg(Pencil(*LoadPictureFile(Path("in/b.BMP")), PencilToneMode::Lighting, 45, 100),
+           Path("expected.jpg"), 90);
+  EXPECT_EQ(ReadText(out + "/b-PencilSketch.jpg"), ReadText(Path("expected.jpg")));
+  EXPECT_TRUE(fs::is_regular_file(out + "/a-PencilSketch.jpg"));
+
+  std::ofstream(Path("in/x.jpg"), std::ios::binary) << "not a picture";
+  EXPECT_EQ(Run("batch pencil-sketch --input '" + Path("in") + "' --output '" + out + "'"), 1);
+  EXPECT_NE(err_.find("Skipped 1 picture:\n  x.jpg: "), std::string::npos) << err_;
+  EXPECT_FALSE(fs::exists(out + "/x-PencilSketch.jpg"));
+
+  EXPECT_EQ(Run("batch pencil-sketch --input '" + Path("nowhere") + "' --output '" + out + "'"), 1);
+  EXPECT_NE(err_.find("Sorry: Input Director in not exist."), std::string::npos) << err_;
+  fs::create_directory(Path("empty"));
+  EXPECT_EQ(Run("batch pencil-sketch --input '" + Path("empty") + "' --output '" + out + "'"), 1);
+  EXPECT_NE(err_.find("Sorry: There is no picture to convert."), std::string::npos) << err_;
+}
+
+}  // namespace
+}  // namespace quillane

@@ -1,0 +1,158 @@
+#include "cli/cli_options.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+#include <vector>
+
+#include "cli/cli_commands.h"
+#include "effects/mono/bw_sketch.h"
+
+namespace quillane::cli {
+namespace {
+
+ParseResult Parse(std::vector<std::string> args) {
+  return ParseCommandLine(args);
+}
+
+constexpr int kContrast = static_cast<int>(PencilToneMode::Contrast);
+constexpr int kLighting = static_cast<int>(PencilToneMode::Lighting);
+
+TEST(ParseCommandLineTest, ApplyTakesParametersInputAndOutput) {
+  ParseResult r = Parse({"apply", "pencil-sketch", "--lighting", "140", "in.jpg", "-o", "o.png"});
+  ASSERT_TRUE(r.Ok()) << r.error;
+  EXPECT_EQ(r.options.command, Command::Apply);
+  EXPECT_EQ(r.options.effect->cliName, "pencil-sketch");
+  EXPECT_EQ(r.options.input, "in.jpg");
+  EXPECT_EQ(r.options.output, "o.png");
+  // Giving the lighting selects the lighting tone; the contrast keeps its default.
+  EXPECT_EQ(r.options.params.Get("lighting"), 140);
+  EXPECT_EQ(r.options.params.Get("tone-mode"), kLighting);
+  EXPECT_EQ(r.options.params.Get("contrast"), 45);
+
+  // No input: the built-in picture. "--name=value" works as well.
+  r = Parse({"apply", "pencil-sketch", "--output=x.JPEG", "--contrast=0"});
+  ASSERT_TRUE(r.Ok()) << r.error;
+  EXPECT_EQ(r.options.input, "");
+  EXPECT_EQ(r.options.params.Get("contrast"), 0);
+  EXPECT_EQ(r.options.params.Get("tone-mode"), kContrast);
+  EXPECT_EQ(r.options.params.Get("lighting"), 128);
+
+  // Nothing given: every default, contrast tone.
+  r = Parse({"apply", "pencil-sketch", "-o", "x.bmp"});
+  ASSERT_TRUE(r.Ok()) << r.error;
+  EXPECT_EQ(r.options.params.Values(), r.options.effect->Defaults().Values());
+}
+
+TEST(ParseCommandLineTest, TheLastSelectingParameterDecidesTheTone) {
+  ParseResult r =
+      Parse({"apply", "pencil-sketch", "--lighting", "10", "--contrast", "20", "-o", "o.png"});
+  ASSERT_TRUE(r.Ok());
+  EXPECT_EQ(r.options.params.Get("tone-mode"), kContrast);
+  EXPECT_EQ(r.options.params.Get("lighting"), 10);
+  r = Parse({"apply", "pencil-sketch", "--contrast", "20", "--lighting", "+255", "-o", "o.png"});
+  ASSERT_TRUE(r.Ok());
+  EXPECT_EQ(r.options.params.Get("tone-mode"), kLighting);
+  EXPECT_EQ(r.options.params.Get("lighting"), 255);
+}
+
+TEST(ParseCommandLineTest, BadValuesNameTheParameterAndItsRange) {
+  for (const char* value :
+       {"90", "-1", "4.5", "abc", "", "1e1", "0x10", "99999999999999999999", "++1", " 5"}) {
+    const ParseResult r = Parse({"apply", "pencil-sketch", "--contrast", value, "-o", "o.png"});
+    EXPECT_EQ(r.exitCode, kExitUsage) << value;
+    EXPECT_NE(r.error.find("--contrast"), std::string::npos) << r.error;
+    EXPECT_NE(r.error.find("0 to 89"), std::string::npos) << r.error;
+  }
+  const ParseResult r =
+      Parse({"batch", "pencil-sketch", "--lighting=256", "--input", "a", "--output", "b"});
+  EXPECT_EQ(r.exitCode, kExitUsage);
+  EXPECT_NE(r.error.find("--lighting must be an integer from 0 to 255"), std::string::npos)
+      << r.error;
+  EXPECT_EQ(Parse({"apply", "pencil-sketch", "-o", "o.png", "--contrast"}).exitCode, kExitUsage);
+}
+
+TEST(ParseCommandLineTest, UnknownOrMisplacedWordsAreUsageErrors) {
+  const std::vector<std::vector<std::string>> wrong = {
+      {},
+      {"paint"},
+      {"list", "extra"},
+      {"apply"},
+      {"apply", "--contrast", "3"},
+      {"apply", "charcoal", "-o", "o.png"},
+      {"apply", "pencil-sketch", "--sharpness", "3", "-o", "o.png"},
+      {"apply", "pencil-sketch", "--tone-mode", "1", "-o", "o.png"},
+      {"apply", "pencil-sketch", "in.jpg"},
+      {"apply", "pencil-sketch", "-o", "o.tiff"},
+      {"apply", "pencil-sketch", "-o", "picture"},
+      {"apply", "pencil-sketch", "a.jpg", "b.jpg", "-o", "o.png"},
+      {"apply", "pencil-sketch", "-o", "a.png", "-o", "b.png"},
+      {"apply", "pencil-sketch", "-x", "-o", "o.png"},
+      {"batch", "pencil-sketch", "--input", "in"},
+      {"batch", "pencil-sketch", "--output", "out"},
+      {"batch", "pencil-sketch", "in", "--input", "in", "--output", "out"},
+      {"gallery"},
+      {"gallery", "a", "b"},
+      {"gallery", "a", "--input"},
+      {"--version", "x"},
+  };
+  for (const auto& args : wrong) {
+    const ParseResult r = ParseCommandLine(args);
+    std::string line;
+    for (const auto& a : args) line += a + " ";
+    EXPECT_FALSE(r.Ok()) << line;
+    EXPECT_EQ(r.exitCode, kExitUsage) << line;
+  }
+  EXPECT_NE(Parse({"apply", "pencil-sketch", "--tone-mode", "1", "-o", "o.png"})
+                .error.find("--contrast or --lighting"),
+            std::string::npos);
+  EXPECT_NE(Parse({"apply", "charcoal", "-o", "o.png"}).error.find("charcoal"), std::string::npos);
+}
+
+TEST(ParseCommandLineTest, EffectsWithoutARoutineOrBatchPanelAreRefused) {
+  for (const EffectSpec& e : Effects()) {
+    const ParseResult apply = Parse({"apply", e.cliName, "-o", "o.png"});
+    const ParseResult batch = Parse({"batch", e.cliName, "--input", "i", "--output", "o"});
+    if (!e.routine) {
+      EXPECT_EQ(apply.exitCode, kExitUsage) << e.cliName;
+      EXPECT_NE(apply.error.find("not yet available"), std::string::npos) << e.cliName;
+    } else {
+      EXPECT_TRUE(apply.Ok()) << e.cliName;
+    }
+    EXPECT_EQ(batch.Ok(), e.routine && e.HasBatchPanel()) << e.cliName;
+  }
+}
+
+TEST(ParseCommandLineTest, HelpVersionListAndGallery) {
+  EXPECT_EQ(Parse({"--help"}).options.command, Command::Help);
+  EXPECT_EQ(Parse({"apply", "nothing", "-h"}).options.command, Command::Help);
+  EXPECT_EQ(Parse({"--version"}).options.command, Command::Version);
+  EXPECT_EQ(VersionText(), "quillane-cli 4.36");
+  EXPECT_EQ(Parse({"list"}).options.command, Command::List);
+  const ParseResult g = Parse({"gallery", "out dir", "--input", "p.png"});
+  ASSERT_TRUE(g.Ok());
+  EXPECT_EQ(g.options.output, "out dir");
+  EXPECT_EQ(g.options.input, "p.png");
+}
+
+TEST(OutputTypeForTest, ChosenByTheExtensionInAnyCase) {
+  EXPECT_EQ(OutputTypeFor("a.jpg"), OutputType::Jpeg);
+  EXPECT_EQ(OutputTypeFor("dir/a.b.JPEG"), OutputType::Jpeg);
+  EXPECT_EQ(OutputTypeFor("a.Bmp"), OutputType::Bitmap);
+  EXPECT_EQ(OutputTypeFor("a.wmf"), OutputType::Metafile);
+  EXPECT_EQ(OutputTypeFor("a.EMF"), OutputType::Metafile);
+  EXPECT_EQ(OutputTypeFor("a.png"), OutputType::Png);
+  EXPECT_EQ(OutputTypeFor("x.png/picture"), OutputType::Unknown);
+  EXPECT_EQ(OutputTypeFor("a.gif"), OutputType::Unknown);
+}
+
+TEST(CaptionTest, DisplayedCaptionsAndHtmlEscaping) {
+  EXPECT_EQ(DisplayedCaption(" B&&W"), "B&W");
+  EXPECT_EQ(DisplayedCaption("Pen && Ink"), "Pen & Ink");
+  EXPECT_EQ(DisplayedCaption("&File"), "File");
+  EXPECT_EQ(HtmlEscape("<a href=\"x\">Tom & Jerry's</a>"),
+            "&lt;a href=&quot;x&quot;&gt;Tom &amp; Jerry&#39;s&lt;/a&gt;");
+}
+
+}  // namespace
+}  // namespace quillane::cli
