@@ -1,0 +1,251 @@
+#include "imaging/bitmap32.h"
+
+#include <gtest/gtest.h>
+
+#include <climits>
+#include <cmath>
+#include <limits>
+#include <set>
+
+namespace quillane {
+namespace {
+
+// A picture whose every pixel names its own position: B = x, G = y, R = 7, alpha 255.
+TBitmap32 Numbered(int w, int h, std::uint8_t alpha = 255) {
+  TBitmap32 b(w, h);
+  for (int y = 0; y < h; ++y)
+    for (int x = 0; x < w; ++x)
+      b.At(x, y) = Pixel{static_cast<std::uint8_t>(x), static_cast<std::uint8_t>(y), 7, alpha};
+  return b;
+}
+
+TEST(TBitmap32, NewAndDegenerateSizesAreEmpty) {
+  const TBitmap32 fresh;
+  EXPECT_EQ(fresh.Width(), 0);
+  EXPECT_EQ(fresh.Height(), 0);
+  EXPECT_TRUE(fresh.Empty());
+  for (auto [w, h] : {std::pair{-3, 5}, {5, -1}, {0, 4}, {4, 0}, {INT_MIN, INT_MIN}}) {
+    const TBitmap32 b(w, h);
+    EXPECT_EQ(b.Width(), 0) << w << "x" << h;
+    EXPECT_EQ(b.Height(), 0) << w << "x" << h;
+    EXPECT_EQ(b.PixelCount(), 0u);
+  }
+  EXPECT_THROW(TBitmap32(1 << 15, 1 << 14), std::length_error);
+}
+
+TEST(TBitmap32, NewPixelsAreZeroAndResizeDiscardsContent) {
+  TBitmap32 b(3, 2, Pixel{1, 2, 3, 4});
+  EXPECT_EQ(b.At(2, 1), (Pixel{1, 2, 3, 4}));
+  b.SetSize(4, 3);
+  EXPECT_EQ(b, TBitmap32(4, 3, Pixel{0, 0, 0, 0}));
+  b.SetSize(-1, 3);
+  EXPECT_TRUE(b.Empty());
+  EXPECT_EQ(b.Height(), 0);
+}
+
+TEST(TBitmap32, RowAccessOutsideTheRowsThrows) {
+  TBitmap32 b(4, 3);
+  const TBitmap32& cb = b;
+  EXPECT_NO_THROW(b.ScanLine(0));
+  EXPECT_NO_THROW(cb.ScanLine(2));
+  for (int y : {-1, 3, INT_MIN, INT_MAX}) {
+    EXPECT_THROW(b.ScanLine(y), ScanLineError) << y;
+    EXPECT_THROW(cb.ScanLine(y), ScanLineError) << y;
+  }
+  try {
+    TBitmap32().ScanLine(0);
+    FAIL() << "an empty bitmap has no rows";
+  } catch (const ScanLineError& e) {
+    EXPECT_STREQ(e.what(), "Scan line index out of range");
+  }
+  // Rows are contiguous and follow each other without padding.
+  EXPECT_EQ(b.ScanLine(1), b.ScanLine(0) + 4);
+  EXPECT_EQ(b.ScanLine(0), b.Data());
+  EXPECT_THROW(b.At(4, 0), std::out_of_range);
+  EXPECT_THROW(b.At(-1, 0), std::out_of_range);
+}
+
+TEST(ColorRef, RedIsTheLowestByte) {
+  EXPECT_EQ(PixelFromColorRef(0x00332211), (Pixel{0x33, 0x22, 0x11, 255}));
+  EXPECT_EQ(PixelFromColorRef(0xFF332211, 9), (Pixel{0x33, 0x22, 0x11, 9}));
+  EXPECT_EQ(ColorRefFromPixel(Pixel{0x33, 0x22, 0x11, 0x80}), 0x00332211u);
+}
+
+TEST(SetAlphaChannel, SetsAlphaOnlyAndEmptyIsANoOp) {
+  TBitmap32 b = Numbered(5, 3, 0);
+  SetAlphaChannel(b, 200);
+  for (int y = 0; y < 3; ++y)
+    for (int x = 0; x < 5; ++x)
+      EXPECT_EQ(b.At(x, y),
+                (Pixel{static_cast<std::uint8_t>(x), static_cast<std::uint8_t>(y), 7, 200}));
+  TBitmap32 empty;
+  SetAlphaChannel(empty, 255);
+  EXPECT_TRUE(empty.Empty());
+}
+
+Pixel Over(Pixel overlay, Pixel target) {
+  TBitmap32 t(1, 1, target);
+  TBitmap32(1, 1, overlay).DrawOver(0, 0, t);
+  return t.At(0, 0);
+}
+
+TEST(DrawOver, PixelRules) {
+  // Half-transparent red over opaque white.
+  EXPECT_EQ(Over(Pixel{0, 0, 255, 128}, Pixel{255, 255, 255, 255}), (Pixel{127, 127, 255, 255}));
+  // A transparent overlay leaves the target, however transparent the target is itself.
+  EXPECT_EQ(Over(Pixel{9, 9, 9, 0}, Pixel{10, 20, 30, 255}), (Pixel{10, 20, 30, 255}));
+  EXPECT_EQ(Over(Pixel{9, 9, 9, 0}, Pixel{10, 20, 30, 1}), (Pixel{10, 20, 30, 1}));
+  // Both transparent: white with alpha 0.
+  EXPECT_EQ(Over(Pixel{9, 9, 9, 0}, Pixel{10, 20, 30, 0}), (Pixel{255, 255, 255, 0}));
+  // Opaque overlay, or transparent target: the overlay pixel with its own alpha.
+  EXPECT_EQ(Over(Pixel{1, 2, 3, 255}, Pixel{10, 20, 30, 77}), (Pixel{1, 2, 3, 255}));
+  EXPECT_EQ(Over(Pixel{1, 2, 3, 77}, Pixel{10, 20, 30, 0}), (Pixel{1, 2, 3, 77}));
+  // Both partial: d = 255 (50 + 100) - 5000 = 33250; weights 100 * 205 and 255 * 50.
+  // B: (20500 * 200 + 12750 * 10) / 33250 = 127.1; G: (20500 * 0 + 12750 * 255) / 33250 = 97.8;
+  // R: (20500 * 255 + 12750 * 255) / 33250 = 255; A: 33250 / 255 = 130.4.
+  EXPECT_EQ(Over(Pixel{10, 255, 255, 50}, Pixel{200, 0, 255, 100}), (Pixel{127, 97, 255, 130}));
+}
+
+// Places a numbered overlay of ow by oh at (x, y) of an opaque gray 6 by 5 target and checks
+// that exactly the overlapping target pixels took the overlay pixel that lands on them.
+void ExpectPlacement(int ow, int oh, int x, int y) {
+  const Pixel ground{50, 50, 50, 255};
+  TBitmap32 target(6, 5, ground);
+  Numbered(ow, oh).DrawOver(x, y, target);
+  for (int ty = 0; ty < 5; ++ty)
+    for (int tx = 0; tx < 6; ++tx) {
+      const long long ox = static_cast<long long>(tx) - x, oy = static_cast<long long>(ty) - y;
+      const bool inside = ox >= 0 && oy >= 0 && ox < ow && oy < oh;
+      const Pixel expected =
+          inside ? Pixel{static_cast<std::uint8_t>(ox), static_cast<std::uint8_t>(oy), 7, 255}
+                 : ground;
+      ASSERT_EQ(target.At(tx, ty), expected)
+          << ow << "x" << oh << " at " << x << "," << y << ": target " << tx << "," << ty;
+    }
+}
+
+TEST(DrawOver, ClipsAtEverySide) {
+  ExpectPlacement(3, 3, 1, 1);     // inside
+  ExpectPlacement(3, 3, -1, -2);   // over the top-left corner
+  ExpectPlacement(3, 3, 4, 3);     // over the bottom-right corner
+  ExpectPlacement(3, 3, -2, 3);    // bottom-left
+  ExpectPlacement(3, 3, 5, -1);    // top-right
+  ExpectPlacement(10, 9, -2, -3);  // larger than the target on every side
+  ExpectPlacement(3, 3, -3, 0);    // just off the left edge: nothing
+  ExpectPlacement(3, 3, 6, 0);     // just off the right edge
+  ExpectPlacement(3, 3, 0, -3);
+  ExpectPlacement(3, 3, 0, 5);
+  ExpectPlacement(3, 3, INT_MAX, INT_MAX);  // far away, no overflow
+  ExpectPlacement(3, 3, INT_MIN, INT_MIN);
+  ExpectPlacement(0, 0, 0, 0);  // empty overlay
+}
+
+TEST(DrawOver, EmptyTargetIsUnchanged) {
+  TBitmap32 target;
+  Numbered(3, 3).DrawOver(0, 0, target);
+  Numbered(3, 3).DrawOver(-1, -1, target);
+  EXPECT_TRUE(target.Empty());
+}
+
+TEST(ZoomInandOut, UnitFactorsKeepThePicture) {
+  TBitmap32 b = Numbered(7, 4);
+  ZoomInandOut(b, 1.0L, 1.0L);
+  EXPECT_EQ(b, Numbered(7, 4));
+}
+
+TEST(ZoomInandOut, NewSizeIsTruncated) {
+  TBitmap32 b = Numbered(5, 3);
+  ZoomInandOut(b, 1.0L, 0.5L);
+  EXPECT_EQ(b.Width(), 2);
+  EXPECT_EQ(b.Height(), 3);
+  TBitmap32 c = Numbered(10, 10);
+  ZoomInandOut(c, 0.99L, 1.55L);
+  EXPECT_EQ(c.Width(), 15);
+  EXPECT_EQ(c.Height(), 9);
+}
+
+TEST(ZoomInandOut, SizesOfZeroOrBelowOrNotANumberGiveEmpty) {
+  const long double nan = std::numeric_limits<long double>::quiet_NaN();
+  const long double inf = std::numeric_limits<long double>::infinity();
+  for (auto [hf, wf] : {std::pair{0.0L, 1.0L},
+                        {1.0L, 0.0L},
+                        {-1.0L, 1.0L},
+                        {1.0L, -2.0L},
+                        {nan, 1.0L},
+                        {1.0L, nan},
+                        {inf, 1.0L},
+                        {1.0L, -inf},
+                        {0.1L, 1.0L}}) {
+    TBitmap32 b = Numbered(6, 4);
+    ZoomInandOut(b, hf, wf);
+    EXPECT_TRUE(b.Empty()) << hf << " " << wf;
+    EXPECT_EQ(b.Height(), 0);
+  }
+  TBitmap32 narrow = Numbered(1, 4);
+  ZoomInandOut(narrow, 1.0L, 0.9L);
+  EXPECT_TRUE(narrow.Empty());
+  TBitmap32 empty;
+  ZoomInandOut(empty, 2.0L, 2.0L);
+  EXPECT_TRUE(empty.Empty());
+}
+
+TEST(ZoomInandOut, ARequestBeyondTheSizeLimitLeavesThePicture) {
+  TBitmap32 b = Numbered(1000, 1000);
+  EXPECT_THROW(ZoomInandOut(b, 100.0L, 100.0L), std::length_error);
+  EXPECT_EQ(b, Numbered(1000, 1000));
+}
+
+// Every target pixel is a copy of one source pixel; the chosen source columns and rows never
+// go backwards, start at the first, reach the last, and skip no more than the ratio allows.
+void ExpectNearestPixelResample(long double hf, long double wf) {
+  const int w = 101, h = 57;
+  TBitmap32 b = Numbered(w, h);
+  ZoomInandOut(b, hf, wf);
+  const int nw = static_cast<int>(w * wf), nh = static_cast<int>(h * hf);
+  ASSERT_EQ(b.Width(), nw);
+  ASSERT_EQ(b.Height(), nh);
+  std::set<int> columns, rows;
+  for (int y = 0; y < nh; ++y)
+    for (int x = 0; x < nw; ++x) {
+      const Pixel p = b.At(x, y);
+      ASSERT_EQ(p.r, 7);
+      ASSERT_EQ(p.a, 255);
+      ASSERT_LT(p.b, w);
+      ASSERT_LT(p.g, h);
+      // One source column per target column, one source row per target row.
+      ASSERT_EQ(p.b, b.At(x, 0).b);
+      ASSERT_EQ(p.g, b.At(0, y).g);
+      if (x > 0) {
+        ASSERT_GE(p.b, b.At(x - 1, y).b);
+      }
+      if (y > 0) {
+        ASSERT_GE(p.g, b.At(x, y - 1).g);
+      }
+      columns.insert(p.b);
+      rows.insert(p.g);
+    }
+  const auto covers = [](const std::set<int>& used, int size, int newSize) {
+    if (*used.begin() != 0) return false;
+    const int step = (size + newSize - 1) / newSize;
+    if (*used.rbegin() < size - step) return false;
+    int last = -1;
+    for (int v : used) {
+      if (v - last > step) return false;
+      last = v;
+    }
+    return newSize < size || static_cast<int>(used.size()) == size;
+  };
+  EXPECT_TRUE(covers(columns, w, nw)) << "width factor " << wf;
+  EXPECT_TRUE(covers(rows, h, nh)) << "height factor " << hf;
+}
+
+TEST(ZoomInandOut, NearestPixelCoversTheSource) {
+  ExpectNearestPixelResample(2.0L, 2.0L);
+  ExpectNearestPixelResample(0.5L, 0.5L);
+  ExpectNearestPixelResample(1.37L, 0.73L);
+  ExpectNearestPixelResample(0.3L, 2.49L);
+  ExpectNearestPixelResample(1.0L, 0.02L);  // two columns of 101
+}
+
+}  // namespace
+}  // namespace quillane

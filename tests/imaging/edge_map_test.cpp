@@ -1,0 +1,205 @@
+#include "imaging/edge_map.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <random>
+
+namespace quillane {
+namespace {
+
+Pixel Rgb(std::uint8_t r, std::uint8_t g, std::uint8_t b, std::uint8_t a = 255) {
+  return Pixel{b, g, r, a};
+}
+Pixel Inverted(Pixel p) {
+  return Pixel{static_cast<std::uint8_t>(255 - p.b), static_cast<std::uint8_t>(255 - p.g),
+               static_cast<std::uint8_t>(255 - p.r), p.a};
+}
+
+// The edge map the slow and obvious way, step by step: the interior from a snapshot with both
+// kernels, then the left and right columns, then the top and bottom rows, then the inversion.
+// For pictures of at least 3 by 3.
+TBitmap32 ReferencePicsobel(const TBitmap32& input) {
+  const int w = input.Width(), h = input.Height();
+  TBitmap32 work = input;
+  const TBitmap32 snapshot = work;
+  const int kernelA[3][3] = {{-1, -1, -1}, {0, 6, 0}, {-1, -1, -1}};
+  const int kernelB[3][3] = {{1, 0, -1}, {1, 0, -1}, {1, 0, -1}};
+  std::uint8_t Pixel::*const channels[] = {&Pixel::r, &Pixel::g, &Pixel::b};
+  for (int y = 1; y <= h - 2; ++y)
+    for (int x = 1; x <= w - 2; ++x)
+      for (auto channel : channels) {
+        int a = 0, b = 0;
+        for (int j = -1; j <= 1; ++j)
+          for (int i = -1; i <= 1; ++i) {
+            const int v = snapshot.At(x + i, y + j).*channel;
+            a += kernelA[j + 1][i + 1] * v;
+            b += kernelB[j + 1][i + 1] * v;
+          }
+        a = std::min(255, std::max(0, a));
+        b = std::min(255, std::max(0, b));
+        work.At(x, y).*channel = static_cast<std::uint8_t>(std::max(a, b));
+      }
+  const auto copyColour = [](Pixel& to, const Pixel& from) {
+    to.b = from.b;
+    to.g = from.g;
+    to.r = from.r;
+  };
+  for (int y = 1; y <= h - 2; ++y) {
+    copyColour(work.At(0, y), work.At(1, y));
+    copyColour(work.At(w - 1, y), work.At(w - 2, y));
+  }
+  for (int x = 0; x < w; ++x) copyColour(work.At(x, 0), work.At(x, 1));
+  for (int x = 0; x < w; ++x) copyColour(work.At(x, h - 1), work.At(x, h - 2));
+  for (int y = 0; y < h; ++y)
+    for (int x = 0; x < w; ++x) work.At(x, y) = Inverted(work.At(x, y));
+  return work;
+}
+
+TBitmap32 Sobel(TBitmap32 b) {
+  picsobel(b);
+  return b;
+}
+
+// Colour channels only: the alpha of the edge map is not part of its result.
+::testing::AssertionResult SameColours(const TBitmap32& actual, const TBitmap32& expected) {
+  if (actual.Width() != expected.Width() || actual.Height() != expected.Height())
+    return ::testing::AssertionFailure() << "size " << actual.Width() << "x" << actual.Height();
+  for (int y = 0; y < actual.Height(); ++y)
+    for (int x = 0; x < actual.Width(); ++x) {
+      const Pixel a = actual.At(x, y), e = expected.At(x, y);
+      if (a.b != e.b || a.g != e.g || a.r != e.r)
+        return ::testing::AssertionFailure()
+               << "at " << x << "," << y << ": got (R " << int{a.r} << ", G " << int{a.g} << ", B "
+               << int{a.b} << "), expected (R " << int{e.r} << ", G " << int{e.g} << ", B "
+               << int{e.b} << ")";
+    }
+  return ::testing::AssertionSuccess();
+}
+
+// A picture whose columns are given, the same in every row.
+TBitmap32 Columns(int h, const std::vector<Pixel>& columns) {
+  TBitmap32 b(static_cast<int>(columns.size()), h);
+  for (int y = 0; y < h; ++y)
+    for (int x = 0; x < b.Width(); ++x) b.At(x, y) = columns[static_cast<std::size_t>(x)];
+  return b;
+}
+
+// (Pictures without an interior pixel keep their inverted colour: see the tiny sizes below.)
+TEST(Picsobel, FlatPictureBecomesWhiteBordersIncluded) {
+  for (auto [w, h] : {std::pair{3, 3}, {5, 4}, {17, 9}, {3, 40}, {40, 3}})
+    EXPECT_TRUE(
+        SameColours(Sobel(TBitmap32(w, h, Rgb(90, 140, 30))), TBitmap32(w, h, Rgb(255, 255, 255))))
+        << w << "x" << h;
+}
+
+TEST(Picsobel, BrightLeftDarkRightGivesATwoPixelStroke) {
+  const Pixel white = Rgb(255, 255, 255), black = Rgb(0, 0, 0);
+  std::vector<Pixel> in(10, black), out(10, white);
+  std::fill(in.begin(), in.begin() + 5, white);
+  out[4] = out[5] = black;  // the last white and the first black column
+  EXPECT_TRUE(SameColours(Sobel(Columns(6, in)), Columns(6, out)));
+  // Mirrored: one stroke, on the first white column, from the line kernel alone.
+  std::reverse(in.begin(), in.end());
+  out.assign(10, white);
+  out[5] = black;
+  EXPECT_TRUE(SameColours(Sobel(Columns(6, in)), Columns(6, out)));
+}
+
+TEST(Picsobel, ResponseGrowsWithTheStepAndChannelsStayApart) {
+  // A step of 40 in red only, bright on the left: 3 * 40 from the gradient kernel on both sides
+  // of the step (the line kernel gives 80 on the bright side, less than 120).
+  std::vector<Pixel> in(8, Rgb(0, 77, 200)), out(8, Rgb(255, 255, 255));
+  std::fill(in.begin(), in.begin() + 4, Rgb(40, 77, 200));
+  out[3] = out[4] = Rgb(255 - 120, 255, 255);
+  EXPECT_TRUE(SameColours(Sobel(Columns(5, in)), Columns(5, out)));
+}
+
+TEST(Picsobel, BrightHorizontalLineBecomesADarkLine) {
+  TBitmap32 in(9, 7, Rgb(0, 0, 0));
+  for (int x = 0; x < 9; ++x) in.At(x, 3) = Rgb(255, 255, 255);
+  TBitmap32 out(9, 7, Rgb(255, 255, 255));
+  for (int x = 0; x < 9; ++x) out.At(x, 3) = Rgb(0, 0, 0);
+  EXPECT_TRUE(SameColours(Sobel(in), out));
+}
+
+TBitmap32 RandomPicture(int w, int h, unsigned seed) {
+  std::mt19937 rng(seed);
+  TBitmap32 b(w, h);
+  for (int y = 0; y < h; ++y)
+    for (int x = 0; x < w; ++x) {
+      const std::uint32_t v = rng();
+      b.At(x, y) = Pixel{static_cast<std::uint8_t>(v), static_cast<std::uint8_t>(v >> 8),
+                         static_cast<std::uint8_t>(v >> 16), static_cast<std::uint8_t>(v >> 24)};
+    }
+  return b;
+}
+
+TEST(Picsobel, TwoHighOrTwoWideRepeatsTheSecondLineInverted) {
+  const TBitmap32 wide = RandomPicture(6, 2, 1);
+  TBitmap32 expected(6, 2);
+  for (int x = 0; x < 6; ++x) expected.At(x, 0) = expected.At(x, 1) = Inverted(wide.At(x, 1));
+  EXPECT_TRUE(SameColours(Sobel(wide), expected));
+
+  const TBitmap32 tall = RandomPicture(2, 5, 2);
+  expected = TBitmap32(2, 5);
+  for (int y = 0; y < 5; ++y) {
+    // Inner rows take their own pixel 1; the top and bottom rows then repeat rows 1 and 3.
+    const int from = std::clamp(y, 1, 3);
+    expected.At(0, y) = expected.At(1, y) = Inverted(tall.At(1, from));
+  }
+  EXPECT_TRUE(SameColours(Sobel(tall), expected));
+
+  const TBitmap32 square = RandomPicture(2, 2, 3);
+  expected = TBitmap32(2, 2);
+  for (int x = 0; x < 2; ++x) expected.At(x, 0) = expected.At(x, 1) = Inverted(square.At(x, 1));
+  EXPECT_TRUE(SameColours(Sobel(square), expected));
+}
+
+TEST(Picsobel, ThreeByThreeBordersRepeatTheOneInteriorPixel) {
+  TBitmap32 in(3, 3, Rgb(10, 20, 30));
+  in.At(1, 1) = Rgb(50, 20, 0);
+  in.At(0, 1) = Rgb(40, 30, 30);
+  // Red: line kernel 6 * 50 - 6 * 10 = 240, gradient 40 - 10 = 30: 255 - 240 = 15.
+  // Green: 120 - 120 = 0 and 30 - 20 = 10: 245. Blue: 0 - 180 < 0 and 30 - 30 = 0: 255.
+  EXPECT_TRUE(SameColours(Sobel(in), TBitmap32(3, 3, Rgb(15, 245, 255))));
+}
+
+// Too small for a neighbour on one side: what there is repeats, inverted. A single column
+// still has its top and bottom rows repeat rows 1 and H - 2; a single row has no rows to take.
+TEST(Picsobel, SingleLinesRepeatWhatThereIsAndEmptyStaysEmpty) {
+  for (auto [w, h] : {std::pair{1, 1}, {1, 2}, {1, 3}, {1, 6}, {5, 1}, {2, 1}}) {
+    const TBitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w * 10 + h));
+    TBitmap32 expected = in;
+    if (h >= 2) {
+      expected.At(0, 0) = in.At(0, 1);
+      expected.At(0, h - 1) = expected.At(0, h - 2);
+    }
+    for (int y = 0; y < h; ++y)
+      for (int x = 0; x < w; ++x) expected.At(x, y) = Inverted(expected.At(x, y));
+    EXPECT_TRUE(SameColours(Sobel(in), expected)) << w << "x" << h;
+  }
+  EXPECT_TRUE(Sobel(TBitmap32()).Empty());
+}
+
+// The library works row by row, in bands on several threads and on all channels at once; the
+// reference goes pixel by pixel and channel by channel. Every byte must agree, alpha included.
+TEST(Picsobel, MatchesTheStepByStepReference) {
+  unsigned seed = 10;
+  for (auto [w, h] :
+       {std::pair{3, 3}, {4, 3}, {3, 4}, {17, 5}, {31, 29}, {101, 57}, {257, 130}, {733, 511}}) {
+    const TBitmap32 in = RandomPicture(w, h, ++seed);
+    EXPECT_EQ(Sobel(in), ReferencePicsobel(in)) << w << "x" << h;
+  }
+  // Smooth content as well, where the clamps rarely cut in.
+  TBitmap32 smooth(301, 203);
+  for (int y = 0; y < smooth.Height(); ++y)
+    for (int x = 0; x < smooth.Width(); ++x)
+      smooth.At(x, y) = Rgb(static_cast<std::uint8_t>(x * 3 / 4 + y / 3),
+                            static_cast<std::uint8_t>((x * y) % 251),
+                            static_cast<std::uint8_t>(128 + (x % 7) - (y % 5)), 255);
+  EXPECT_EQ(Sobel(smooth), ReferencePicsobel(smooth));
+}
+
+}  // namespace
+}  // namespace quillane

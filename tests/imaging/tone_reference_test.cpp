@@ -1,0 +1,199 @@
+// The colour model, the gray value and the tone passes take fast paths (integer arithmetic,
+// tables, threads). These tests hold the plain formulas and compare every input that exists,
+// or large random pictures where the input is a whole picture.
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <cstdlib>
+#include <random>
+
+#include "imaging/numeric.h"
+#include "imaging/tone.h"
+
+namespace quillane {
+namespace {
+
+Hsl PlainRgbToHsl(int red, int green, int blue) {
+  const double r = red / 255.0, g = green / 255.0, b = blue / 255.0;
+  const double mx = std::max(r, std::max(g, b)), mn = std::min(r, std::min(g, b));
+  const double l = (mx + mn) / 2;
+  double h = 0, s = 0;
+  if (mx != mn) {
+    const double d = mx - mn;
+    s = l < 0.5 ? d / (mx + mn) : d / (2 - mx - mn);
+    if (r == mx)
+      h = (g - b) / d;
+    else if (g == mx)
+      h = 2 + (b - r) / d;
+    else
+      h = 4 + (r - g) / d;
+    h = h / 6;
+    if (h < 0) h = h + 1;
+  }
+  Hsl out{Round(static_cast<Extended>(h) * 360), Round(static_cast<Extended>(s) * 100),
+          Round(static_cast<Extended>(l) * 100)};
+  if (out.h == 360) out.h = 0;
+  return out;
+}
+
+Rgb PlainHslToRgb(int h, int s, int l) {
+  if (h < 0 || h > 359 || s < 0 || s > 100 || l < 0 || l > 100) return Rgb{};
+  int c[3];
+  const auto up = [](int n) { return Round(static_cast<Extended>(n) * 4.25L); };
+  const auto down = [](int n) { return Round(255 - static_cast<Extended>(n) * 4.25L); };
+  if (h <= 60) {
+    c[0] = 255, c[1] = up(h), c[2] = 0;
+  } else if (h <= 120) {
+    c[0] = down(h - 60), c[1] = 255, c[2] = 0;
+  } else if (h <= 180) {
+    c[0] = 0, c[1] = 255, c[2] = up(h - 120);
+  } else if (h <= 240) {
+    c[0] = 0, c[1] = down(h - 180), c[2] = 255;
+  } else if (h <= 300) {
+    c[0] = up(h - 240), c[1] = 0, c[2] = 255;
+  } else {
+    c[0] = 255, c[1] = 0, c[2] = down(h - 300);
+  }
+  const double f = std::abs(s - 100) / 100.0;
+  for (int& x : c) x = Round(x - static_cast<Extended>(x - 128) * f);
+  const double t = (l - 50) / 50.0;
+  if (t > 0)
+    for (int& x : c) x = Round(x + static_cast<Extended>(255 - x) * t);
+  else if (t < 0)
+    for (int& x : c) x = Round(x + static_cast<Extended>(x) * t);
+  return Rgb{c[0], c[1], c[2]};
+}
+
+TEST(ConvertToGray, WeightsAndAlpha) {
+  TBitmap32 b(4, 1);
+  b.At(0, 0) = Pixel{30, 20, 10, 0};  // R 10, G 20, B 30: Round(18.1)
+  b.At(1, 0) = Pixel{255, 255, 255, 7};
+  b.At(2, 0) = Pixel{0, 0, 0, 255};
+  b.At(3, 0) = Pixel{0, 0, 5, 1};  // Round(1.5) = 2
+  ConvertToGray(b);
+  EXPECT_EQ(b.At(0, 0), (Pixel{18, 18, 18, 255}));
+  EXPECT_EQ(b.At(1, 0), (Pixel{255, 255, 255, 255}));
+  EXPECT_EQ(b.At(2, 0), (Pixel{0, 0, 0, 255}));
+  EXPECT_EQ(b.At(3, 0), (Pixel{2, 2, 2, 255}));
+  TBitmap32 empty;
+  ConvertToGray(empty);
+  EXPECT_TRUE(empty.Empty());
+}
+
+// One 256 by 256 picture per red level covers every colour there is. The exhaustive checks
+// are split by red level into shards, so that they can run side by side.
+TBitmap32 AllGreenBlue(int red) {
+  TBitmap32 b(256, 256);
+  for (int g = 0; g < 256; ++g)
+    for (int bl = 0; bl < 256; ++bl)
+      b.At(bl, g) = Pixel{static_cast<std::uint8_t>(bl), static_cast<std::uint8_t>(g),
+                          static_cast<std::uint8_t>(red), 3};
+  return b;
+}
+
+class EveryColour : public ::testing::TestWithParam<int> {
+ protected:
+  static constexpr int kReds = 32;
+  int FirstRed() const { return GetParam(); }
+  int EndRed() const { return GetParam() + kReds; }
+};
+INSTANTIATE_TEST_SUITE_P(RedLevels, EveryColour, ::testing::Range(0, 256, 32));
+
+TEST_P(EveryColour, GrayAndLightingMatchTheExtendedPrecisionGrayValue) {
+  for (int r = FirstRed(); r < EndRed(); ++r) {
+    const TBitmap32 in = AllGreenBlue(r);
+    TBitmap32 gray = in;
+    ConvertToGray(gray);
+    const TBitmap32 dark = PencilLightingPass(in, 100);
+    const TBitmap32 light = PencilLightingPass(in, 129);
+    for (int g = 0; g < 256; ++g)
+      for (int bl = 0; bl < 256; ++bl) {
+        const int v = GrayValue(r, g, bl);
+        const auto level = [](int y) {
+          return Pixel{static_cast<std::uint8_t>(y), static_cast<std::uint8_t>(y),
+                       static_cast<std::uint8_t>(y), 255};
+        };
+        ASSERT_EQ(gray.At(bl, g), level(v)) << r << "," << g << "," << bl;
+        ASSERT_EQ(dark.At(bl, g), level(ClampByte(v - 56))) << r << "," << g << "," << bl;
+        ASSERT_EQ(light.At(bl, g), level(ClampByte(v + 2))) << r << "," << g << "," << bl;
+      }
+  }
+}
+
+TEST_P(EveryColour, RgbToHslMatchesThePlainConversion) {
+  for (int r = FirstRed(); r < EndRed(); ++r)
+    for (int g = 0; g < 256; ++g)
+      for (int b = 0; b < 256; ++b)
+        ASSERT_EQ(RgbToHsl(r, g, b), PlainRgbToHsl(r, g, b)) << r << "," << g << "," << b;
+}
+
+TEST(PencilLightingPass, AllPositionsAtTheExtremes) {
+  TBitmap32 in(256, 3);
+  for (int x = 0; x < 256; ++x) {
+    const auto v = static_cast<std::uint8_t>(x);
+    in.At(x, 0) = Pixel{v, v, v, 0};
+    in.At(x, 1) = Pixel{0, 0, v, 0};
+    in.At(x, 2) = Pixel{v, static_cast<std::uint8_t>(255 - x), 0, 0};
+  }
+  for (int v = 0; v < 256; ++v) {
+    const TBitmap32 out = PencilLightingPass(in, v);
+    for (int y = 0; y < 3; ++y)
+      for (int x = 0; x < 256; ++x) {
+        const Pixel p = in.At(x, y);
+        const auto e =
+            static_cast<std::uint8_t>(ClampByte(GrayValue(p.r, p.g, p.b) + 2 * (v - 128)));
+        ASSERT_EQ(out.At(x, y), (Pixel{e, e, e, 255})) << x << "," << y << " v=" << v;
+      }
+  }
+}
+
+class EveryHsl : public ::testing::TestWithParam<int> {};
+INSTANTIATE_TEST_SUITE_P(HueRanges, EveryHsl, ::testing::Values(-2, 90, 180, 270));
+
+TEST_P(EveryHsl, HslToRgbMatchesThePlainConversion) {
+  const int first = GetParam(), end = first == 270 ? 362 : first + (first < 0 ? 92 : 90);
+  for (int h = first; h < end; ++h)
+    for (int s = -2; s <= 102; ++s)
+      for (int l = -2; l <= 102; ++l)
+        ASSERT_EQ(HslToRgb(h, s, l), PlainHslToRgb(h, s, l)) << h << "," << s << "," << l;
+}
+
+TBitmap32 RandomPicture(int w, int h, unsigned seed, bool grayish) {
+  std::mt19937 rng(seed);
+  TBitmap32 b(w, h);
+  for (int y = 0; y < h; ++y)
+    for (int x = 0; x < w; ++x) {
+      const std::uint32_t v = rng();
+      Pixel p{static_cast<std::uint8_t>(v), static_cast<std::uint8_t>(v >> 8),
+              static_cast<std::uint8_t>(v >> 16), static_cast<std::uint8_t>(v >> 24)};
+      if (grayish && (v >> 30) != 0) p.g = p.r = p.b;  // mostly gray, some colour
+      b.At(x, y) = p;
+    }
+  return b;
+}
+
+TEST(PencilContrastPass, MatchesThePlainChainOnColourAndGrayPictures) {
+  unsigned seed = 0;
+  for (auto [w, h] : {std::pair{1, 1}, {7, 3}, {320, 240}})
+    for (bool grayish : {false, true}) {
+      const TBitmap32 in = RandomPicture(w, h, ++seed, grayish);
+      for (int c : {0, 10, 44, 45, 46, 89}) {
+        const TBitmap32 out = PencilContrastPass(in, c);
+        ASSERT_EQ(out.Width(), w);
+        ASSERT_EQ(out.Height(), h);
+        for (int y = 0; y < h; ++y)
+          for (int x = 0; x < w; ++x) {
+            const Pixel p = in.At(x, y);
+            const Hsl hsl = PlainRgbToHsl(p.r, p.g, p.b);
+            const Rgb e = PlainHslToRgb(hsl.h, hsl.s, LightnessContrast(hsl.l, c));
+            ASSERT_EQ(out.At(x, y),
+                      (Pixel{static_cast<std::uint8_t>(e.b), static_cast<std::uint8_t>(e.g),
+                             static_cast<std::uint8_t>(e.r), 255}))
+                << w << "x" << h << " c=" << c << " at " << x << "," << y;
+          }
+      }
+    }
+}
+
+}  // namespace
+}  // namespace quillane
