@@ -30,6 +30,8 @@ struct ErrorManager {
   jpeg_error_mgr pub;
   std::jmp_buf jump;
   char message[JMSG_LENGTH_MAX + 64];
+  bool headerRead;  // past jpeg_read_header
+  bool dataEnded;   // the source ran dry and libjpeg went on with a made-up end marker
 };
 
 [[noreturn]] void Fail(j_common_ptr cinfo, const char* text) {
@@ -45,10 +47,17 @@ struct ErrorManager {
 }
 
 // Warnings about damaged entropy data are tolerated (the damaged blocks decode as gray, as
-// every viewer shows them), but running out of data means the picture is not all there.
+// every viewer shows them), but a picture whose data runs out is not all there. The end of the
+// data alone is not enough to tell: libjpeg also reaches it looking for the end marker after
+// the last scan, which some writers leave out. It is the entropy decoder then finding no more
+// bits that shows real loss.
 void EmitMessage(j_common_ptr cinfo, int level) {
   if (level >= 0) return;
+  auto* err = reinterpret_cast<ErrorManager*>(cinfo->err);
   if (cinfo->err->msg_code == JWRN_JPEG_EOF) {
+    if (!err->headerRead) Fail(cinfo, "The JPEG file is truncated (it ends inside its header)");
+    err->dataEnded = true;
+  } else if (cinfo->err->msg_code == JWRN_HIT_MARKER && err->dataEnded) {
     Fail(cinfo, "The JPEG file is truncated (premature end of data)");
   }
   cinfo->err->num_warnings++;
@@ -70,6 +79,8 @@ void InstallErrorManager(ErrorManager& err) {
   err.pub.emit_message = EmitMessage;
   err.pub.output_message = OutputMessage;
   err.message[0] = '\0';
+  err.headerRead = false;
+  err.dataEnded = false;
 }
 
 std::uint8_t MulDiv255(unsigned a, unsigned b) {
@@ -96,6 +107,7 @@ bool RunDecoder(Decompressor& d, Bytes data, std::int64_t maxPixels, TBitmap32& 
   d.cinfo.progress = &d.progress;
   jpeg_mem_src(&d.cinfo, data.data(), static_cast<unsigned long>(data.size()));
   jpeg_read_header(&d.cinfo, TRUE);
+  d.err.headerRead = true;
 
   const std::int64_t width = d.cinfo.image_width;
   const std::int64_t height = d.cinfo.image_height;

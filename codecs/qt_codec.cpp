@@ -4,6 +4,8 @@
 #include <QImage>
 #include <QImageReader>
 #include <QImageWriter>
+#include <algorithm>
+#include <cstdlib>
 #include <cstring>
 #include <limits>
 #include <mutex>
@@ -108,6 +110,57 @@ void CompositeOverWhite(TBitmap32& bitmap) {
   }
 }
 
+std::uint32_t Little(Bytes d, std::size_t at, int bytes) {
+  std::uint32_t v = 0;
+  for (int i = bytes - 1; i >= 0; --i) v = v << 8 | d[at + static_cast<std::size_t>(i)];
+  return v;
+}
+
+// Qt's bitmap reader takes a top-down bitmap's size as negative and quietly fills the rows a
+// truncated file lacks; both are settled here from the headers.
+void CheckBitmapHeaders(Bytes data, std::int64_t maxPixels) {
+  if (data.size() < 26 || data[0] != 'B' || data[1] != 'M') {
+    throw PictureFileError("The file is not a valid bitmap picture");
+  }
+  const std::uint32_t bitsOffset = Little(data, 10, 4);
+  const std::uint32_t infoSize = Little(data, 14, 4);
+  std::int64_t width, height;
+  std::uint32_t bitCount, compression = 0;
+  if (infoSize == 12) {  // OS/2 core header
+    width = Little(data, 18, 2);
+    height = Little(data, 20, 2);
+    bitCount = Little(data, 24, 2);
+  } else {
+    if (infoSize < 16 || data.size() < 34) {
+      throw PictureFileError("The file is not a valid bitmap picture");
+    }
+    width = static_cast<std::int32_t>(Little(data, 18, 4));
+    height = static_cast<std::int32_t>(Little(data, 22, 4));
+    bitCount = Little(data, 28, 2);
+    compression = Little(data, 30, 4);
+  }
+  if (height < 0) height = -height;  // top-down
+  CheckPictureSize(width, height, maxPixels, "bitmap");
+  // Uncompressed rows must all be there (the padding of the very last row may be missing).
+  constexpr std::uint32_t kRgb = 0, kBitFields = 3, kAlphaBitFields = 6;
+  if ((compression == kRgb || compression == kBitFields || compression == kAlphaBitFields) &&
+      bitCount > 0 && bitCount <= 32) {
+    const std::uint64_t rowBits = static_cast<std::uint64_t>(width) * bitCount;
+    const std::uint64_t stride = (rowBits + 31) / 32 * 4;
+    const std::uint64_t start = std::max<std::uint64_t>(bitsOffset, 14 + std::uint64_t{infoSize});
+    const std::uint64_t needed =
+        start + stride * static_cast<std::uint64_t>(height - 1) + (rowBits + 7) / 8;
+    if (data.size() < needed) throw PictureFileError("The bitmap file is truncated");
+  }
+}
+
+// A GIF is rendered on its logical screen, whatever the size of its first frame.
+void CheckGifScreen(Bytes data, std::int64_t maxPixels) {
+  if (data.size() < 10) throw PictureFileError("The file is not a valid GIF picture");
+  const std::int64_t width = Little(data, 6, 2), height = Little(data, 8, 2);
+  if (width > 0 && height > 0) CheckPictureSize(width, height, maxPixels, "GIF");
+}
+
 }  // namespace
 
 TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
@@ -127,6 +180,8 @@ TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
   reader.setAutoDetectImageFormat(false);
   reader.setDecideFormatFromContent(false);
   reader.setAutoTransform(false);
+  if (format == QtFormat::kBitmap) CheckBitmapHeaders(data, maxPixels);
+  if (format == QtFormat::kGif) CheckGifScreen(data, maxPixels);
   if (!reader.canRead()) {
     throw PictureFileError(std::string("The file is not a valid ") + family + " picture");
   }
@@ -137,10 +192,10 @@ TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
     }
   }
   const QSize size = reader.size();
-  if (!size.isValid()) {
+  if (size.width() <= 0 || size.height() == 0) {
     throw PictureFileError(std::string("The ") + family + " picture has no valid size");
   }
-  CheckPictureSize(size.width(), size.height(), maxPixels, family);
+  CheckPictureSize(size.width(), std::abs(std::int64_t{size.height()}), maxPixels, family);
 
   QImage image;
   if (!reader.read(&image) || image.isNull()) {

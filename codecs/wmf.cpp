@@ -117,6 +117,21 @@ TBitmap32 DecodeWindowsMetafile(Bytes data, std::int64_t maxPixels) {
     throw PictureFileError(playback.timedOut ? "The metafile takes too long to read"
                                              : "The metafile is damaged");
   }
+  // The player works in points. A placeable file's frame is its bounding box, with the box's
+  // top-left corner as the window origin the file's records set; other files are as large as
+  // what they draw.
+  if (header == kPlaceableSize) {
+    const auto frame = [&data](std::size_t at) {
+      return static_cast<std::int16_t>(ReadWord(data, at));
+    };
+    const int unitsPerInch = ReadWord(data, 14);
+    if (unitsPerInch == 0) throw PictureFileError("The metafile has no units per inch");
+    const double toPoints = 72.0 / unitsPerInch;
+    bounds.TL.x = 0;
+    bounds.TL.y = 0;
+    bounds.BR.x = static_cast<float>((frame(10) - frame(6)) * toPoints);
+    bounds.BR.y = static_cast<float>((frame(12) - frame(8)) * toPoints);
+  }
   unsigned int width = 0, height = 0;
   if (wmf_display_size(api.get(), &width, &height, kMetafileDotsPerInch, kMetafileDotsPerInch) !=
       wmf_E_None) {

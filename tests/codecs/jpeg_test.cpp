@@ -1,0 +1,257 @@
+// JPEG decoding of every kind of file libjpeg can write, and refusal of broken ones.
+#include <cstddef>
+#include <cstdio>
+// clang-format off
+#include <jpeglib.h>
+// clang-format on
+
+#include <cstdlib>
+
+#include "codecs/picture_file.h"
+#include "tests/codecs/test_support.h"
+
+namespace quillane::testing {
+namespace {
+
+using codecs::DecodeJpeg;
+
+struct JpegOptions {
+  J_COLOR_SPACE input = JCS_RGB;  // JCS_RGB, JCS_GRAYSCALE or JCS_CMYK
+  J_COLOR_SPACE stored = JCS_YCbCr;
+  bool progressive = false;
+  int lumaH = 2, lumaV = 2;  // sampling factors of the first component
+  int restartRows = 0;
+  int quality = 95;
+};
+
+// Encodes width x height samples given per pixel by sample(x, y, channel).
+template <typename Sample>
+std::vector<std::uint8_t> WriteJpeg(int width, int height, const JpegOptions& options,
+                                    Sample sample) {
+  jpeg_compress_struct cinfo{};
+  jpeg_error_mgr err{};
+  cinfo.err = jpeg_std_error(&err);
+  jpeg_create_compress(&cinfo);
+  unsigned char* buffer = nullptr;
+  unsigned long size = 0;
+  jpeg_mem_dest(&cinfo, &buffer, &size);
+  cinfo.image_width = width;
+  cinfo.image_height = height;
+  cinfo.in_color_space = options.input;
+  cinfo.input_components = options.input == JCS_GRAYSCALE ? 1 : options.input == JCS_CMYK ? 4 : 3;
+  jpeg_set_defaults(&cinfo);
+  jpeg_set_colorspace(&cinfo, options.stored);
+  jpeg_set_quality(&cinfo, options.quality, TRUE);
+  if (cinfo.num_components > 1) {
+    cinfo.comp_info[0].h_samp_factor = options.lumaH;
+    cinfo.comp_info[0].v_samp_factor = options.lumaV;
+    for (int c = 1; c < cinfo.num_components; ++c) {
+      cinfo.comp_info[c].h_samp_factor = c == 3 ? options.lumaH : 1;
+      cinfo.comp_info[c].v_samp_factor = c == 3 ? options.lumaV : 1;
+    }
+  }
+  cinfo.restart_in_rows = options.restartRows;
+  if (options.progressive) jpeg_simple_progression(&cinfo);
+  jpeg_start_compress(&cinfo, TRUE);
+  std::vector<JSAMPLE> row(static_cast<std::size_t>(width * cinfo.input_components));
+  while (cinfo.next_scanline < cinfo.image_height) {
+    const int y = static_cast<int>(cinfo.next_scanline);
+    for (int x = 0; x < width; ++x) {
+      for (int c = 0; c < cinfo.input_components; ++c) {
+        row[static_cast<std::size_t>(x * cinfo.input_components + c)] =
+            static_cast<JSAMPLE>(sample(x, y, c));
+      }
+    }
+    JSAMPROW rows[1] = {row.data()};
+    jpeg_write_scanlines(&cinfo, rows, 1);
+  }
+  jpeg_finish_compress(&cinfo);
+  std::vector<std::uint8_t> bytes(buffer, buffer + size);
+  jpeg_destroy_compress(&cinfo);
+  std::free(buffer);
+  return bytes;
+}
+
+// Four flat quadrants: red, green, blue, white (left to right, top to bottom).
+Pixel Quadrant(int x, int y, int width, int height) {
+  const bool right = x >= width / 2, bottom = y >= height / 2;
+  if (!bottom) return right ? kGreen : kRed;
+  return right ? kWhite : kBlue;
+}
+
+int RgbQuadrant(int x, int y, int c, int w, int h) {
+  const Pixel p = Quadrant(x, y, w, h);
+  return c == 0 ? p.r : c == 1 ? p.g : p.b;
+}
+
+// Checks the middle of each quadrant, away from the blurred edges.
+void ExpectQuadrants(const TBitmap32& picture, int tolerance) {
+  const int w = picture.Width(), h = picture.Height();
+  for (const auto& [x, y] :
+       {std::pair{w / 4, h / 4}, {3 * w / 4, h / 4}, {w / 4, 3 * h / 4}, {3 * w / 4, 3 * h / 4}}) {
+    const Pixel want = Quadrant(x, y, w, h), got = picture.At(x, y);
+    EXPECT_NEAR(got.r, want.r, tolerance) << x << "," << y;
+    EXPECT_NEAR(got.g, want.g, tolerance) << x << "," << y;
+    EXPECT_NEAR(got.b, want.b, tolerance) << x << "," << y;
+    EXPECT_EQ(got.a, 255);
+  }
+}
+
+TEST(JpegDecoder, ReadsBaselineProgressiveSubsampledAndRestartFiles) {
+  constexpr int w = 64, h = 48;
+  const auto rgb = [](int x, int y, int c) { return RgbQuadrant(x, y, c, w, h); };
+  std::vector<JpegOptions> kinds;
+  kinds.push_back({});                        // baseline 4:2:0
+  kinds.push_back({.progressive = true});     // progressive
+  kinds.push_back({.lumaH = 1, .lumaV = 1});  // 4:4:4
+  kinds.push_back({.lumaH = 2, .lumaV = 1});  // 4:2:2
+  kinds.push_back({.lumaH = 1, .lumaV = 2});  // 4:4:0
+  kinds.push_back({.restartRows = 1});        // restart markers every MCU row
+  kinds.push_back({.progressive = true, .lumaH = 1, .lumaV = 2, .restartRows = 2});
+  kinds.push_back({.stored = JCS_RGB, .lumaH = 1, .lumaV = 1});  // RGB without conversion
+  for (const JpegOptions& options : kinds) {
+    const TBitmap32 picture = DecodeJpeg(WriteJpeg(w, h, options, rgb));
+    ASSERT_EQ(picture.Width(), w);
+    ASSERT_EQ(picture.Height(), h);
+    ExpectQuadrants(picture, 6);
+  }
+}
+
+TEST(JpegDecoder, GrayscaleGivesEqualChannels) {
+  const auto ramp = [](int x, int, int) { return x * 4; };
+  const TBitmap32 picture =
+      DecodeJpeg(WriteJpeg(64, 8, {.input = JCS_GRAYSCALE, .stored = JCS_GRAYSCALE}, ramp));
+  for (int x = 0; x < 64; ++x) {
+    const Pixel p = picture.At(x, 3);
+    EXPECT_EQ(p.r, p.g);
+    EXPECT_EQ(p.g, p.b);
+    EXPECT_NEAR(p.r, x * 4, 3);
+    EXPECT_EQ(p.a, 255);
+  }
+}
+
+// Adobe's CMYK files store inverted inks (255 = no ink); they must not come out as a negative.
+TEST(JpegDecoder, AdobeCmykAndYcckGiveTrueColours) {
+  constexpr int w = 32, h = 32;
+  const auto inks = [](int x, int y, int c) {
+    const Pixel p = Quadrant(x, y, w, h);
+    // Plain inks for the quadrant colour with no black, stored inverted.
+    const int ink[4] = {255 - p.r, 255 - p.g, 255 - p.b, 0};
+    return 255 - ink[c];
+  };
+  for (J_COLOR_SPACE stored : {JCS_CMYK, JCS_YCCK}) {
+    const std::vector<std::uint8_t> file =
+        WriteJpeg(w, h, {.input = JCS_CMYK, .stored = stored, .lumaH = 1, .lumaV = 1}, inks);
+    ExpectQuadrants(DecodeJpeg(file), 8);
+  }
+  // Black ink alone darkens every colour.
+  const auto halfBlack = [](int, int, int c) { return c == 3 ? 255 - 128 : 255; };
+  const Pixel gray =
+      DecodeJpeg(WriteJpeg(16, 16, {.input = JCS_CMYK, .stored = JCS_CMYK, .lumaH = 1, .lumaV = 1},
+                           halfBlack))
+          .At(8, 8);
+  EXPECT_NEAR(gray.r, 127, 3);
+  EXPECT_NEAR(gray.g, 127, 3);
+  EXPECT_NEAR(gray.b, 127, 3);
+}
+
+TEST(JpegDecoder, TruncatedAndForeignDataAreRefused) {
+  const auto rgb = [](int x, int y, int c) { return (x * 7 + y * 3 + c * 50) & 255; };
+  const std::vector<std::uint8_t> file = WriteJpeg(64, 64, {}, rgb);
+  for (std::size_t keep :
+       {std::size_t{0}, std::size_t{2}, std::size_t{100}, file.size() / 2, file.size() - 40}) {
+    const std::vector<std::uint8_t> cut(file.begin(), file.begin() + keep);
+    EXPECT_THROW(DecodeJpeg(cut), PictureFileError) << keep;
+  }
+  const std::vector<std::uint8_t> png = {0x89, 'P', 'N', 'G', 0x0D, 0x0A, 0x1A, 0x0A, 0, 0};
+  try {
+    DecodeJpeg(png);
+    FAIL();
+  } catch (const PictureFileError& error) {
+    EXPECT_NE(std::string(error.what()).find("Not a JPEG file"), std::string::npos) << error.what();
+  }
+  // A file missing only its end marker still holds the whole picture.
+  std::vector<std::uint8_t> noEnd(file.begin(), file.end() - 2);
+  EXPECT_EQ(DecodeJpeg(noEnd).Width(), 64);
+}
+
+// Finds the start-of-frame segment and rewrites the size it declares.
+std::vector<std::uint8_t> WithFrameSize(std::vector<std::uint8_t> file, unsigned width,
+                                        unsigned height) {
+  for (std::size_t i = 2; i + 9 < file.size(); ++i) {
+    if (file[i] == 0xFF && (file[i + 1] == 0xC0 || file[i + 1] == 0xC2)) {
+      file[i + 5] = static_cast<std::uint8_t>(height >> 8);
+      file[i + 6] = static_cast<std::uint8_t>(height);
+      file[i + 7] = static_cast<std::uint8_t>(width >> 8);
+      file[i + 8] = static_cast<std::uint8_t>(width);
+      return file;
+    }
+  }
+  ADD_FAILURE() << "no frame header";
+  return file;
+}
+
+TEST(JpegDecoder, RefusesHeadersBeyondTheLimitOrEmpty) {
+  const auto rgb = [](int, int, int) { return 100; };
+  const std::vector<std::uint8_t> file = WriteJpeg(16, 16, {}, rgb);
+  // 65000 x 65000 is 4.2 gigapixels: refused from the header, long before any decoding.
+  try {
+    DecodeJpeg(WithFrameSize(file, 65000, 65000));
+    FAIL();
+  } catch (const PictureFileError& error) {
+    EXPECT_NE(std::string(error.what()).find("65000 by 65000"), std::string::npos) << error.what();
+  }
+  EXPECT_THROW(DecodeJpeg(WithFrameSize(file, 0, 16)), PictureFileError);
+  EXPECT_THROW(DecodeJpeg(WithFrameSize(file, 16, 0)), PictureFileError);
+  // The limit is the one given: 16 x 16 is refused at 255 pixels, read at 256.
+  EXPECT_THROW(DecodeJpeg(file, 255), PictureFileError);
+  EXPECT_EQ(DecodeJpeg(file, 256).Width(), 16);
+}
+
+TEST(JpegDecoder, BitFlippedFilesNeverCrash) {
+  const auto rgb = [](int x, int y, int c) { return (x * 5 + y * 11 + c * 70) & 255; };
+  for (const JpegOptions& options : {JpegOptions{}, JpegOptions{.progressive = true}}) {
+    const std::vector<std::uint8_t> file = WriteJpeg(40, 24, options, rgb);
+    std::uint32_t random = 7;
+    for (int trial = 0; trial < 400; ++trial) {
+      std::vector<std::uint8_t> damaged = file;
+      for (int flips = 0; flips < 1 + trial % 4; ++flips) {
+        random = random * 1664525u + 1013904223u;
+        damaged[(random >> 8) % damaged.size()] ^= static_cast<std::uint8_t>(1u << (random & 7));
+      }
+      try {
+        const TBitmap32 picture = DecodeJpeg(damaged, 1 << 22);
+        EXPECT_GT(picture.Width(), 0);
+      } catch (const PictureFileError&) {
+      }
+    }
+  }
+}
+
+TEST(JpegEncoder, WritesBaselineColourQuality90With420Sampling) {
+  const TBitmap32 picture = PatternPicture(96, 64);
+  const std::vector<std::uint8_t> file = codecs::EncodeJpeg(picture, 90);
+  jpeg_decompress_struct cinfo{};
+  jpeg_error_mgr err{};
+  cinfo.err = jpeg_std_error(&err);
+  jpeg_create_decompress(&cinfo);
+  jpeg_mem_src(&cinfo, file.data(), file.size());
+  jpeg_read_header(&cinfo, TRUE);
+  EXPECT_FALSE(cinfo.progressive_mode);
+  EXPECT_EQ(cinfo.jpeg_color_space, JCS_YCbCr);
+  EXPECT_EQ(cinfo.num_components, 3);
+  EXPECT_EQ(cinfo.comp_info[0].h_samp_factor, 2);
+  EXPECT_EQ(cinfo.comp_info[0].v_samp_factor, 2);
+  // The quality-90 luminance table starts with Round(16 * 20 / 100) = 3.
+  ASSERT_NE(cinfo.quant_tbl_ptrs[0], nullptr);
+  EXPECT_EQ(cinfo.quant_tbl_ptrs[0]->quantval[0], 3);
+  jpeg_destroy_decompress(&cinfo);
+  // A baseline frame marker (SOF0) is present.
+  bool baseline = false;
+  for (std::size_t i = 0; i + 1 < file.size(); ++i)
+    baseline |= file[i] == 0xFF && file[i + 1] == 0xC0;
+  EXPECT_TRUE(baseline);
+}
+
+}  // namespace
+}  // namespace quillane::testing

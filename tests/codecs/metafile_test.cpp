@@ -1,0 +1,206 @@
+// Windows metafiles (played by libwmf) and enhanced metafiles (our own reader and writer).
+#include "tests/codecs/test_support.h"
+
+namespace quillane::testing {
+namespace {
+
+using codecs::DecodeMetafile;
+
+// A placeable metafile of 40 x 30 units at 96 units an inch, white, with a red rectangle
+// from (10, 5) to (30, 25) drawn with a null pen.
+std::vector<std::uint8_t> WmfWithRectangle() {
+  ByteWriter records;
+  std::uint32_t largest = 0;
+  const auto record = [&](unsigned function, std::vector<int> params) {
+    const auto words = static_cast<std::uint32_t>(3 + params.size());
+    largest = std::max(largest, words);
+    records.U32(words).U16(function);
+    for (int p : params) records.I16(p);
+  };
+  record(0x020B, {0, 0});             // SetWindowOrg (y, x)
+  record(0x020C, {30, 40});           // SetWindowExt (y, x)
+  record(0x02FC, {0, 0x00FF, 0, 0});  // CreateBrushIndirect: solid, red
+  record(0x012D, {0});                // SelectObject
+  record(0x02FA, {5, 0, 0, 0, 0});    // CreatePenIndirect: null pen
+  record(0x012D, {1});
+  record(0x041B, {25, 30, 5, 10});  // Rectangle (bottom, right, top, left)
+  record(0x0000, {});               // EOF
+  ByteWriter file;
+  const std::vector<int> placeable = {0, 0, 40, 30, 96};
+  ByteWriter head;
+  head.U32(0x9AC6CDD7).U16(0);
+  for (int v : placeable) head.I16(v);
+  head.U32(0);
+  std::uint16_t checksum = 0;
+  for (std::size_t i = 0; i < 20; i += 2) checksum ^= head.bytes[i] | head.bytes[i + 1] << 8;
+  head.U16(checksum);
+  file.Append(head.bytes);
+  file.U16(1).U16(9).U16(0x0300).U32(static_cast<std::uint32_t>(9 + records.Size() / 2));
+  file.U16(2).U32(largest).U16(0);
+  file.Append(records.bytes);
+  return file.bytes;
+}
+
+TEST(WindowsMetafile, PlaysShapesOnWhite) {
+  const TBitmap32 p = DecodeMetafile(WmfWithRectangle());
+  ASSERT_EQ(p.Width(), 40);
+  ASSERT_EQ(p.Height(), 30);
+  EXPECT_EQ(p.At(20, 15), kRed);
+  EXPECT_EQ(p.At(12, 7), kRed);
+  EXPECT_EQ(p.At(2, 2), kWhite);
+  EXPECT_EQ(p.At(36, 27), kWhite);
+}
+
+TEST(WindowsMetafile, RefusesDamagedAndHugeFiles) {
+  const std::vector<std::uint8_t> file = WmfWithRectangle();
+  // Cut inside the records: the record walk finds a record running past the end.
+  EXPECT_THROW(DecodeMetafile({file.begin(), file.begin() + 60}), PictureFileError);
+  EXPECT_THROW(DecodeMetafile({file.begin(), file.begin() + 30}), PictureFileError);
+  EXPECT_THROW(
+      DecodeMetafile(std::vector<std::uint8_t>{'n', 'o', 't', ' ', 'a', ' ', 'm', 'e', 't', 'a'}),
+      PictureFileError);
+  // 32767 units at 1 unit an inch is 3 million pixels a side.
+  std::vector<std::uint8_t> huge = file;
+  huge[10] = 0xFF;
+  huge[11] = 0x7F;
+  huge[12] = 0xFF;
+  huge[13] = 0x7F;
+  huge[14] = 1;
+  huge[15] = 0;
+  EXPECT_THROW(DecodeMetafile(huge), PictureFileError);
+}
+
+// An enhanced metafile for a 96 dpi reference device whose frame is width x height pixels,
+// with the given records between header and end.
+std::vector<std::uint8_t> Emf(int width, int height, const std::vector<std::uint8_t>& records) {
+  ByteWriter w;
+  w.U32(1).U32(108).I32(0).I32(0).I32(width - 1).I32(height - 1);
+  w.I32(0).I32(0).I32(width * 2540 / 96).I32(height * 2540 / 96);
+  w.U32(0x464D4520).U32(0x10000).U32(0).U32(0).U16(1).U16(0).U32(0).U32(0).U32(0);
+  w.I32(4800).I32(2400).I32(1270).I32(635).U32(0).U32(0).U32(0).I32(1270000).I32(635000);
+  w.Append(records);
+  w.U32(14).U32(20).U32(0).U32(16).U32(20);
+  w.PatchU32(48, static_cast<std::uint32_t>(w.Size()));
+  return w.bytes;
+}
+
+// A 2 x 2 bottom-up 24-bit bitmap: top row red, green; bottom row blue, white.
+std::vector<std::uint8_t> TwoByTwoDib() {
+  ByteWriter w;
+  w.Append(BmpInfoHeader(40, 2, 2, 24, 0, 16));
+  w.U8(255).U8(0).U8(0).U8(255).U8(255).U8(255).U16(0);
+  w.U8(0).U8(0).U8(255).U8(0).U8(255).U8(0).U16(0);
+  return w.bytes;
+}
+
+std::vector<std::uint8_t> StretchDiBits(int x, int y, int cx, int cy) {
+  const std::vector<std::uint8_t> dib = TwoByTwoDib();
+  ByteWriter w;
+  w.U32(81).U32(static_cast<std::uint32_t>(80 + dib.size())).I32(0).I32(0).I32(0).I32(0);
+  w.I32(x).I32(y).I32(0).I32(0).I32(2).I32(2).U32(80).U32(40).U32(120).U32(16).U32(0);
+  w.U32(0x00CC0020).I32(cx).I32(cy).Append(dib);
+  return w.bytes;
+}
+
+std::vector<std::uint8_t> BitBlt(int x, int y) {
+  const std::vector<std::uint8_t> dib = TwoByTwoDib();
+  ByteWriter w;
+  w.U32(76).U32(static_cast<std::uint32_t>(100 + dib.size())).I32(0).I32(0).I32(0).I32(0);
+  w.I32(x).I32(y).I32(2).I32(2).U32(0x00CC0020).I32(0).I32(0);
+  for (float f : {1.f, 0.f, 0.f, 1.f, 0.f, 0.f}) w.F32(f);
+  w.U32(0).U32(0).U32(100).U32(40).U32(140).U32(16).Append(dib);
+  return w.bytes;
+}
+
+void ExpectBlocks(const TBitmap32& p, int x0, int y0, int block) {
+  EXPECT_EQ(p.At(x0, y0), kRed);
+  EXPECT_EQ(p.At(x0 + block - 1, y0 + block - 1), kRed);
+  EXPECT_EQ(p.At(x0 + block, y0), kGreen);
+  EXPECT_EQ(p.At(x0, y0 + block), kBlue);
+  EXPECT_EQ(p.At(x0 + 2 * block - 1, y0 + 2 * block - 1), kWhite);
+}
+
+TEST(EnhancedMetafile, PlaysBitmapRecordsWithTheirPlacement) {
+  // Stretched to fill a 4 x 4 frame: each source pixel becomes a 2 x 2 block.
+  const TBitmap32 stretched = DecodeMetafile(Emf(4, 4, StretchDiBits(0, 0, 4, 4)));
+  ASSERT_EQ(stretched.Width(), 4);
+  ASSERT_EQ(stretched.Height(), 4);
+  ExpectBlocks(stretched, 0, 0, 2);
+
+  // The same through a world transform that doubles everything.
+  ByteWriter transformed;
+  transformed.U32(35).U32(32);
+  for (float f : {2.f, 0.f, 0.f, 2.f, 0.f, 0.f}) transformed.F32(f);
+  transformed.Append(StretchDiBits(0, 0, 2, 2));
+  ExpectBlocks(DecodeMetafile(Emf(4, 4, transformed.bytes)), 0, 0, 2);
+
+  // A blit at (3, 1) on a 6 x 4 frame; the rest stays white.
+  const TBitmap32 blit = DecodeMetafile(Emf(6, 4, BitBlt(3, 1)));
+  ASSERT_EQ(blit.Width(), 6);
+  ExpectBlocks(blit, 3, 1, 1);
+  EXPECT_EQ(blit.At(0, 0), kWhite);
+  EXPECT_EQ(blit.At(5, 3), kWhite);
+}
+
+TEST(EnhancedMetafile, WriterRoundTripsExactly) {
+  for (const auto& [w, h] : {std::pair{1, 1}, {3, 2}, {101, 57}, {640, 3}}) {
+    const TBitmap32 picture = PatternPicture(w, h);
+    codecs::MemorySink sink;
+    codecs::EncodeEnhancedMetafile(picture, sink);
+    ASSERT_EQ(sink.bytes().size() % 4, 0u);
+    const TBitmap32 back = DecodeMetafile(sink.bytes());
+    EXPECT_TRUE(SameColours(back, picture)) << w << "x" << h;
+  }
+}
+
+TEST(EnhancedMetafile, RefusesDamagedAndHostileFiles) {
+  codecs::MemorySink sink;
+  codecs::EncodeEnhancedMetafile(PatternPicture(20, 10), sink);
+  const std::vector<std::uint8_t>& file = sink.bytes();
+  // Cut inside the bitmap record.
+  EXPECT_THROW(DecodeMetafile({file.begin(), file.begin() + 300}), PictureFileError);
+  // A frame of 2 x 10^9 hundredths of a millimetre.
+  std::vector<std::uint8_t> huge = file;
+  for (std::size_t at : {32u, 36u}) {
+    huge[at] = 0;
+    huge[at + 1] = 0x94;
+    huge[at + 2] = 0x35;
+    huge[at + 3] = 0x77;
+  }
+  EXPECT_THROW(DecodeMetafile(huge), PictureFileError);
+  // A bitmap whose offsets point past its record.
+  std::vector<std::uint8_t> outside = file;
+  outside[108 + 56] = 0xF0;
+  outside[108 + 57] = 0xFF;
+  EXPECT_THROW(DecodeMetafile(outside), PictureFileError);
+  // A bitmap record that claims a width of 10^8.
+  std::vector<std::uint8_t> wide = file;
+  wide[108 + 80 + 4] = 0x00;
+  wide[108 + 80 + 5] = 0xE1;
+  wide[108 + 80 + 6] = 0xF5;
+  wide[108 + 80 + 7] = 0x05;
+  EXPECT_THROW(DecodeMetafile(wide), PictureFileError);
+}
+
+TEST(Metafiles, BitFlippedFilesNeverCrash) {
+  codecs::MemorySink sink;
+  codecs::EncodeEnhancedMetafile(PatternPicture(12, 9), sink);
+  for (const std::vector<std::uint8_t>& file :
+       {sink.bytes(), WmfWithRectangle(), Emf(6, 4, BitBlt(3, 1))}) {
+    std::uint32_t random = 99;
+    for (int trial = 0; trial < 300; ++trial) {
+      std::vector<std::uint8_t> damaged = file;
+      for (int flips = 0; flips < 1 + trial % 3; ++flips) {
+        random = random * 1664525u + 1013904223u;
+        damaged[(random >> 8) % damaged.size()] ^= static_cast<std::uint8_t>(1u << (random & 7));
+      }
+      try {
+        EXPECT_GT(DecodeMetafile(damaged, 1 << 22).Width(), 0);
+      } catch (const PictureFileError&) {
+      }
+    }
+  }
+}
+
+}  // namespace
+}  // namespace quillane::testing

@@ -1,0 +1,234 @@
+// The loader's choice by name, the writers' round trips and their behaviour on failure.
+#include "codecs/picture_file.h"
+
+#include <signal.h>
+#include <sys/resource.h>
+
+#include <QImage>
+#include <filesystem>
+
+#include "tests/codecs/test_support.h"
+
+namespace quillane::testing {
+namespace {
+
+using PictureFiles = TempFolder;
+
+TEST_F(PictureFiles, ChoosesTheDecoderByTheLastFourCharacters) {
+  const TBitmap32 picture = PatternPicture(20, 10);
+  SaveJpeg(picture, Path("photo.jpeg"));
+  std::filesystem::copy_file(Path("photo.jpeg"), Path("photo.JPEG"));
+  std::filesystem::copy_file(Path("photo.jpeg"), Path("photo.Jpg"));
+  std::filesystem::copy_file(Path("photo.jpeg"), Path("photo.jpe"));
+  for (const char* name : {"photo.jpeg", "photo.JPEG", "photo.Jpg"}) {
+    const auto loaded = LoadPictureFile(Path(name));
+    ASSERT_TRUE(loaded.has_value()) << name;
+    EXPECT_EQ(loaded->Width(), 20) << name;
+  }
+  // Known content under an unknown ending gives the empty picture, not "no file".
+  const auto jpe = LoadPictureFile(Path("photo.jpe"));
+  ASSERT_TRUE(jpe.has_value());
+  EXPECT_TRUE(jpe->Empty());
+  SavePng(picture, Path("picture.png"));
+  ASSERT_TRUE(LoadPictureFile(Path("picture.png")).has_value());
+  EXPECT_TRUE(LoadPictureFile(Path("picture.png"))->Empty());
+  // No file (or a folder) gives nothing at all.
+  EXPECT_FALSE(LoadPictureFile(Path("missing.jpg")).has_value());
+  std::filesystem::create_directory(Path("folder.bmp"));
+  EXPECT_FALSE(LoadPictureFile(Path("folder.bmp")).has_value());
+}
+
+TEST_F(PictureFiles, ContentUnderAWrongNameIsAnErrorNamingTheFile) {
+  SavePng(PatternPicture(8, 8), Path("fake.jpg"));
+  std::filesystem::copy_file(Path("fake.jpg"), Path("fake.bmp"));
+  std::filesystem::copy_file(Path("fake.jpg"), Path("fake.gif"));
+  std::filesystem::copy_file(Path("fake.jpg"), Path("fake.wmf"));
+  for (const char* name : {"fake.jpg", "fake.bmp", "fake.gif", "fake.wmf"}) {
+    try {
+      LoadPictureFile(Path(name));
+      ADD_FAILURE() << name;
+    } catch (const PictureFileError& error) {
+      EXPECT_NE(std::string(error.what()).find(Path(name)), std::string::npos) << error.what();
+    }
+  }
+}
+
+TEST_F(PictureFiles, UnreadableIconIsReportedThroughTheNoticeAndGivesEmpty) {
+  WriteBytes(Path("broken.ico"), {0, 0, 1, 0, 1, 0, 16, 16});
+  std::vector<std::pair<std::string, std::string>> notices;
+  const auto loaded =
+      LoadPictureFile(Path("broken.ico"), [&](const std::string& caption, const std::string& text) {
+        notices.emplace_back(caption, text);
+      });
+  ASSERT_TRUE(loaded.has_value());
+  EXPECT_TRUE(loaded->Empty());
+  ASSERT_EQ(notices.size(), 1u);
+  EXPECT_EQ(notices[0].first, "Exit");
+  const std::string prefix = "Input picture" + Path("broken.ico") + "Error.";
+  EXPECT_EQ(notices[0].second.substr(0, prefix.size()), prefix);
+  EXPECT_GT(notices[0].second.size(), prefix.size());
+  // Without a notice the icon still just gives the empty picture.
+  EXPECT_TRUE(LoadPictureFile(Path("broken.ico"))->Empty());
+}
+
+TEST_F(PictureFiles, Bitmap24RoundTripKeepsColoursAndGivesOpaqueAlpha) {
+  for (const auto& [w, h] : {std::pair{1, 1}, {3, 2}, {101, 57}}) {
+    const TBitmap32 picture = PatternPicture(w, h, 7);
+    SaveBitmap24(picture, Path("result.bmp"));
+    const std::vector<std::uint8_t> file = ReadBytes(Path("result.bmp"));
+    ASSERT_GE(file.size(), 54u);
+    EXPECT_EQ(file[28], 24);  // bits per pixel
+    const auto back = LoadPictureFile(Path("result.bmp"));
+    ASSERT_TRUE(back.has_value());
+    EXPECT_TRUE(SameColours(*back, picture));
+    EXPECT_EQ(back->At(0, 0).a, 255);
+  }
+}
+
+TEST_F(PictureFiles, MetafileRoundTripUnderBothNames) {
+  const TBitmap32 picture = PatternPicture(64, 33);
+  for (const char* name : {"saved.wmf", "saved.emf", "saved.WMF"}) {
+    SaveMetafile(picture, Path(name));
+    const auto back = LoadPictureFile(Path(name));
+    ASSERT_TRUE(back.has_value()) << name;
+    EXPECT_TRUE(SameColours(*back, picture)) << name;
+  }
+}
+
+TEST_F(PictureFiles, PngKeepsAlpha) {
+  TBitmap32 picture = PatternPicture(9, 4, 200);
+  picture.At(0, 0) = Pixel{10, 20, 30, 0};
+  picture.At(8, 3) = Pixel{40, 50, 60, 1};
+  SavePng(picture, Path("alpha.png"));
+  QImage back(QString::fromStdString(Path("alpha.png")));
+  ASSERT_FALSE(back.isNull());
+  back.convertTo(QImage::Format_ARGB32);
+  ASSERT_EQ(back.width(), 9);
+  for (int y = 0; y < 4; ++y) {
+    for (int x = 0; x < 9; ++x) {
+      const Pixel p = picture.At(x, y);
+      EXPECT_EQ(back.pixel(x, y), qRgba(p.r, p.g, p.b, p.a)) << x << "," << y;
+    }
+  }
+}
+
+TEST_F(PictureFiles, JpegQuality90RoundTripIsClose) {
+  // A smooth photo-like picture: diagonal gradients.
+  TBitmap32 picture(120, 80);
+  for (int y = 0; y < 80; ++y) {
+    for (int x = 0; x < 120; ++x) {
+      picture.At(x, y) = Pixel{static_cast<std::uint8_t>(x * 2), static_cast<std::uint8_t>(y * 3),
+                               static_cast<std::uint8_t>((x + y) * 255 / 200), 255};
+    }
+  }
+  SaveJpeg(picture, Path("result.jpg"));
+  const auto back = LoadPictureFile(Path("result.jpg"));
+  ASSERT_TRUE(back.has_value());
+  ASSERT_EQ(back->Width(), 120);
+  EXPECT_LE(MaxColourDifference(*back, picture), 8);
+  long total = 0;
+  for (int y = 0; y < 80; ++y) {
+    for (int x = 0; x < 120; ++x) total += std::abs(back->At(x, y).g - picture.At(x, y).g);
+  }
+  EXPECT_LT(total / (120 * 80), 2);
+}
+
+TEST(ReplaceExtension, ReplacesOnlyARealExtension) {
+  EXPECT_EQ(ReplaceExtension("result.bmp", ".jpg"), "result.jpg");
+  EXPECT_EQ(ReplaceExtension("result", ".jpg"), "result.jpg");
+  EXPECT_EQ(ReplaceExtension("dir.v2/result", ".jpg"), "dir.v2/result.jpg");
+  EXPECT_EQ(ReplaceExtension("/home/me/a.b.c", ".wmf"), "/home/me/a.b.wmf");
+  EXPECT_EQ(ReplaceExtension("C:\\pics.old\\shot", ".bmp"), "C:\\pics.old\\shot.bmp");
+  EXPECT_EQ(ReplaceExtension("D:name", ".jpg"), "D:name.jpg");
+  EXPECT_EQ(ReplaceExtension("photo.", ".jpg"), "photo.jpg");
+  EXPECT_EQ(ReplaceExtension("", ".jpg"), ".jpg");
+}
+
+TEST_F(PictureFiles, SaveIntoAMissingFolderFailsClearly) {
+  const std::string target = Path("no such folder/result.jpg");
+  try {
+    SaveJpeg(PatternPicture(4, 4), target);
+    FAIL();
+  } catch (const PictureFileError& error) {
+    const std::string text = error.what();
+    EXPECT_NE(text.find(target), std::string::npos) << text;
+    EXPECT_NE(text.find("does not exist"), std::string::npos) << text;
+  }
+  EXPECT_TRUE(Entries().empty());
+}
+
+TEST_F(PictureFiles, EmptyPictureIsNotSaved) {
+  WriteBytes(Path("keep.bmp"), {1, 2, 3});
+  EXPECT_THROW(SaveBitmap24(TBitmap32(), Path("keep.bmp")), PictureFileError);
+  EXPECT_THROW(SaveJpeg(TBitmap32(), Path("keep.bmp")), PictureFileError);
+  EXPECT_EQ(ReadBytes(Path("keep.bmp")), (std::vector<std::uint8_t>{1, 2, 3}));
+}
+
+// A file-size limit makes the write fail part way, as a full disk would: the old file must
+// keep its bytes and no temporary file may be left behind.
+TEST_F(PictureFiles, FailedWriteLeavesTheOldFileUntouched) {
+  const std::vector<std::uint8_t> old = {'o', 'l', 'd', ' ', 'f', 'i', 'l', 'e'};
+  const TBitmap32 picture = PatternPicture(300, 300);
+  struct sigaction ignore {
+  }, previous{};
+  ignore.sa_handler = SIG_IGN;
+  ASSERT_EQ(::sigaction(SIGXFSZ, &ignore, &previous), 0);
+  rlimit saved{};
+  ASSERT_EQ(::getrlimit(RLIMIT_FSIZE, &saved), 0);
+
+  const std::vector<std::pair<const char*, void (*)(const TBitmap32&, const std::string&)>>
+      writers = {{"out.bmp", [](const TBitmap32& p, const std::string& f) { SaveBitmap24(p, f); }},
+                 {"out.jpg", [](const TBitmap32& p, const std::string& f) { SaveJpeg(p, f); }},
+                 {"out.wmf", [](const TBitmap32& p, const std::string& f) { SaveMetafile(p, f); }},
+                 {"out.png", [](const TBitmap32& p, const std::string& f) { SavePng(p, f); }}};
+  for (const auto& [name, write] : writers) {
+    WriteBytes(Path(name), old);
+    rlimit small = saved;
+    small.rlim_cur = 4096;
+    ASSERT_EQ(::setrlimit(RLIMIT_FSIZE, &small), 0);
+    std::string message;
+    try {
+      write(picture, Path(name));
+    } catch (const PictureFileError& error) {
+      message = error.what();
+    }
+    ::setrlimit(RLIMIT_FSIZE, &saved);
+    EXPECT_NE(message.find("Cannot save \"" + Path(name) + "\""), std::string::npos)
+        << name << ": " << message;
+    EXPECT_EQ(ReadBytes(Path(name)), old) << name;
+  }
+  ::sigaction(SIGXFSZ, &previous, nullptr);
+  EXPECT_EQ(Entries(), (std::vector<std::string>{"out.bmp", "out.jpg", "out.png", "out.wmf"}));
+
+  // And with room to write, each replaces the old file.
+  SaveBitmap24(picture, Path("out.bmp"));
+  EXPECT_TRUE(SameColours(*LoadPictureFile(Path("out.bmp")), picture));
+  EXPECT_EQ(Entries().size(), 4u);
+}
+
+TEST_F(PictureFiles, HostileHeadersOfEveryFamilyAreRefused) {
+  // 100000 x 100000 in a bitmap header.
+  WriteBytes(Path("huge.bmp"), BmpFile(BmpInfoHeader(40, 100000, 100000, 24, 0, 0), {},
+                                       std::vector<std::uint8_t>(64, 0)));
+  EXPECT_THROW(LoadPictureFile(Path("huge.bmp")), PictureFileError);
+  // Negative width.
+  WriteBytes(Path("negative.bmp"),
+             BmpFile(BmpInfoHeader(40, -5, 5, 24, 0, 0), {}, std::vector<std::uint8_t>(64, 0)));
+  EXPECT_THROW(LoadPictureFile(Path("negative.bmp")), PictureFileError);
+  // Truncated files of each family.
+  const TBitmap32 picture = PatternPicture(40, 30);
+  SaveJpeg(picture, Path("cut.jpg"));
+  SaveBitmap24(picture, Path("cut.bmp"));
+  SaveMetafile(picture, Path("cut.emf"));
+  for (const char* name : {"cut.jpg", "cut.bmp", "cut.emf"}) {
+    std::vector<std::uint8_t> bytes = ReadBytes(Path(name));
+    bytes.resize(bytes.size() / 2);
+    WriteBytes(Path(name), bytes);
+    EXPECT_THROW(LoadPictureFile(Path(name)), PictureFileError) << name;
+  }
+  WriteBytes(Path("empty.gif"), {});
+  EXPECT_THROW(LoadPictureFile(Path("empty.gif")), PictureFileError);
+}
+
+}  // namespace
+}  // namespace quillane::testing

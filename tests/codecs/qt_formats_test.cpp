@@ -1,0 +1,255 @@
+// Bitmaps of every depth and compression, icons and GIFs, built byte by byte.
+#include "tests/codecs/test_support.h"
+
+namespace quillane::testing {
+namespace {
+
+using codecs::DecodeWithQt;
+using codecs::QtFormat;
+
+TBitmap32 Bmp(const std::vector<std::uint8_t>& file) {
+  return DecodeWithQt(file, QtFormat::kBitmap);
+}
+
+// Palette entries are B, G, R, reserved.
+const std::vector<std::uint8_t> kPalette = {0, 0, 0, 0, 0, 0, 255, 0, 0, 255, 0, 0, 255, 0, 0, 0};
+
+// The 3 x 2 picture every depth encodes: top row red, green, blue; bottom row black, red, black.
+void ExpectSixPixels(const TBitmap32& p, Pixel red = kRed, Pixel green = kGreen,
+                     Pixel blue = kBlue) {
+  ASSERT_EQ(p.Width(), 3);
+  ASSERT_EQ(p.Height(), 2);
+  EXPECT_EQ(p.At(0, 0), red);
+  EXPECT_EQ(p.At(1, 0), green);
+  EXPECT_EQ(p.At(2, 0), blue);
+  EXPECT_EQ(p.At(0, 1), kBlack);
+  EXPECT_EQ(p.At(1, 1), red);
+  EXPECT_EQ(p.At(2, 1), kBlack);
+}
+
+TEST(BitmapDecoder, ReadsPalettedDepthsBottomUpAndTopDown) {
+  // Indices: 0 black, 1 red, 2 green, 3 blue. Rows are stored bottom row first.
+  const std::vector<std::uint8_t> bits8 = {0, 1, 0, 0, 1, 2, 3, 0};
+  ExpectSixPixels(Bmp(BmpFile(BmpInfoHeader(40, 3, 2, 8, 0, 8, 4), kPalette, bits8)));
+  // 4 bits: two pixels a byte, high nibble first.
+  const std::vector<std::uint8_t> bits4 = {0x01, 0x00, 0, 0, 0x12, 0x30, 0, 0};
+  ExpectSixPixels(Bmp(BmpFile(BmpInfoHeader(40, 3, 2, 4, 0, 8, 4), kPalette, bits4)));
+  // 1 bit needs a two-colour palette: black and red, so green and blue become red here.
+  const std::vector<std::uint8_t> mono = {0, 0, 0, 0, 0, 0, 255, 0};
+  const TBitmap32 one = Bmp(BmpFile(BmpInfoHeader(40, 3, 2, 1, 0, 8, 2), mono,
+                                    {0b01000000, 0, 0, 0, 0b11100000, 0, 0, 0}));
+  EXPECT_EQ(one.At(0, 0), kRed);
+  EXPECT_EQ(one.At(2, 0), kRed);
+  EXPECT_EQ(one.At(0, 1), kBlack);
+  EXPECT_EQ(one.At(1, 1), kRed);
+  // Top-down: a negative height and rows top first.
+  const std::vector<std::uint8_t> topDown = {1, 2, 3, 0, 0, 1, 0, 0};
+  ExpectSixPixels(Bmp(BmpFile(BmpInfoHeader(40, 3, -2, 8, 0, 8, 4), kPalette, topDown)));
+}
+
+TEST(BitmapDecoder, ReadsTrueColourDepthsAndBitFields) {
+  // 24 bits: B, G, R per pixel, rows padded to four bytes.
+  const std::vector<std::uint8_t> bits24 = {0, 0, 0,   0, 0,   255, 0,   0, 0, 0, 0, 0,
+                                            0, 0, 255, 0, 255, 0,   255, 0, 0, 0, 0, 0};
+  ExpectSixPixels(Bmp(BmpFile(BmpInfoHeader(40, 3, 2, 24, 0, 24), {}, bits24)));
+  // 32 bits without masks: B, G, R and an unused byte.
+  const std::vector<std::uint8_t> bits32 = {0, 0, 0,   9, 0, 0,   255, 9, 0,   0, 0, 9,
+                                            0, 0, 255, 9, 0, 255, 0,   9, 255, 0, 0, 9};
+  ExpectSixPixels(Bmp(BmpFile(BmpInfoHeader(40, 3, 2, 32, 0, 24), {}, bits32)));
+  // 16 bits, default 5-5-5. Like the system's own conversion, a full 5-bit channel becomes
+  // 31 << 3 = 248, a full 6-bit one 63 << 2 = 252.
+  ByteWriter b555;
+  b555.U16(0).U16(0x7C00).U16(0).U16(0).U16(0x7C00).U16(0x03E0).U16(0x001F).U16(0);
+  const Pixel red5{0, 0, 248, 255}, green5{0, 248, 0, 255}, blue5{248, 0, 0, 255};
+  ExpectSixPixels(Bmp(BmpFile(BmpInfoHeader(40, 3, 2, 16, 0, 16), {}, b555.bytes)), red5, green5,
+                  blue5);
+  // 16 bits, 5-6-5 bit fields after a 40-byte header.
+  ByteWriter b565;
+  b565.U16(0).U16(0xF800).U16(0).U16(0).U16(0xF800).U16(0x07E0).U16(0x001F).U16(0);
+  ByteWriter masks;
+  masks.U32(0xF800).U32(0x07E0).U32(0x001F);
+  ExpectSixPixels(Bmp(BmpFile(BmpInfoHeader(40, 3, 2, 16, 3, 16), masks.bytes, b565.bytes)), red5,
+                  Pixel{0, 252, 0, 255}, blue5);
+}
+
+TEST(BitmapDecoder, ReadsVersion4And5HeadersWithAlpha) {
+  // 32-bit BGRA with an alpha mask: the stored alpha comes back.
+  const std::vector<std::uint8_t> bits = {0, 0, 255, 255, 0, 255, 0, 128, 255, 0, 0, 0};
+  for (int headerSize : {108, 124}) {
+    const TBitmap32 p = Bmp(
+        BmpFile(BmpInfoHeader(headerSize, 3, 1, 32, 3, 12, 0, {0xFF0000, 0xFF00, 0xFF, 0xFF000000}),
+                {}, bits));
+    ASSERT_EQ(p.Width(), 3);
+    EXPECT_EQ(p.At(0, 0), kRed);
+    EXPECT_EQ(p.At(1, 0), (Pixel{0, 255, 0, 128}));
+    EXPECT_EQ(p.At(2, 0), (Pixel{255, 0, 0, 0}));
+  }
+}
+
+TEST(BitmapDecoder, ReadsRunLengthEncodings) {
+  // RLE8, bottom row first: a run of 1 black, 1 red, 1 black; end of line; then an absolute
+  // run of three indices (padded to a word); end of bitmap.
+  const std::vector<std::uint8_t> rle8 = {1, 0, 1, 1, 1, 0, 0, 0, 0, 3, 1, 2, 3, 0, 0, 1};
+  ExpectSixPixels(Bmp(BmpFile(BmpInfoHeader(40, 3, 2, 8, 1, rle8.size(), 4), kPalette, rle8)));
+  // RLE4: runs alternate their two nibbles.
+  const std::vector<std::uint8_t> rle4 = {3, 0x01, 0, 0, 0, 3, 0x12, 0x30, 0, 1};
+  ExpectSixPixels(Bmp(BmpFile(BmpInfoHeader(40, 3, 2, 4, 2, rle4.size(), 4), kPalette, rle4)));
+}
+
+TEST(BitmapDecoder, RefusesHostileHeadersAndDamage) {
+  const std::vector<std::uint8_t> bits(64, 0);
+  for (const auto& [w, h] : {std::pair{100000, 100000}, {0, 2}, {3, 0}, {-3, 2}, {70000, 70000}}) {
+    EXPECT_THROW(Bmp(BmpFile(BmpInfoHeader(40, w, h, 24, 0, 0), {}, bits)), PictureFileError)
+        << w << "x" << h;
+  }
+  // A picture within Qt's own limits but beyond ours is refused from the header.
+  EXPECT_THROW(DecodeWithQt(BmpFile(BmpInfoHeader(40, 100, 100, 24, 0, 0), {}, bits),
+                            QtFormat::kBitmap, 9999),
+               PictureFileError);
+  // Bits missing.
+  const std::vector<std::uint8_t> full =
+      BmpFile(BmpInfoHeader(40, 30, 20, 24, 0, 0), {}, std::vector<std::uint8_t>(90 * 20, 7));
+  const std::vector<std::uint8_t> cut(full.begin(), full.begin() + 54 + 90 * 5);
+  EXPECT_THROW(Bmp(cut), PictureFileError);
+  // Another format under this name.
+  EXPECT_THROW(Bmp({0x89, 'P', 'N', 'G', 0x0D, 0x0A, 0x1A, 0x0A, 0, 0, 0, 0}), PictureFileError);
+  EXPECT_THROW(Bmp({}), PictureFileError);
+}
+
+// An icon entry: a 32-bit image of one colour, optionally with some alpha, or a paletted one.
+struct IconImage {
+  int size;
+  int bitCount;
+  Pixel colour;
+};
+
+std::vector<std::uint8_t> IcoFile(const std::vector<IconImage>& images) {
+  std::vector<std::vector<std::uint8_t>> bodies;
+  for (const IconImage& image : images) {
+    const int n = image.size;
+    const int maskStride = ((n + 31) / 32) * 4;
+    ByteWriter body;
+    body.Append(BmpInfoHeader(40, n, 2 * n, image.bitCount, 0, 0));
+    if (image.bitCount == 32) {
+      for (int y = 0; y < n; ++y) {
+        for (int x = 0; x < n; ++x) {
+          // Stored bottom-up; the top-left pixel (last row, first column) is transparent and
+          // its neighbour half transparent.
+          const bool top = y == n - 1;
+          const std::uint8_t alpha = top && x == 0 ? 0 : top && x == 1 ? 128 : 255;
+          body.U8(image.colour.b).U8(image.colour.g).U8(image.colour.r).U8(alpha);
+        }
+      }
+    } else {  // 8 bits: palette entry 1 is the colour
+      body.U8(0).U8(0).U8(0).U8(0).U8(image.colour.b).U8(image.colour.g).U8(image.colour.r).U8(0);
+      for (int i = 2; i < 256; ++i) body.U32(0);
+      for (int y = 0; y < n; ++y) {
+        for (int x = 0; x < n; ++x) body.U8(1);
+      }
+    }
+    for (int i = 0; i < maskStride * n; ++i) body.U8(0);
+    bodies.push_back(body.bytes);
+  }
+  ByteWriter file;
+  file.U16(0).U16(1).U16(static_cast<unsigned>(images.size()));
+  std::uint32_t offset = static_cast<std::uint32_t>(6 + 16 * images.size());
+  for (std::size_t i = 0; i < images.size(); ++i) {
+    const int n = images[i].size;
+    file.U8(n == 256 ? 0 : n).U8(n == 256 ? 0 : n).U8(0).U8(0).U16(1).U16(images[i].bitCount);
+    file.U32(static_cast<std::uint32_t>(bodies[i].size())).U32(offset);
+    offset += static_cast<std::uint32_t>(bodies[i].size());
+  }
+  for (const auto& body : bodies) file.Append(body);
+  return file.bytes;
+}
+
+TEST(IconDecoder, TakesTheLargestDeepestEntryAndPaintsTransparencyWhite) {
+  const std::vector<std::uint8_t> file =
+      IcoFile({{16, 32, kBlue}, {32, 8, kGreen}, {32, 32, kRed}, {24, 32, kBlue}});
+  const TBitmap32 icon = DecodeWithQt(file, QtFormat::kIcon);
+  ASSERT_EQ(icon.Width(), 32);
+  ASSERT_EQ(icon.Height(), 32);
+  EXPECT_EQ(icon.At(5, 5), kRed);
+  EXPECT_EQ(icon.At(31, 31), kRed);
+  // Transparent: white, alpha as the icon has it; half transparent: red over white.
+  EXPECT_EQ(icon.At(0, 0), (Pixel{255, 255, 255, 0}));
+  EXPECT_EQ(icon.At(1, 0), (Pixel{127, 127, 255, 128}));
+  // Of two equally large entries the deeper one wins, wherever it is listed.
+  const TBitmap32 deeper =
+      DecodeWithQt(IcoFile({{32, 32, kBlue}, {32, 8, kGreen}}), QtFormat::kIcon);
+  EXPECT_EQ(deeper.At(5, 5), kBlue);
+}
+
+TEST(IconDecoder, RefusesDamagedFiles) {
+  const std::vector<std::uint8_t> file = IcoFile({{16, 32, kBlue}});
+  const std::vector<std::uint8_t> cut(file.begin(), file.begin() + 30);
+  EXPECT_THROW(DecodeWithQt(cut, QtFormat::kIcon), PictureFileError);
+  EXPECT_THROW(DecodeWithQt(std::vector<std::uint8_t>{0, 0, 1, 0, 0, 0}, QtFormat::kIcon),
+               PictureFileError);
+}
+
+const std::vector<std::uint8_t> kGifPalette = {255, 0, 0, 0, 255, 0, 0, 0, 255, 0, 0, 0};
+
+TEST(GifDecoder, ReadsPlainAndInterlacedFirstFrames) {
+  // 3 x 5: rows of red, green, blue, black, red.
+  const std::vector<std::uint8_t> rows = {0, 0, 0, 1, 1, 1, 2, 2, 2, 3, 3, 3, 0, 0, 0};
+  // Interlaced storage order for 5 rows: 0, 4, 2, 1, 3.
+  std::vector<std::uint8_t> interlaced;
+  for (int row : {0, 4, 2, 1, 3}) {
+    interlaced.insert(interlaced.end(), rows.begin() + 3 * row, rows.begin() + 3 * row + 3);
+  }
+  for (const bool isInterlaced : {false, true}) {
+    const TBitmap32 p = DecodeWithQt(
+        GifFile(3, 5, 0, 0, 3, 5, kGifPalette, isInterlaced ? interlaced : rows, -1, isInterlaced),
+        QtFormat::kGif);
+    ASSERT_EQ(p.Width(), 3);
+    ASSERT_EQ(p.Height(), 5);
+    const Pixel want[5] = {kRed, kGreen, kBlue, kBlack, kRed};
+    for (int y = 0; y < 5; ++y) {
+      for (int x = 0; x < 3; ++x) EXPECT_EQ(p.At(x, y), want[y]) << x << "," << y;
+    }
+  }
+}
+
+TEST(GifDecoder, TransparentPixelsAndUncoveredScreenBecomeWhite) {
+  // A 4 x 3 screen; a 2 x 2 frame at (1, 1) whose index 3 is transparent.
+  const TBitmap32 p =
+      DecodeWithQt(GifFile(4, 3, 1, 1, 2, 2, kGifPalette, {0, 3, 1, 2}, 3, false), QtFormat::kGif);
+  ASSERT_EQ(p.Width(), 4);
+  ASSERT_EQ(p.Height(), 3);
+  EXPECT_EQ(p.At(1, 1), kRed);
+  EXPECT_EQ(p.At(1, 2), kGreen);
+  EXPECT_EQ(p.At(2, 2), kBlue);
+  EXPECT_EQ(p.At(2, 1), (Pixel{255, 255, 255, 0}));
+  EXPECT_EQ(p.At(0, 0), (Pixel{255, 255, 255, 0}));
+}
+
+// Qt's reader refuses images above its own process-wide allocation limit (256 MB by default);
+// a 50-megapixel GIF screen needs 203 MB in 32 bits and must open like any photo.
+TEST(GifDecoder, FiftyMegapixelScreenOpens) {
+  const TBitmap32 p =
+      DecodeWithQt(GifFile(8200, 6200, 0, 0, 1, 1, kGifPalette, {1}, -1, false), QtFormat::kGif);
+  EXPECT_EQ(p.Width(), 8200);
+  EXPECT_EQ(p.Height(), 6200);
+  EXPECT_EQ(p.At(0, 0), kGreen);
+}
+
+TEST(GifDecoder, RefusesHugeScreensAndDamage) {
+  try {
+    DecodeWithQt(GifFile(65535, 65535, 0, 0, 1, 1, kGifPalette, {1}, -1, false), QtFormat::kGif);
+    FAIL();
+  } catch (const PictureFileError& error) {
+    EXPECT_NE(std::string(error.what()).find("65535 by 65535"), std::string::npos) << error.what();
+  }
+  const std::vector<std::uint8_t> file =
+      GifFile(3, 3, 0, 0, 3, 3, kGifPalette, std::vector<std::uint8_t>(9, 1), -1, false);
+  EXPECT_THROW(
+      DecodeWithQt(std::vector<std::uint8_t>(file.begin(), file.begin() + 10), QtFormat::kGif),
+      PictureFileError);
+  EXPECT_THROW(DecodeWithQt(std::vector<std::uint8_t>{'G', 'I', 'F', '8', '9', 'a', 0, 0, 0, 0},
+                            QtFormat::kGif),
+               PictureFileError);
+}
+
+}  // namespace
+}  // namespace quillane::testing
