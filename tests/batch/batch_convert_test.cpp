@@ -99,17 +99,6 @@ struct Recorder {
   }
 };
 
-TEST(BatchOutputNameTest, DropsFourCharactersAndAddsTheTag) {
-  EXPECT_EQ(BatchOutputName("out", "beach.jpg", "Emboss"), "out/beach-Emboss.jpg");
-  EXPECT_EQ(BatchOutputName("out", "c.jpeg", "Vuzorar"), "out/c.-Vuzorar.jpg");
-  EXPECT_EQ(BatchOutputName("/a/b/", "X.BMP", "Pop-art"), "/a/b/X-Pop-art.jpg");
-}
-
-TEST(TrimBlanksTest, RemovesSpacesAndControlCharactersAtBothEnds) {
-  EXPECT_EQ(TrimBlanks("  \t/tmp/my pictures \r\n"), "/tmp/my pictures");
-  EXPECT_EQ(TrimBlanks(" \t "), "");
-}
-
 TEST_F(BatchFolder, ScanListsEachMaskInTurnIgnoringCaseAndSortedByName) {
   for (const char* name : {"b.JPG", "a.jpg", "A.JPG", "x.jpeg", "A.Jpeg", "c.bmp", "d.WMF", "e.emf",
                            "f.gif", "g.ico", "h.jpg.txt", "jpg", ".jpgx"})

@@ -157,6 +157,9 @@ TEST_F(CliRun, ListShowsEveryEffectWithRangesAndDefaults) {
   EXPECT_NE(out_.find("--contrast N"), std::string::npos) << out_;
   EXPECT_NE(out_.find("0..89, default 45"), std::string::npos) << out_;
   EXPECT_NE(out_.find("0..255, default 128"), std::string::npos) << out_;
+  // Menu captions as displayed: "&&" shows a single "&".
+  EXPECT_NE(out_.find("(Pen & Ink)"), std::string::npos) << out_;
+  EXPECT_EQ(out_.find("&&"), std::string::npos) << out_;
   for (const EffectSpec& e : Effects()) {
     const std::size_t at = out_.find("  " + e.cliName + "  ");
     ASSERT_NE(at, std::string::npos) << e.cliName;

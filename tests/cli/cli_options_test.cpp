@@ -5,7 +5,6 @@
 #include <string>
 #include <vector>
 
-#include "cli/cli_commands.h"
 #include "effects/mono/bw_sketch.h"
 
 namespace quillane::cli {
@@ -144,14 +143,6 @@ TEST(OutputTypeForTest, ChosenByTheExtensionInAnyCase) {
   EXPECT_EQ(OutputTypeFor("a.png"), OutputType::Png);
   EXPECT_EQ(OutputTypeFor("x.png/picture"), OutputType::Unknown);
   EXPECT_EQ(OutputTypeFor("a.gif"), OutputType::Unknown);
-}
-
-TEST(CaptionTest, DisplayedCaptionsAndHtmlEscaping) {
-  EXPECT_EQ(DisplayedCaption(" B&&W"), "B&W");
-  EXPECT_EQ(DisplayedCaption("Pen && Ink"), "Pen & Ink");
-  EXPECT_EQ(DisplayedCaption("&File"), "File");
-  EXPECT_EQ(HtmlEscape("<a href=\"x\">Tom & Jerry's</a>"),
-            "&lt;a href=&quot;x&quot;&gt;Tom &amp; Jerry&#39;s&lt;/a&gt;");
 }
 
 }  // namespace
