@@ -39,7 +39,7 @@ const char* FamilyName(QtFormat format) {
   return "";
 }
 
-// Qt refuses decoded images above a process-wide limit (256 MB by default, less than a
+// Qt refuses decoded images above a process-wide limit (128 MB by default, less than a
 // 50-megapixel photo in 32 bits). Our own limit is checked from the header before reading, so
 // Qt's is raised to exactly what the largest accepted picture needs in 32 bits.
 void RaiseQtAllocationLimit() {

@@ -1,9 +1,12 @@
-// Windows metafiles through libwmf, played by its gd device into an in-memory true-colour
-// image. libwmf reads the bytes through its own bounds-checked memory stream; the header is
-// checked here first so that only plausible files reach it, and a status callback stops
-// playback that runs on without end.
+// Windows metafiles through libwmf, played by its gd device. libwmf reads the bytes through its own
+// bounds-checked memory stream; the header is checked here first so that only plausible files reach
+// it, and a status callback stops playback that runs on without end. Qt first: libwmf's headers
+// define short macros that clash with Qt's names.
+#include <QImage>
+// clang-format off
 #include <libwmf/api.h>
 #include <libwmf/gd.h>
+// clang-format on
 
 #include <chrono>
 #include <cmath>
@@ -58,6 +61,19 @@ int Status(void* context, float) {
   auto* playback = static_cast<Playback*>(context);
   if (std::chrono::steady_clock::now() > playback->deadline) playback->timedOut = true;
   return playback->timedOut ? 1 : 0;
+}
+
+// Collects the PNG the player writes. A C callback: nothing may be thrown out of it.
+int CollectPng(void* context, char* buffer, int length) {
+  if (length <= 0) return 0;
+  try {
+    auto* png = static_cast<std::vector<std::uint8_t>*>(context);
+    png->insert(png->end(), reinterpret_cast<std::uint8_t*>(buffer),
+                reinterpret_cast<std::uint8_t*>(buffer) + length);
+    return length;
+  } catch (...) {
+    return 0;
+  }
 }
 
 class WmfApi {
@@ -144,32 +160,43 @@ TBitmap32 DecodeWindowsMetafile(Bytes data, std::int64_t maxPixels) {
   }
   CheckPictureSize(width, height, maxPixels, "metafile");
 
+  // The player hands its picture over as PNG: its in-memory image cannot be freed through
+  // this version's interface (it would leak), whereas the PNG path frees everything itself.
+  std::vector<std::uint8_t> png;
   auto* device = WMF_GD_GetData(api.get());
-  device->type = wmf_gd_image;
+  if ((device->flags & WMF_GD_SUPPORTS_PNG) == 0) {
+    throw PictureFileError("The metafile reader was built without PNG output");
+  }
+  device->type = wmf_gd_png;
+  device->flags |= WMF_GD_OUTPUT_MEMORY | WMF_GD_OWN_BUFFER;
+  device->sink.context = &png;
+  device->sink.function = CollectPng;
   device->bbox = bounds;
   device->width = width;
   device->height = height;
-  if (wmf_play(api.get(), 0, &bounds) != wmf_E_None || device->gd_image == nullptr) {
+  if (wmf_play(api.get(), 0, &bounds) != wmf_E_None || png.empty()) {
     throw PictureFileError(playback.timedOut ? "The metafile takes too long to draw"
                                              : "The metafile cannot be drawn");
   }
-  const int* pixels = wmf_gd_image_pixels(device->gd_image);
-  if (pixels == nullptr) throw PictureFileError("The metafile cannot be drawn");
+  QImage image;
+  if (!image.loadFromData(png.data(), static_cast<int>(png.size()), "png") ||
+      image.width() != static_cast<int>(width) || image.height() != static_cast<int>(height)) {
+    throw PictureFileError("The metafile cannot be drawn");
+  }
+  image.convertTo(QImage::Format_ARGB32);
+  if (image.isNull()) throw PictureFileError("Out of memory");
 
-  // gd keeps 0x7F-scaled transparency in the top byte (0 opaque); paint it over white.
+  // Whatever the player left transparent shows the white background.
   TBitmap32 result(static_cast<int>(width), static_cast<int>(height));
   for (int y = 0; y < result.Height(); ++y) {
     Pixel* row = result.ScanLine(y);
-    const int* source = pixels + static_cast<std::size_t>(y) * width;
+    const auto* source = reinterpret_cast<const Pixel*>(image.constScanLine(y));
     for (int x = 0; x < result.Width(); ++x) {
-      const auto value = static_cast<std::uint32_t>(source[x]);
-      const unsigned transparency = (value >> 24) & 0x7F;
-      const unsigned alpha = 255 - (transparency * 255 + 63) / 127;
-      const auto over = [alpha](unsigned c) {
+      const Pixel p = source[x];
+      const auto over = [alpha = unsigned{p.a}](unsigned c) {
         return static_cast<std::uint8_t>((c * alpha + 255 * (255 - alpha) + 127) / 255);
       };
-      row[x] =
-          Pixel{over(value & 0xFF), over((value >> 8) & 0xFF), over((value >> 16) & 0xFF), 255};
+      row[x] = Pixel{over(p.b), over(p.g), over(p.r), 255};
     }
   }
   return result;

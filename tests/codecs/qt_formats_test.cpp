@@ -224,7 +224,7 @@ TEST(GifDecoder, TransparentPixelsAndUncoveredScreenBecomeWhite) {
   EXPECT_EQ(p.At(0, 0), (Pixel{255, 255, 255, 0}));
 }
 
-// Qt's reader refuses images above its own process-wide allocation limit (256 MB by default);
+// Qt's reader refuses images above its own process-wide allocation limit (128 MB by default);
 // a 50-megapixel GIF screen needs 203 MB in 32 bits and must open like any photo.
 TEST(GifDecoder, FiftyMegapixelScreenOpens) {
   const TBitmap32 p =

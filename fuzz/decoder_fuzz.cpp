@@ -1,0 +1,48 @@
+// One decoder family per build (chosen by QUILLANE_FUZZ_FAMILY_<name>). Any input must give a
+// picture or PictureFileError; a crash, leak, hang or sanitizer report is a fault.
+#include <cstddef>
+#include <cstdint>
+
+#include "codecs/codec_internal.h"
+
+namespace {
+
+// Small enough that libFuzzer's memory limit is never the thing that stops a run.
+constexpr std::int64_t kFuzzMaxPixels = std::int64_t{1} << 22;
+
+quillane::TBitmap32 Decode(quillane::codecs::Bytes bytes) {
+  using namespace quillane::codecs;
+#if defined(QUILLANE_FUZZ_FAMILY_jpeg)
+  return DecodeJpeg(bytes, kFuzzMaxPixels);
+#elif defined(QUILLANE_FUZZ_FAMILY_bmp)
+  return DecodeWithQt(bytes, QtFormat::kBitmap, kFuzzMaxPixels);
+#elif defined(QUILLANE_FUZZ_FAMILY_ico)
+  return DecodeWithQt(bytes, QtFormat::kIcon, kFuzzMaxPixels);
+#elif defined(QUILLANE_FUZZ_FAMILY_gif)
+  return DecodeWithQt(bytes, QtFormat::kGif, kFuzzMaxPixels);
+#elif defined(QUILLANE_FUZZ_FAMILY_wmf)
+  return DecodeWindowsMetafile(bytes, kFuzzMaxPixels);
+#elif defined(QUILLANE_FUZZ_FAMILY_emf)
+  return DecodeEnhancedMetafile(bytes, kFuzzMaxPixels);
+#else
+#error "no decoder family chosen"
+#endif
+}
+
+}  // namespace
+
+extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
+  try {
+    const quillane::TBitmap32 picture = Decode({data, size});
+    // Touch every pixel so that a short or misplaced buffer shows up under the sanitizers.
+    unsigned sum = 0;
+    for (int y = 0; y < picture.Height(); ++y) {
+      const quillane::Pixel* row = picture.ScanLine(y);
+      for (int x = 0; x < picture.Width(); ++x) sum += row[x].r;
+    }
+    static volatile unsigned sink;
+    sink = sum;
+  } catch (const quillane::PictureFileError&) {
+  }
+  return 0;
+}

@@ -1,0 +1,222 @@
+// Writes a small seed corpus for the fuzz targets: make_seeds <folder> creates
+// <folder>/<family>/ with a few valid files of each family, covering its main variants.
+#include <cstddef>
+#include <cstdio>
+// clang-format off
+#include <jpeglib.h>
+// clang-format on
+
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <iostream>
+#include <string>
+#include <vector>
+
+#include "codecs/codec_internal.h"
+
+namespace {
+
+using quillane::Pixel;
+using quillane::TBitmap32;
+using Bytes = std::vector<std::uint8_t>;
+
+struct Writer {
+  Bytes b;
+  Writer& U8(unsigned v) {
+    b.push_back(static_cast<std::uint8_t>(v));
+    return *this;
+  }
+  Writer& U16(unsigned v) { return U8(v & 0xFF).U8(v >> 8 & 0xFF); }
+  Writer& U32(std::uint32_t v) { return U16(v & 0xFFFF).U16(v >> 16); }
+  Writer& Add(const Bytes& more) {
+    b.insert(b.end(), more.begin(), more.end());
+    return *this;
+  }
+};
+
+TBitmap32 Pattern(int w, int h) {
+  TBitmap32 p(w, h);
+  for (int y = 0; y < h; ++y) {
+    for (int x = 0; x < w; ++x) {
+      p.At(x, y) = Pixel{static_cast<std::uint8_t>(x * 8), static_cast<std::uint8_t>(y * 8),
+                         static_cast<std::uint8_t>((x ^ y) * 16), 255};
+    }
+  }
+  return p;
+}
+
+// progressive: simple progression; components: 1 gray, 3 YCbCr, 4 Adobe CMYK.
+Bytes Jpeg(int components, bool progressive) {
+  jpeg_compress_struct cinfo{};
+  jpeg_error_mgr err{};
+  cinfo.err = jpeg_std_error(&err);
+  jpeg_create_compress(&cinfo);
+  unsigned char* out = nullptr;
+  unsigned long size = 0;
+  jpeg_mem_dest(&cinfo, &out, &size);
+  cinfo.image_width = 24;
+  cinfo.image_height = 16;
+  cinfo.input_components = components;
+  cinfo.in_color_space = components == 1 ? JCS_GRAYSCALE : components == 3 ? JCS_RGB : JCS_CMYK;
+  jpeg_set_defaults(&cinfo);
+  jpeg_set_quality(&cinfo, 75, TRUE);
+  cinfo.restart_in_rows = 1;
+  if (progressive) jpeg_simple_progression(&cinfo);
+  jpeg_start_compress(&cinfo, TRUE);
+  std::vector<JSAMPLE> row(24 * static_cast<std::size_t>(components));
+  while (cinfo.next_scanline < cinfo.image_height) {
+    for (std::size_t i = 0; i < row.size(); ++i) {
+      row[i] = static_cast<JSAMPLE>(i * 11 + cinfo.next_scanline * 13);
+    }
+    JSAMPROW rows[1] = {row.data()};
+    jpeg_write_scanlines(&cinfo, rows, 1);
+  }
+  jpeg_finish_compress(&cinfo);
+  Bytes bytes(out, out + size);
+  jpeg_destroy_compress(&cinfo);
+  std::free(out);
+  return bytes;
+}
+
+Bytes InfoHeader(int w, int h, int bits, std::uint32_t compression, std::uint32_t colours) {
+  Writer wr;
+  wr.U32(40).U32(static_cast<std::uint32_t>(w)).U32(static_cast<std::uint32_t>(h)).U16(1);
+  wr.U16(bits).U32(compression).U32(0).U32(3780).U32(3780).U32(colours).U32(0);
+  return wr.b;
+}
+
+Bytes Bmp(const Bytes& info, const Bytes& palette, const Bytes& bits) {
+  const auto offset = static_cast<std::uint32_t>(14 + info.size() + palette.size());
+  Writer wr;
+  wr.U8('B').U8('M').U32(offset + static_cast<std::uint32_t>(bits.size())).U32(0).U32(offset);
+  return wr.Add(info).Add(palette).Add(bits).b;
+}
+
+Bytes Ico() {
+  Writer body;
+  body.Add(InfoHeader(16, 32, 32, 0, 0));
+  for (int i = 0; i < 16 * 16; ++i) body.U8(i).U8(255 - i).U8(128).U8(i % 3 ? 255 : 0);
+  for (int i = 0; i < 4 * 16; ++i) body.U8(0);
+  Writer small;
+  small.Add(InfoHeader(8, 16, 8, 0, 2)).U32(0).U32(0x00FF0000);
+  for (int i = 0; i < 8 * 8; ++i) small.U8(i & 1);
+  for (int i = 0; i < 4 * 8; ++i) small.U8(0xAA);
+  Writer file;
+  file.U16(0).U16(1).U16(2);
+  file.U8(16).U8(16).U8(0).U8(0).U16(1).U16(32).U32(static_cast<std::uint32_t>(body.b.size()));
+  file.U32(38);
+  file.U8(8).U8(8).U8(2).U8(0).U16(1).U16(8).U32(static_cast<std::uint32_t>(small.b.size()));
+  file.U32(static_cast<std::uint32_t>(38 + body.b.size()));
+  return file.Add(body.b).Add(small.b).b;
+}
+
+// Literal-only LZW with a clear code every two codes (minimum code size 2).
+Bytes Gif(bool interlaced, bool transparent) {
+  Writer w;
+  for (char c : std::string("GIF89a")) w.U8(static_cast<unsigned char>(c));
+  w.U16(6).U16(5).U8(0xF1).U8(0).U8(0);
+  w.U8(255).U8(0).U8(0).U8(0).U8(255).U8(0).U8(0).U8(0).U8(255).U8(255).U8(255).U8(255);
+  if (transparent) w.U8(0x21).U8(0xF9).U8(4).U8(1).U16(0).U8(3).U8(0);
+  w.U8(0x2C).U16(1).U16(0).U16(4).U16(5).U8(interlaced ? 0x40 : 0).U8(2);
+  Bytes data;
+  std::uint32_t acc = 0;
+  int bits = 0;
+  const auto emit = [&](unsigned code) {
+    acc |= code << bits;
+    for (bits += 3; bits >= 8; bits -= 8, acc >>= 8) data.push_back(acc & 0xFF);
+  };
+  for (int i = 0; i < 20; ++i) {
+    if (i % 2 == 0) emit(4);
+    emit(static_cast<unsigned>(i % 4));
+  }
+  emit(5);
+  if (bits > 0) data.push_back(acc & 0xFF);
+  w.U8(static_cast<unsigned>(data.size())).Add(data).U8(0).U8(0x3B);
+  return w.b;
+}
+
+Bytes Wmf() {
+  Writer records;
+  const auto record = [&records](unsigned function, std::vector<int> params) {
+    records.U32(static_cast<std::uint32_t>(3 + params.size())).U16(function);
+    for (int p : params) records.U16(static_cast<std::uint16_t>(p));
+  };
+  record(0x020B, {0, 0});
+  record(0x020C, {30, 40});
+  record(0x02FC, {0, 0x00FF, 0, 0});
+  record(0x012D, {0});
+  record(0x02FA, {0, 1, 0, 0x0F0F, 0});
+  record(0x012D, {1});
+  record(0x041B, {25, 30, 5, 10});
+  record(0x0418, {28, 38, 2, 20});  // ellipse
+  record(0x0000, {});
+  Writer head;
+  head.U32(0x9AC6CDD7).U16(0).U16(0).U16(0).U16(40).U16(30).U16(96).U32(0);
+  unsigned checksum = 0;
+  for (std::size_t i = 0; i < 20; i += 2) checksum ^= head.b[i] | head.b[i + 1] << 8;
+  head.U16(checksum);
+  head.U16(1).U16(9).U16(0x0300).U32(static_cast<std::uint32_t>(9 + records.b.size() / 2));
+  head.U16(2).U32(6).U16(0);
+  return head.Add(records.b).b;
+}
+
+void Save(const std::filesystem::path& folder, const std::string& family, int index,
+          const Bytes& bytes) {
+  std::filesystem::create_directories(folder / family);
+  std::ofstream out(folder / family / ("seed-" + std::to_string(index)), std::ios::binary);
+  out.write(reinterpret_cast<const char*>(bytes.data()),
+            static_cast<std::streamsize>(bytes.size()));
+  if (!out) throw std::runtime_error("cannot write into " + folder.string());
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  if (argc != 2) {
+    std::cerr << "usage: " << argv[0] << " <seed folder>\n";
+    return 2;
+  }
+  try {
+    namespace c = quillane::codecs;
+    const std::filesystem::path folder = argv[1];
+    const TBitmap32 picture = Pattern(24, 16);
+
+    Save(folder, "jpeg", 0, c::EncodeJpeg(picture, 90));
+    Save(folder, "jpeg", 1, Jpeg(3, true));
+    Save(folder, "jpeg", 2, Jpeg(1, false));
+    Save(folder, "jpeg", 3, Jpeg(4, false));
+
+    c::MemorySink bmp24;
+    c::EncodeBitmap24(picture, bmp24);
+    Save(folder, "bmp", 0, bmp24.bytes());
+    const Bytes palette = {0, 0, 0, 0, 0, 0, 255, 0, 0, 255, 0, 0, 255, 0, 0, 0};
+    Save(folder, "bmp", 1, Bmp(InfoHeader(3, 2, 8, 0, 4), palette, {0, 1, 0, 0, 1, 2, 3, 0}));
+    Save(folder, "bmp", 2,
+         Bmp(InfoHeader(3, 2, 8, 1, 4), palette, {1, 0, 1, 1, 1, 0, 0, 0, 0, 3, 1, 2, 3, 0, 0, 1}));
+    Save(folder, "bmp", 3,
+         Bmp(InfoHeader(3, -2, 4, 2, 4), palette, {3, 0x01, 0, 0, 0, 3, 0x12, 0x30, 0, 1}));
+    Save(folder, "bmp", 4,
+         Bmp(InfoHeader(3, 2, 16, 3, 0), {0, 0xF8, 0, 0, 0xE0, 7, 0, 0, 0x1F, 0, 0, 0},
+             {0, 0, 0, 0xF8, 0, 0, 0, 0, 0, 0xF8, 0xE0, 7, 0x1F, 0, 0, 0}));
+    Save(folder, "bmp", 5,
+         Bmp(InfoHeader(9, 2, 1, 0, 2), {0, 0, 0, 0, 255, 255, 255, 0},
+             {0xA5, 0x80, 0, 0, 0x5A, 0x00, 0, 0}));
+
+    Save(folder, "ico", 0, Ico());
+    Save(folder, "gif", 0, Gif(false, false));
+    Save(folder, "gif", 1, Gif(true, true));
+    Save(folder, "wmf", 0, Wmf());
+
+    c::MemorySink emf;
+    c::EncodeEnhancedMetafile(picture, emf);
+    Save(folder, "emf", 0, emf.bytes());
+    c::MemorySink tiny;
+    c::EncodeEnhancedMetafile(Pattern(3, 2), tiny);
+    Save(folder, "emf", 1, tiny.bytes());
+  } catch (const std::exception& error) {
+    std::cerr << error.what() << "\n";
+    return 1;
+  }
+  return 0;
+}
