@@ -1,0 +1,98 @@
+// JPEG decoding and encoding of a 24-megapixel photo-like picture (6000 x 4000: smooth
+// gradients with fine noise, so the entropy coder has real work), through the same calls the
+// program makes.
+#include <benchmark/benchmark.h>
+#include <unistd.h>
+
+#include <cstdint>
+#include <filesystem>
+#include <string>
+
+#include "codecs/codec_internal.h"
+#include "codecs/picture_file.h"
+
+namespace {
+
+using quillane::Pixel;
+using quillane::TBitmap32;
+
+constexpr int kWidth = 6000, kHeight = 4000;
+
+const TBitmap32& Photo() {
+  static const TBitmap32 photo = [] {
+    TBitmap32 p(kWidth, kHeight);
+    std::uint32_t noise = 2463534242u;
+    for (int y = 0; y < kHeight; ++y) {
+      Pixel* row = p.ScanLine(y);
+      for (int x = 0; x < kWidth; ++x) {
+        noise ^= noise << 13;
+        noise ^= noise >> 17;
+        noise ^= noise << 5;
+        const int grain = static_cast<int>(noise & 15) - 8;
+        const auto channel = [grain](int v) {
+          return static_cast<std::uint8_t>(v + grain < 0 ? 0 : v + grain > 255 ? 255 : v + grain);
+        };
+        row[x] = Pixel{channel(40 + x * 180 / kWidth), channel(60 + y * 150 / kHeight),
+                       channel(200 - (x + y) * 160 / (kWidth + kHeight)), 255};
+      }
+    }
+    return p;
+  }();
+  return photo;
+}
+
+// The photo saved once as a quality-90 JPEG; removed when the program ends.
+struct PhotoFile {
+  std::filesystem::path folder;
+  std::string path;
+  PhotoFile() {
+    std::string pattern = (std::filesystem::temp_directory_path() / "codecs-bench-XXXXXX").string();
+    if (::mkdtemp(pattern.data()) == nullptr) throw std::runtime_error("no temporary folder");
+    folder = pattern;
+    path = (folder / "photo.jpg").string();
+    quillane::SaveJpeg(Photo(), path);
+  }
+  ~PhotoFile() {
+    std::error_code ignored;
+    std::filesystem::remove_all(folder, ignored);
+  }
+};
+
+const PhotoFile& SavedPhoto() {
+  static const PhotoFile file;
+  return file;
+}
+
+void BM_JpegDecode24Mpx(benchmark::State& state) {
+  const std::string& path = SavedPhoto().path;
+  for (auto _ : state) {
+    auto picture = quillane::LoadPictureFile(path);
+    benchmark::DoNotOptimize(picture->Data());
+  }
+  state.SetItemsProcessed(state.iterations() * kWidth * kHeight);
+  state.counters["file_MB"] = static_cast<double>(std::filesystem::file_size(path)) / 1e6;
+}
+BENCHMARK(BM_JpegDecode24Mpx)->Unit(benchmark::kMillisecond)->MinTime(3);
+
+void BM_JpegEncode24Mpx(benchmark::State& state) {
+  const TBitmap32& photo = Photo();
+  for (auto _ : state) {
+    auto bytes = quillane::codecs::EncodeJpeg(photo, 90);
+    benchmark::DoNotOptimize(bytes.data());
+  }
+  state.SetItemsProcessed(state.iterations() * kWidth * kHeight);
+}
+BENCHMARK(BM_JpegEncode24Mpx)->Unit(benchmark::kMillisecond)->MinTime(3);
+
+// Encoding plus the safe write: temporary file, fsync and rename.
+void BM_SaveJpeg24Mpx(benchmark::State& state) {
+  const TBitmap32& photo = Photo();
+  const std::string path = (SavedPhoto().folder / "saved.jpg").string();
+  for (auto _ : state) quillane::SaveJpeg(photo, path);
+  state.SetItemsProcessed(state.iterations() * kWidth * kHeight);
+}
+BENCHMARK(BM_SaveJpeg24Mpx)->Unit(benchmark::kMillisecond)->MinTime(3);
+
+}  // namespace
+
+BENCHMARK_MAIN();
