@@ -1,4 +1,5 @@
 #include <QLabel>
+#include <QLocale>
 #include <QMenu>
 #include <QPushButton>
 #include <QScrollArea>
@@ -205,6 +206,24 @@ TEST_F(MainWindow, UndoGivesThePictureItsFormerDisplaySize) {
   EXPECT_EQ(image1->size(), QSize(60, 30));
 }
 
+TEST_F(MainWindow, UndoSizesThePictureByTheZoomLabel) {
+  // The label shows the zoom rounded to one decimal in the user's locale; Undo and Redo read
+  // it back from there, while Renew uses the zoom itself.
+  const QLocale previous;
+  QLocale::setDefault(QLocale(QLocale::German));
+  auto* image1 = Main().findChild<PictureView*>("Image1");
+  ASSERT_TRUE(Main().ApplyEffect(Gives(Flat(30, 20, 1)), {}, "Changed", true));
+  MainChild<QLabel>("Label5")->setText("41,0%");
+  EXPECT_EQ(Main().ZoomFromLabel(), 41.0);
+  Main().SpeedButton3Click();
+  EXPECT_EQ(image1->size(), QSize(10, 7));  // Round(24 * 0.41), Round(16 * 0.41)
+  Main().SpeedButton18Click();
+  EXPECT_EQ(image1->size(), QSize(12, 8));
+  Main().SpeedButton7Click();
+  EXPECT_EQ(image1->size(), QSize(24, 16));
+  QLocale::setDefault(previous);
+}
+
 TEST_F(MainWindow, RenewReturnsToTheOpenedPictureAndResetsTheHistory) {
   const TBitmap32 opened = Main().Document().Opened();
   ASSERT_TRUE(Main().ApplyEffect(Gives(Flat(30, 10, 5)), {}, "Changed", true));
@@ -269,6 +288,31 @@ TEST_F(MainWindow, DisplayImageFitsThumbnailsIntoTheirSquare) {
   }
   // An empty picture gets an empty control instead of a division by zero.
   EXPECT_EQ(TMyPicture::DisplayImageGeometry(0, 0).size(), QSize(0, 0));
+}
+
+}  // namespace
+}  // namespace quillane
+
+namespace quillane {
+namespace {
+
+TEST(PictureViewPainting, StretchesTheWholePictureOpaque) {
+  Application();
+  TBitmap32 picture(2, 1);
+  picture.At(0, 0) = Pixel{10, 20, 30, 0};  // fully transparent, still shown
+  picture.At(1, 0) = Pixel{200, 100, 50, 128};
+  PictureView view;
+  view.SetPicture(picture);
+  EXPECT_EQ(view.PictureSize(), QSize(2, 1));
+  view.resize(4, 2);
+  const QImage shown = view.grab().toImage();
+  ASSERT_EQ(shown.size(), QSize(4, 2));
+  for (int y = 0; y < 2; ++y) {
+    EXPECT_EQ(shown.pixel(0, y), qRgb(30, 20, 10));
+    EXPECT_EQ(shown.pixel(1, y), qRgb(30, 20, 10));
+    EXPECT_EQ(shown.pixel(2, y), qRgb(50, 100, 200));
+    EXPECT_EQ(shown.pixel(3, y), qRgb(50, 100, 200));
+  }
 }
 
 }  // namespace
