@@ -26,6 +26,7 @@ class PreviewLabel : public QLabel {
     setFixedSize(kSide + 8, kSide + 8);
     setAlignment(Qt::AlignCenter);
     setFrameShape(QFrame::StyledPanel);
+    setText(tr("(None)"));
   }
 
   void ShowFile(const QString& path) {
