@@ -59,10 +59,7 @@ test-asan: deps
 
 # libFuzzer targets for every decoder, built with clang, each run for FUZZ_SECONDS.
 fuzz: deps
-	CC=clang CXX=clang++ cmake -S . -B $(FUZZ_BUILD) -DCMAKE_BUILD_TYPE=RelWithDebInfo \
-	  -DQUILLANE_FUZZ=ON -DQUILLANE_GUI=OFF -DQUILLANE_BENCH=OFF
-	cmake --build $(FUZZ_BUILD) -j $(JOBS)
-	fuzz/run.sh $(FUZZ_BUILD) $(FUZZ_SECONDS)
+	fuzz/run.sh $(FUZZ_SECONDS) $(CURDIR)/$(FUZZ_BUILD)
 
 bench: build
 	@for b in $(BUILD)/bench/*_bench; do echo "== $$b"; $$b; done
