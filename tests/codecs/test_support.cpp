@@ -87,7 +87,8 @@ std::vector<std::uint8_t> BmpFile(const std::vector<std::uint8_t>& infoHeader,
                                   const std::vector<std::uint8_t>& bits) {
   const std::uint32_t offset = static_cast<std::uint32_t>(14 + infoHeader.size() + palette.size());
   ByteWriter w;
-  w.Text("BM").U32(offset + static_cast<std::uint32_t>(bits.size())).U32(0).U32(offset);
+  w.bytes.reserve(offset + bits.size());
+  w.U8('B').U8('M').U32(offset + static_cast<std::uint32_t>(bits.size())).U32(0).U32(offset);
   w.Append(infoHeader).Append(palette).Append(bits);
   return w.bytes;
 }
