@@ -1,45 +1,113 @@
 #include "imaging/tone.h"
 
+#include <algorithm>
+#include <array>
+#include <bit>
 #include <cmath>
 #include <cstdlib>
+#include <cstring>
 
 #include "imaging/numeric.h"
 #include "imaging/parallel.h"
 
 namespace quillane {
+namespace {
 
-Hsl RgbToHsl(int red, int green, int blue) {
+// The conversion's fractions, in double exactly as the formulas state them.
+struct HslFractions {
+  double h = 0;
+  double s = 0;
+  double l = 0;
+};
+
+HslFractions Fractions(int red, int green, int blue) {
   const double r = red / 255.0;
   const double g = green / 255.0;
   const double b = blue / 255.0;
   const double mx = std::max(r, std::max(g, b));
   const double mn = std::min(r, std::min(g, b));
-  const double l = (mx + mn) / 2;
-  double h = 0;
-  double s = 0;
+  HslFractions f;
+  f.l = (mx + mn) / 2;
   if (mx != mn) {
     const double d = mx - mn;
-    s = l < 0.5 ? d / (mx + mn) : d / (2 - mx - mn);
+    f.s = f.l < 0.5 ? d / (mx + mn) : d / (2 - mx - mn);
     if (r == mx)
-      h = (g - b) / d;
+      f.h = (g - b) / d;
     else if (g == mx)
-      h = 2 + (b - r) / d;
+      f.h = 2 + (b - r) / d;
     else
-      h = 4 + (r - g) / d;
-    h = h / 6;
-    if (h < 0) h = h + 1;
+      f.h = 4 + (r - g) / d;
+    f.h = f.h / 6;
+    if (f.h < 0) f.h = f.h + 1;
   }
+  return f;
+}
+
+Hsl PlainRgbToHsl(int r, int g, int b) {
+  const HslFractions f = Fractions(r, g, b);
   Hsl out;
-  out.h = Round(static_cast<Extended>(h) * 360);
+  out.h = Round(static_cast<Extended>(f.h) * 360);
   if (out.h == 360) out.h = 0;
-  out.s = Round(static_cast<Extended>(s) * 100);
-  out.l = Round(static_cast<Extended>(l) * 100);
+  out.s = Round(static_cast<Extended>(f.s) * 100);
+  out.l = Round(static_cast<Extended>(f.l) * 100);
   return out;
 }
 
-Rgb HslToRgb(int h, int s, int l) {
-  if (h < 0 || h > 359 || s < 0 || s > 100 || l < 0 || l > 100) return Rgb{};
-  // Every ramp value H * 4.25 is exact in binary, so these rounds see true halves.
+// Round of a value v known to lie strictly between k and k + 1: the same answer as Round,
+// without changing the floating-point environment.
+int RoundBetween(Extended v, int k) {
+  const Extended half = k + 0.5L;
+  return v > half ? k + 1 : (v < half ? k : k + (k & 1));
+}
+
+// Round(num / den) for whole numbers num >= 0 and den > 0, where the quotient stands for a
+// value that the conversion forms in floating point. Away from an exact half the
+// floating-point value lies far closer to the true quotient (within 1e-12) than the quotient
+// lies to a half (at least 1 / (2 den)), so both round alike. At an exact half the rounding
+// errors of the floating-point value decide, so that value is formed and rounded as the
+// formula does it.
+template <typename FloatingValue>
+int RoundQuotient(int num, int den, FloatingValue&& floatingValue) {
+  const int k = num / den;
+  const int twiceRest = 2 * (num - k * den);
+  if (twiceRest != den) return twiceRest < den ? k : k + 1;
+  return RoundBetween(floatingValue(), k);
+}
+
+// RGB to HSL for channels 0..255 in integer arithmetic, identical to the floating-point
+// formulas (checked for every colour in the tests).
+inline Hsl FastRgbToHsl(int r, int g, int b) {
+  const int mx = std::max(r, std::max(g, b));
+  const int mn = std::min(r, std::min(g, b));
+  Hsl out;
+  // l * 100 = (mx + mn) * 100 / 510 is never an exact half (20 (mx + mn) would have to equal
+  // an odd multiple of 51), so it rounds to nearest plainly.
+  out.l = ((mx + mn) * 200 + 510) / 1020;
+  if (mx == mn) return out;
+  const int d = mx - mn;
+  // Below l = 0.5 the saturation is d / (mx + mn), from it d / (510 - mx - mn) (in 255ths);
+  // at mx + mn = 255 both are the same.
+  const int sum = mx + mn;
+  out.s = RoundQuotient(100 * d, sum < 255 ? sum : 510 - sum,
+                        [&] { return static_cast<Extended>(Fractions(r, g, b).s) * 100; });
+  // Hue in degrees: 60 (g - b) / d, 120 + 60 (b - r) / d or 240 + 60 (r - g) / d by the
+  // largest channel (red before green before blue), a negative one taken a turn round.
+  int num;
+  if (r == mx) {
+    num = 60 * (g - b);
+    if (num < 0) num += 360 * d;
+  } else if (g == mx) {
+    num = 120 * d + 60 * (b - r);
+  } else {
+    num = 240 * d + 60 * (r - g);
+  }
+  out.h = RoundQuotient(num, d, [&] { return static_cast<Extended>(Fractions(r, g, b).h) * 360; });
+  if (out.h == 360) out.h = 0;
+  return out;
+}
+
+// The three steps of HSL to RGB, each exactly as the formula states it.
+int PureHueChannel(int h, int channel) {
   const auto ramp = [](int steps) { return Round(static_cast<Extended>(steps) * 4.25L); };
   const auto down = [](int steps) { return Round(255 - static_cast<Extended>(steps) * 4.25L); };
   int c[3];  // r, g, b
@@ -56,15 +124,115 @@ Rgb HslToRgb(int h, int s, int l) {
   } else {
     c[0] = 255, c[1] = 0, c[2] = down(h - 300);
   }
+  return c[channel];
+}
+
+int SaturationBlend(int x, int s) {
   const double f = std::abs(s - 100) / 100.0;
-  for (int& x : c) x = Round(x - static_cast<Extended>(x - 128) * f);
+  return Round(x - static_cast<Extended>(x - 128) * f);
+}
+
+int LightnessBlend(int x, int l) {
   const double t = (l - 50) / 50.0;
-  if (t > 0) {
-    for (int& x : c) x = Round(x + static_cast<Extended>(255 - x) * t);
-  } else if (t < 0) {
-    for (int& x : c) x = Round(x + static_cast<Extended>(x) * t);
+  if (t > 0) return Round(x + static_cast<Extended>(255 - x) * t);
+  if (t < 0) return Round(x + static_cast<Extended>(x) * t);
+  return x;
+}
+
+// HSL to RGB works on each channel alone: a pure hue value by H, blended by S, then by L. Each
+// step is a table of its two inputs, built once from the formulas above.
+struct HslTables {
+  std::uint8_t hue[360][3];
+  std::uint8_t saturation[101][256];
+  std::uint8_t lightness[101][256];
+};
+
+const HslTables& Tables() {
+  static const HslTables tables = [] {
+    HslTables t{};
+    for (int h = 0; h < 360; ++h)
+      for (int c = 0; c < 3; ++c) t.hue[h][c] = static_cast<std::uint8_t>(PureHueChannel(h, c));
+    for (int v = 0; v <= 100; ++v)
+      for (int x = 0; x < 256; ++x) {
+        t.saturation[v][x] = static_cast<std::uint8_t>(SaturationBlend(x, v));
+        t.lightness[v][x] = static_cast<std::uint8_t>(LightnessBlend(x, v));
+      }
+    return t;
+  }();
+  return tables;
+}
+
+inline Rgb TableHslToRgb(const HslTables& t, int h, int s, int l) {
+  const std::uint8_t* hue = t.hue[h];
+  const std::uint8_t* sat = t.saturation[s];
+  const std::uint8_t* light = t.lightness[l];
+  return Rgb{light[sat[hue[0]]], light[sat[hue[1]]], light[sat[hue[2]]]};
+}
+
+// Gray value in integers: 100 times the weighted sum is 30 R + 59 G + 11 B exactly. Away from
+// an exact half the extended-precision sum (within 1e-15 of it) rounds the same way; at an
+// exact half its rounding errors decide, so it is formed as GrayValue forms it. Identical to
+// GrayValue for every colour (checked for all of them in the tests).
+inline std::uint8_t FastGrayValue(int r, int g, int b) {
+  const int n = 30 * r + 59 * g + 11 * b;
+  const int k = n / 100;
+  const int rest = n - 100 * k;
+  if (rest != 50) return static_cast<std::uint8_t>(rest < 50 ? k : k + 1);
+  return static_cast<std::uint8_t>(RoundBetween(0.3L * r + 0.59L * g + 0.11L * b, k));
+}
+
+// Gray rows: each pixel's gray value plus shift, limited to 0..255, in B, G and R, alpha 255.
+// Pixels are taken as little-endian words 0xAARRGGBB in chunks, in 16-bit arithmetic, so that
+// the compiler can work on several at once; exact halves, which need the extended-precision
+// sum, are marked and redone one by one afterwards. in and out may be the same row.
+void GrayRow(const Pixel* in, Pixel* out, int w, int shift) {
+  static_assert(std::endian::native == std::endian::little, "pixels are read as 0xAARRGGBB");
+  constexpr int kChunk = 128;
+  std::uint32_t src[kChunk];
+  std::uint32_t dst[kChunk];
+  std::uint8_t half[kChunk];
+  for (int x0 = 0; x0 < w; x0 += kChunk) {
+    const int n = std::min(kChunk, w - x0);
+    std::memcpy(src, in + x0, static_cast<std::size_t>(n) * sizeof(Pixel));
+    std::uint8_t anyHalf = 0;
+    for (int i = 0; i < n; ++i) {
+      const std::uint32_t p = src[i];
+      const auto sum = static_cast<std::uint16_t>(30 * ((p >> 16) & 0xFF) + 59 * ((p >> 8) & 0xFF) +
+                                                  11 * (p & 0xFF));
+      // sum / 100 for every sum up to 25500.
+      const auto k = static_cast<std::uint16_t>((static_cast<std::uint32_t>(sum) * 5243u) >> 19);
+      const auto rest = static_cast<std::uint16_t>(sum - 100 * k);
+      half[i] = rest == 50;
+      anyHalf |= half[i];
+      const int level = std::clamp(k + (rest > 50) + shift, 0, 255);
+      dst[i] = static_cast<std::uint32_t>(level) * 0x010101u | 0xFF000000u;
+    }
+    if (anyHalf) {
+      for (int i = 0; i < n; ++i) {
+        if (!half[i]) continue;
+        const int r = (src[i] >> 16) & 0xFF, g = (src[i] >> 8) & 0xFF, b = src[i] & 0xFF;
+        const int level = std::clamp(FastGrayValue(r, g, b) + shift, 0, 255);
+        dst[i] = static_cast<std::uint32_t>(level) * 0x010101u | 0xFF000000u;
+      }
+    }
+    std::memcpy(out + x0, dst, static_cast<std::size_t>(n) * sizeof(Pixel));
   }
-  return Rgb{c[0], c[1], c[2]};
+}
+
+bool IsByte(int v) {
+  return (v & ~0xFF) == 0;
+}
+
+}  // namespace
+
+Hsl RgbToHsl(int r, int g, int b) {
+  if (!IsByte(r) || !IsByte(g) || !IsByte(b)) return PlainRgbToHsl(r, g, b);
+  return FastRgbToHsl(r, g, b);
+}
+
+Rgb HslToRgb(int h, int s, int l) {
+  if (h < 0 || h > 359 || s < 0 || s > 100 || l < 0 || l > 100) return Rgb{};
+  return TableHslToRgb(Tables(), h, s, l);
 }
 
 int LightnessContrast(int l, int c) {
@@ -83,8 +251,8 @@ int LightnessContrast(int l, int c) {
 
 std::array<std::uint8_t, 101> LightnessContrastTable(int c) {
   std::array<std::uint8_t, 101> table{};
-  for (int l = 0; l <= 100; ++l) table[static_cast<std::size_t>(l)] =
-      static_cast<std::uint8_t>(LightnessContrast(l, c));
+  for (int l = 0; l <= 100; ++l)
+    table[static_cast<std::size_t>(l)] = static_cast<std::uint8_t>(LightnessContrast(l, c));
   return table;
 }
 
@@ -96,26 +264,26 @@ TBitmap32 PencilContrastPass(const TBitmap32& input, int c) {
   std::array<std::uint8_t, 256> grayLevel{};
   for (int v = 0; v < 256; ++v) {
     const Hsl hsl = RgbToHsl(v, v, v);
-    grayLevel[static_cast<std::size_t>(v)] = static_cast<std::uint8_t>(
-        HslToRgb(hsl.h, hsl.s, curve[static_cast<std::size_t>(hsl.l)]).r);
+    grayLevel[static_cast<std::size_t>(v)] =
+        static_cast<std::uint8_t>(HslToRgb(hsl.h, hsl.s, curve[static_cast<std::size_t>(hsl.l)]).r);
   }
+  const HslTables& tables = Tables();
   const int w = out.Width();
   ParallelRows(0, out.Height(), static_cast<std::size_t>(w) * 4, [&](int y0, int y1) {
     for (int y = y0; y < y1; ++y) {
       Pixel* row = out.ScanLine(y);
       for (int x = 0; x < w; ++x) {
-        Pixel& p = row[x];
+        const Pixel p = row[x];
         if (p.r == p.g && p.g == p.b) {
           const std::uint8_t v = grayLevel[p.r];
-          p.b = p.g = p.r = v;
+          row[x] = Pixel{v, v, v, 255};
         } else {
-          const Hsl hsl = RgbToHsl(p.r, p.g, p.b);
-          const Rgb rgb = HslToRgb(hsl.h, hsl.s, curve[static_cast<std::size_t>(hsl.l)]);
-          p.r = static_cast<std::uint8_t>(rgb.r);
-          p.g = static_cast<std::uint8_t>(rgb.g);
-          p.b = static_cast<std::uint8_t>(rgb.b);
+          const Hsl hsl = FastRgbToHsl(p.r, p.g, p.b);
+          const Rgb rgb =
+              TableHslToRgb(tables, hsl.h, hsl.s, curve[static_cast<std::size_t>(hsl.l)]);
+          row[x] = Pixel{static_cast<std::uint8_t>(rgb.b), static_cast<std::uint8_t>(rgb.g),
+                         static_cast<std::uint8_t>(rgb.r), 255};
         }
-        p.a = 255;
       }
     }
   });
@@ -124,26 +292,18 @@ TBitmap32 PencilContrastPass(const TBitmap32& input, int c) {
 
 TBitmap32 PencilLightingPass(const TBitmap32& input, int v) {
   TBitmap32 out = input;
+  const int w = out.Width();
   const int shift = 2 * (v - 128);
-  Pixel* p = out.Data();
-  const std::size_t n = out.PixelCount();
-  for (std::size_t i = 0; i < n; ++i) {
-    const std::uint8_t y = static_cast<std::uint8_t>(ClampByte(GrayValue(p[i].r, p[i].g, p[i].b) + shift));
-    p[i] = Pixel{y, y, y, 255};
-  }
+  ParallelRows(0, out.Height(), static_cast<std::size_t>(w), [&](int y0, int y1) {
+    for (int y = y0; y < y1; ++y) GrayRow(out.ScanLine(y), out.ScanLine(y), w, shift);
+  });
   return out;
 }
 
 void ConvertToGray(TBitmap32& bitmap) {
   const int w = bitmap.Width();
   ParallelRows(0, bitmap.Height(), static_cast<std::size_t>(w), [&](int y0, int y1) {
-    for (int y = y0; y < y1; ++y) {
-      Pixel* row = bitmap.ScanLine(y);
-      for (int x = 0; x < w; ++x) {
-        const std::uint8_t g = GrayValue(row[x].r, row[x].g, row[x].b);
-        row[x] = Pixel{g, g, g, 255};
-      }
-    }
+    for (int y = y0; y < y1; ++y) GrayRow(bitmap.ScanLine(y), bitmap.ScanLine(y), w, 0);
   });
 }
 
