@@ -8,6 +8,7 @@
 #include <libwmf/gd.h>
 // clang-format on
 
+#include <algorithm>
 #include <chrono>
 #include <cmath>
 
@@ -37,9 +38,10 @@ bool StandardHeaderAt(Bytes data, std::size_t at) {
 }
 
 // Walks the records so that a file whose record sizes run past its end is refused here
-// rather than left to the player.
-void CheckRecords(Bytes data, std::size_t at) {
+// rather than left to the player. Returns the size of the largest record in words.
+std::uint32_t CheckRecords(Bytes data, std::size_t at) {
   at += kStandardHeaderSize;
+  std::uint32_t largest = 0;
   while (true) {
     if (data.size() - at < 6) throw PictureFileError("The metafile ends inside a record");
     const std::uint64_t words = ReadDword(data, at);
@@ -47,7 +49,8 @@ void CheckRecords(Bytes data, std::size_t at) {
     if (words < 3 || words * 2 > data.size() - at) {
       throw PictureFileError("The metafile has a record of a bad size");
     }
-    if (function == 0) return;  // META_EOF
+    largest = std::max(largest, static_cast<std::uint32_t>(words));
+    if (function == 0) return largest;  // META_EOF
     at += static_cast<std::size_t>(words * 2);
   }
 }
@@ -120,10 +123,19 @@ TBitmap32 DecodeWindowsMetafile(Bytes data, std::int64_t maxPixels) {
     throw PictureFileError("The file is not a Windows metafile");
   }
   if (data.size() > 0x7FFFFFFF) throw PictureFileError("The metafile is too large");
-  CheckRecords(data, header);
+  // The player sizes its record buffer from the header's largest-record field; a made-up
+  // value there would have it allocate gigabytes (or too little). The true value is known
+  // from the walk, so the player gets a copy of the file carrying it.
+  const std::uint32_t largest = CheckRecords(data, header);
+  std::vector<std::uint8_t> file(data.begin(), data.end());
+  const std::size_t largestField = header + 12;
+  for (int i = 0; i < 4; ++i) {
+    file[largestField + static_cast<std::size_t>(i)] =
+        static_cast<std::uint8_t>(largest >> (8 * i));
+  }
 
   WmfApi api;
-  api.Open(data);
+  api.Open(file);
   Playback playback;
   playback.deadline = std::chrono::steady_clock::now() + std::chrono::seconds(20);
   wmf_status_function(api.get(), &playback, Status);

@@ -70,6 +70,18 @@ TEST(WindowsMetafile, RefusesDamagedAndHugeFiles) {
   EXPECT_THROW(DecodeMetafile(huge), PictureFileError);
 }
 
+// The header's largest-record field sizes the player's buffer: a made-up value must neither
+// make it allocate gigabytes nor leave it a buffer too small for the real records.
+TEST(WindowsMetafile, MadeUpLargestRecordFieldIsCorrected) {
+  for (std::uint32_t claimed : {0xFFFFFFFFu, 0x6110001Du, 3u, 0u}) {
+    std::vector<std::uint8_t> file = WmfWithRectangle();
+    for (int i = 0; i < 4; ++i) file[22 + 12 + i] = static_cast<std::uint8_t>(claimed >> (8 * i));
+    const TBitmap32 p = DecodeMetafile(file);
+    EXPECT_EQ(p.At(20, 15), kRed) << claimed;
+    EXPECT_EQ(p.At(2, 2), kWhite) << claimed;
+  }
+}
+
 // An enhanced metafile for a 96 dpi reference device whose frame is width x height pixels,
 // with the given records between header and end.
 std::vector<std::uint8_t> Emf(int width, int height, const std::vector<std::uint8_t>& records) {
