@@ -29,8 +29,8 @@ void InvertedResponseRow(const std::uint8_t* __restrict above, const std::uint8_
   for (int i = 4; i < bytes - 4; ++i) {
     const auto left = static_cast<std::int16_t>(above[i - 4] + row[i - 4] + below[i - 4]);
     const auto right = static_cast<std::int16_t>(above[i + 4] + row[i + 4] + below[i + 4]);
-    const auto outer = static_cast<std::int16_t>(left + right + above[i] + below[i] - row[i - 4] -
-                                                 row[i + 4]);
+    const auto outer =
+        static_cast<std::int16_t>(left + right + above[i] + below[i] - row[i - 4] - row[i + 4]);
     const auto a = static_cast<std::int16_t>(6 * row[i] - outer);
     const auto b = static_cast<std::int16_t>(left - right);
     const std::int16_t m = std::max(a, b);
