@@ -1,0 +1,60 @@
+#include "batch/batch_convert_ok.h"
+
+#include <QHBoxLayout>
+#include <QLabel>
+#include <QToolButton>
+#include <QVBoxLayout>
+#include <utility>
+
+#include "app/platform.h"
+
+namespace quillane {
+
+TBatchConvertOk::TBatchConvertOk(PlatformServices& platform, std::function<QString()> outputFolder,
+                                 QWidget* parent)
+    : QDialog(parent, Qt::Dialog | Qt::WindowStaysOnTopHint | Qt::CustomizeWindowHint |
+                          Qt::WindowTitleHint | Qt::WindowCloseButtonHint),
+      platform_(platform),
+      outputFolder_(std::move(outputFolder)) {
+  setObjectName("TBatchConvertOk");
+  setWindowTitle("BatchConvertOk");
+  setModal(false);
+
+  auto* layout = new QVBoxLayout(this);
+  layout->setContentsMargins(16, 16, 16, 12);
+  layout->setSpacing(14);
+
+  auto* text = new QLabel("The batch convert is successful.", this);
+  text->setObjectName("Label1");
+  text->setAlignment(Qt::AlignCenter);
+  layout->addWidget(text);
+
+  auto* row = new QHBoxLayout;
+  row->setSpacing(10);
+  auto addButton = [&](const char* name, const char* caption) {
+    auto* button = new QToolButton(this);
+    button->setObjectName(name);
+    button->setText(caption);
+    button->setMinimumWidth(110);
+    row->addWidget(button);
+    return button;
+  };
+  connect(addButton("SpeedButton1", "Close"), &QToolButton::clicked, this,
+          &TBatchConvertOk::SpeedButton1Click);
+  connect(addButton("SpeedButton2", "Go Output Folder"), &QToolButton::clicked, this,
+          &TBatchConvertOk::SpeedButton2Click);
+  layout->addLayout(row);
+
+  setFixedSize(sizeHint().expandedTo(QSize(260, 100)));
+}
+
+void TBatchConvertOk::SpeedButton1Click() {
+  close();
+}
+
+void TBatchConvertOk::SpeedButton2Click() {
+  platform_.OpenFolder(outputFolder_ ? outputFolder_() : QString());
+  close();
+}
+
+}  // namespace quillane
