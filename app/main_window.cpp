@@ -2,7 +2,9 @@
 
 #include <QAction>
 #include <QCloseEvent>
+#include <QFile>
 #include <QLabel>
+#include <QListWidget>
 #include <QLocale>
 #include <QMenu>
 #include <QMenuBar>
@@ -13,11 +15,16 @@
 #include <QToolButton>
 #include <exception>
 #include <iterator>
+#include <optional>
+#include <string>
 
 #include "app/glyphs.h"
 #include "app/picture_view.h"
 #include "app/platform.h"
 #include "app/tool_window.h"
+#include "batch/batch_convert.h"
+#include "batch/batch_convert_ok.h"
+#include "codecs/picture_file.h"
 #include "data/startup_picture.h"
 #include "imaging/numeric.h"
 
@@ -30,6 +37,19 @@ constexpr int kBandGrip = 11;  // room left of each toolbar band for its grip
 constexpr int kButtonSide = 25;
 const QColor kStatusGray(128, 128, 128);
 const QColor kScrollBoxBackground(96, 100, 106);
+
+// Pairs of displayed name and mask. Icons load through "All files" though no filter lists them.
+const QString kOpenFilter =
+    "*.jpg|*.jpg|*.jpeg|*.jpeg|*.bmp|*.bmp|*.wmf|*.wmf|*.emf|*.emf|*.gif|*.gif|All files|*.*";
+const QString kSaveFilter = "*.jpg|*.jpg|*.bmp|*.bmp|*.wmf|*.wmf";
+
+// File names cross between Qt and the codecs in the file system's own encoding.
+std::string LocalPath(const QString& path) {
+  return QFile::encodeName(path).toStdString();
+}
+QString FromLocalPath(const std::string& path) {
+  return QFile::decodeName(QByteArray::fromStdString(path));
+}
 
 // The toolbar strip: bands (the panels inside it), each with a grip drawn to its left.
 class ControlBar : public QFrame {
@@ -98,6 +118,15 @@ TMyPicture::TMyPicture(PlatformServices& platform, TBitmap32 picture)
   upArrow_->setObjectName("uu");
   upArrow_->setIcon(GlyphIcon(Glyph::ArrowUp));
   panel1->hide();
+
+  // The batch file list: filled by the input-folder Browse, read by Convert, never shown.
+  listView1_ = new QListWidget(central);
+  listView1_->setObjectName("ListView1");
+  listView1_->hide();
+
+  batchConvertOk_ = new TBatchConvertOk(
+      platform_, [this] { return outputFolder_; }, this);
+  batchConvertOk_->hide();
 
   ShowWorking(zoomPercent_);
   UpdateHistoryControls();
@@ -305,6 +334,10 @@ double TMyPicture::ZoomFromLabel() const {
 
 void TMyPicture::ShowNewPicture(TBitmap32 picture, bool resetHistory) {
   document_.Load(std::move(picture));
+  ShowLoadedPicture(resetHistory);
+}
+
+void TMyPicture::ShowLoadedPicture(bool resetHistory) {
   if (resetHistory) document_.ResetHistory();
   ShowWorking(zoomPercent_);
   scrollBox_->horizontalScrollBar()->setValue(0);
@@ -367,10 +400,52 @@ void TMyPicture::SpeedButton7Click() {
   UpdateHistoryControls();
 }
 
-// Opening and saving files arrive with the picture codecs; until then the commands are there
-// and do nothing.
-void TMyPicture::SpeedButton1Click() {}
-void TMyPicture::SpeedButton2Click() {}
+void TMyPicture::SpeedButton1Click() {
+  closetool();
+  const std::optional<FileChoice> choice = platform_.OpenPictureDialog(kOpenFilter);
+  if (!choice) return;
+
+  // Decoded once into a bitmap of its own: a file that cannot be read leaves the document as
+  // it was.
+  std::optional<TBitmap32> picture;
+  try {
+    picture = LoadPictureFile(
+        LocalPath(choice->path), [this](const std::string& caption, const std::string& text) {
+          platform_.ShowMessage(QString::fromStdString(caption), QString::fromStdString(text));
+        });
+  } catch (const std::exception& e) {
+    platform_.ShowError(QString::fromStdString(e.what()));
+    return;
+  }
+  if (!picture || picture->Empty()) {
+    platform_.ShowMessage("Sorry", choice->path + " is not a valid format");
+    return;
+  }
+  ShowNewPicture(std::move(*picture), true);
+}
+
+void TMyPicture::SpeedButton2Click() {
+  const std::optional<FileChoice> choice = platform_.SavePictureDialog(kSaveFilter);
+  if (!choice) return;
+  const std::string name = LocalPath(choice->path);
+  // The writers replace an existing file only once the new one is complete, so a failed save
+  // keeps what was there.
+  try {
+    switch (choice->filterIndex) {
+      case 2:
+        SaveBitmap24(document_.Working(), ReplaceExtension(name, ".bmp"));
+        break;
+      case 3:
+        SaveMetafile(document_.Working(), ReplaceExtension(name, ".wmf"));
+        break;
+      default:  // 1, and whatever a dialog gives that is not one of the three types
+        SaveJpeg(document_.Working(), ReplaceExtension(name, ".jpg"), 90);
+        break;
+    }
+  } catch (const std::exception& e) {
+    platform_.ShowError(QString::fromStdString(e.what()));
+  }
+}
 
 QString TMyPicture::StatusText() const {
   return statusLine_->text();
@@ -440,6 +515,9 @@ void TMyPicture::OpenDir() {
       platform_.BrowseFolder("Open a directory to input pictures to convert.", inputFolder_);
   if (!folder) return;
   inputFolder_ = *folder;
+  listView1_->clear();
+  for (const std::string& name : ScanBatchFolder(LocalPath(inputFolder_)))
+    listView1_->addItem(FromLocalPath(name));
 }
 
 void TMyPicture::OpenDir2() {
@@ -448,6 +526,82 @@ void TMyPicture::OpenDir2() {
       platform_.BrowseFolder("Open a directory to output pictures.", inputFolder_);
   if (!folder) return;
   outputFolder_ = *folder;
+}
+
+QStringList TMyPicture::BatchFiles() const {
+  QStringList names;
+  for (int i = 0; i < listView1_->count(); ++i) names << listView1_->item(i)->text();
+  return names;
+}
+
+BatchResult TMyPicture::ConvertBatchFolder(const EffectSpec& effect, const EffectParams& params,
+                                           const QString& inputField, const QString& outputField,
+                                           const std::function<void()>& afterEffect) {
+  BatchJob job;
+  job.inputFolder = TrimBlanks(LocalPath(inputField));
+  job.outputFolder = TrimBlanks(LocalPath(outputField));
+  for (const QString& name : BatchFiles()) job.files.push_back(LocalPath(name));
+  inputFolder_ = FromLocalPath(job.inputFolder);
+
+  BatchObserver observer;
+  observer.message = [this](const std::string& caption, const std::string& text) {
+    platform_.ShowMessage(QString::fromStdString(caption), QString::fromStdString(text));
+  };
+  // The loop blocks the event loop; repaint() draws the window at once, so the user sees each
+  // picture as it is loaded and converted without any input getting through meanwhile.
+  observer.progress = [this](const BatchProgress& progress) {
+    switch (progress.step) {
+      case BatchProgress::Step::Loading:
+        statusBar()->showMessage(QStringLiteral("Converting picture %1 of %2: %3")
+                                     .arg(progress.index)
+                                     .arg(progress.count)
+                                     .arg(FromLocalPath(progress.name)));
+        break;
+      case BatchProgress::Step::Loaded:
+        ShowLoadedPicture(false);
+        repaint();
+        break;
+      case BatchProgress::Step::Converted:
+        ShowWorking(zoomPercent_);
+        UpdateHistoryControls();
+        repaint();
+        break;
+      case BatchProgress::Step::Written:
+      case BatchProgress::Step::Skipped:
+        break;
+    }
+  };
+  observer.afterEffect = [&afterEffect](const BatchProgress&, const PictureDocument&) {
+    if (afterEffect) afterEffect();
+  };
+
+  BatchResult result;
+  try {
+    result = ConvertBatch(document_, effect, params, job, observer);
+  } catch (const std::exception& e) {
+    result.end = BatchResult::End::Stopped;
+    result.error = e.what();
+  }
+  statusBar()->clearMessage();
+  // A loop that stopped half-way may have loaded a picture it never showed converted.
+  ShowWorking(zoomPercent_);
+  UpdateHistoryControls();
+  // The output folder is taken from its field only once the input has been accepted.
+  if (result.end != BatchResult::End::Refused) outputFolder_ = FromLocalPath(job.outputFolder);
+
+  if (!result.skipped.empty()) {
+    QString text = "These pictures were skipped and have no output file:";
+    for (const BatchSkipped& skipped : result.skipped) text += "\n" + FromLocalPath(skipped.reason);
+    platform_.ShowMessage("Sorry", text);
+  }
+  if (result.end == BatchResult::End::Stopped) platform_.ShowError(FromLocalPath(result.error));
+  return result;
+}
+
+void TMyPicture::ShowBatchConvertOk() {
+  batchConvertOk_->show();
+  batchConvertOk_->raise();
+  batchConvertOk_->activateWindow();
 }
 
 }  // namespace quillane

@@ -6,6 +6,8 @@
 #include <QMainWindow>
 #include <QRect>
 #include <QString>
+#include <QStringList>
+#include <functional>
 #include <vector>
 
 #include "app/document.h"
@@ -17,12 +19,15 @@ class QMenu;
 class QScrollArea;
 class QToolButton;
 class QFrame;
+class QListWidget;
 
 namespace quillane {
 
 class PictureView;
 class PlatformServices;
+class TBatchConvertOk;
 class ToolWindow;
+struct BatchResult;
 
 class TMyPicture : public QMainWindow {
   Q_OBJECT
@@ -89,9 +94,26 @@ class TMyPicture : public QMainWindow {
   QString OutputFolder() const { return outputFolder_; }
   void SetInputFolder(const QString& folder) { inputFolder_ = folder; }
   void SetOutputFolder(const QString& folder) { outputFolder_ = folder; }
-  // The batch panels' Browse buttons: choose the input or output folder.
+  // The batch panels' Browse buttons: choose the input or output folder. Choosing the input
+  // folder also lists its pictures in the batch file list.
   void OpenDir();
   void OpenDir2();
+  // The batch file list (the hidden ListView1): bare file names, as the last input-folder
+  // Browse found them.
+  QStringList BatchFiles() const;
+
+  // The Convert button of a batch panel: runs effect with params over every listed file, looked
+  // for in the folder typed in inputField, writing into the folder typed in outputField (both
+  // become the shared folders). Each loaded picture is shown and the progress is written in
+  // the status bar while the loop runs; afterEffect runs after each picture's effect (the
+  // window's own steps). "Sorry" messages, the list of skipped files and the error that stopped
+  // the loop are shown here; the completion dialog is left to the caller.
+  BatchResult ConvertBatchFolder(const EffectSpec& effect, const EffectParams& params,
+                                 const QString& inputField, const QString& outputField,
+                                 const std::function<void()>& afterEffect);
+  // The dialog a finished batch conversion shows; created hidden with the main window.
+  TBatchConvertOk& BatchConvertOk() { return *batchConvertOk_; }
+  void ShowBatchConvertOk();
 
   bool LineArt() const { return lineArt_; }
   void SetLineArt(bool on) { lineArt_ = on; }
@@ -119,6 +141,8 @@ class TMyPicture : public QMainWindow {
   QToolButton* AddSpeedButton(QWidget* panel, const char* name, const QString& hint, int x);
   // Image1 shows the working picture again, at the display size of zoom.
   void ShowWorking(double zoom);
+  // Shows a picture the document has just loaded from the top-left corner, at the current zoom.
+  void ShowLoadedPicture(bool resetHistory);
   void UpdateHistoryControls();
 
   PlatformServices& platform_;
@@ -144,6 +168,8 @@ class TMyPicture : public QMainWindow {
   QAction* redoAction_ = nullptr;
   QToolButton* downArrow_ = nullptr;
   QToolButton* upArrow_ = nullptr;
+  QListWidget* listView1_ = nullptr;
+  TBatchConvertOk* batchConvertOk_ = nullptr;
 };
 
 }  // namespace quillane

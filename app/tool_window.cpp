@@ -14,6 +14,7 @@
 
 #include "app/glyphs.h"
 #include "app/main_window.h"
+#include "batch/batch_convert.h"
 
 namespace quillane {
 namespace {
@@ -272,9 +273,14 @@ bool ToolWindow::Apply(bool recordHistory) {
   if (!main_.ApplyEffect(spec_.routine, Params(), QString::fromStdString(spec_.statusText),
                          recordHistory))
     return false;
+  AfterEffect();
+  return true;
+}
+
+void ToolWindow::AfterEffect() {
+  main_.SetStatusText(QString::fromStdString(spec_.statusText));
   if (button2_ != nullptr) button2_->setEnabled(true);
   AfterApply();
-  return true;
 }
 
 void ToolWindow::Button1Click() {
@@ -316,7 +322,16 @@ void ToolWindow::SpeedButton3Click() {
 }
 
 void ToolWindow::SpeedButton4Click() {
+  if (edit1_ == nullptr || edit2_ == nullptr) return;
   emit batchConvertRequested();
+  BeforeBatch();
+  // The loop itself runs the routine (and the history step of the effects whose batch does);
+  // the window adds its own steps after each picture.
+  const BatchResult result = main_.ConvertBatchFolder(spec_, Params(), edit1_->text(),
+                                                      edit2_->text(), [this] { AfterEffect(); });
+  if (result.end != BatchResult::End::Completed) return;
+  AfterBatch();
+  main_.ShowBatchConvertOk();
 }
 
 }  // namespace quillane

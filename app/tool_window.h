@@ -47,9 +47,6 @@ class ToolWindow : public QWidget {
   // step when recordHistory, the status text, then the window's own steps. False when the
   // effect is not available or failed (the document is then unchanged).
   bool Apply(bool recordHistory);
-  // The window's batch routine: the effect with the current settings, recording a history
-  // step only for the effects whose batch routine does.
-  bool BatchRoutine() { return Apply(spec_.batchPushesHistory); }
 
   // Heights the batch toggle sets; windows without a batch panel keep the first.
   void SetWindowHeights(int collapsed, int expanded);
@@ -65,15 +62,19 @@ class ToolWindow : public QWidget {
  signals:
   // "Color up" was pressed: the freehand painting windows take over the working picture.
   void colorUpRequested();
-  // "Convert" was pressed: run the batch loop with this window's effect.
+  // "Convert" was pressed; the batch loop runs right after.
   void batchConvertRequested();
 
  protected:
   // What showing and closing the window do; subclasses call the base version first.
   virtual void FormShow();
   virtual void FormClose();
-  // After a successful apply (OK or batch), once the document has the result.
+  // After a successful apply (OK or each picture of a batch), once the document has the result.
   virtual void AfterApply() {}
+  // Convert's own steps for the windows that have some: before the loop, and after a loop
+  // that ran to its end (before the completion dialog shows).
+  virtual void BeforeBatch() {}
+  virtual void AfterBatch() {}
   // A slider or check box moved, after its number label and hidden selection were updated.
   virtual void ControlChanged(const ControlSpec& control, int value);
 
@@ -92,6 +93,9 @@ class ToolWindow : public QWidget {
   void BuildButtonRow(QBoxLayout* outer);
   void BuildBatchPanel(QBoxLayout* outer);
   void SelectFrom(const ControlSpec& control);
+  // What follows the effect routine in OK and in every picture of a batch, but the history
+  // step: the status line, "Color up", and the window's own steps.
+  void AfterEffect();
 
   const EffectSpec& spec_;
   TMyPicture& main_;

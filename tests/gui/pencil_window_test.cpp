@@ -137,16 +137,5 @@ TEST_F(PencilWindow, ShowingTheWindowAgainChoosesContrast) {
             peccilsketch(Main().Document().Source(), PencilToneMode::Contrast, 45, 200));
 }
 
-TEST_F(PencilWindow, TheBatchRoutineLeavesTheHistoryAlone) {
-  Main().SetLineArt(true);
-  ASSERT_TRUE(Pencil().BatchRoutine());
-  EXPECT_EQ(Main().Document().Working(),
-            peccilsketch(Main().Document().Source(), PencilToneMode::Contrast, 45, 128));
-  EXPECT_EQ(Main().Document().UndoCount(), 0);
-  EXPECT_EQ(Main().StatusText(), "Pencil Sketch");
-  EXPECT_FALSE(Main().LineArt());
-  EXPECT_TRUE(ToolChild<QToolButton>(1, "Button2")->isEnabled());
-}
-
 }  // namespace
 }  // namespace quillane
