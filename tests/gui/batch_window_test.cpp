@@ -1,0 +1,271 @@
+#include <QLabel>
+#include <QLineEdit>
+#include <QListWidget>
+#include <QPushButton>
+#include <QSignalSpy>
+#include <QSlider>
+#include <QStatusBar>
+#include <QToolButton>
+#include <filesystem>
+#include <stdexcept>
+
+#include "app/picture_view.h"
+#include "batch/batch_convert_ok.h"
+#include "codecs/picture_file.h"
+#include "effects/mono/bw_sketch.h"
+#include "tests/gui/temp_folder.h"
+
+namespace quillane {
+namespace {
+
+TBitmap32 Opaque(TBitmap32 picture) {
+  SetAlphaChannel(picture, 255);
+  return picture;
+}
+
+// The Pencil sketch window with its batch panel open, and an input folder holding three
+// pictures the scan lists, a text file and a subfolder it does not.
+class BatchWindow : public FileGuiTest {
+ protected:
+  void SetUp() override {
+    FileGuiTest::SetUp();
+    std::filesystem::create_directories(LocalPath("in/d.jpg"));
+    SaveJpeg(TestPicture(30, 20), LocalPath("in/a.jpg"));
+    SaveBitmap24(TestPicture(17, 11), LocalPath("in/b.bmp"));
+    SaveJpeg(TestPicture(25, 25), LocalPath("in/c.jpeg"));
+    WriteBytes(LocalPath("in/notes.txt"), "not a picture");
+    MenuAction("Pencilsketch1")->trigger();
+    Button("SpeedButton1")->click();
+  }
+
+  QToolButton* Button(const char* name) { return ToolChild<QToolButton>(1, name); }
+  QLineEdit* Edit(const char* name) { return ToolChild<QLineEdit>(1, name); }
+  QListWidget* ListView1() { return MainChild<QListWidget>("ListView1"); }
+  TBatchConvertOk& Completion() { return Main().BatchConvertOk(); }
+
+  void BrowseInput(const QString& folder) {
+    platform_.folderAnswers.push_back(folder);
+    Button("SpeedButton2")->click();
+  }
+  void Convert(const QString& input, const QString& output) {
+    Edit("Edit1")->setText(input);
+    Edit("Edit2")->setText(output);
+    Button("SpeedButton4")->click();
+  }
+
+  // The picture in the input folder as the document holds it once loaded.
+  TBitmap32 Input(const QString& name) { return Opaque(*LoadPictureFile(LocalPath("in/" + name))); }
+  // The bytes a quality-90 JPEG of picture has.
+  std::vector<std::uint8_t> JpegBytes(const TBitmap32& picture) {
+    const std::string reference = LocalPath("reference.jpg");
+    SaveJpeg(picture, reference, 90);
+    std::vector<std::uint8_t> bytes = ReadBytes(reference);
+    std::filesystem::remove(reference);
+    return bytes;
+  }
+};
+
+QStringList Items(QListWidget* list) {
+  QStringList names;
+  for (int i = 0; i < list->count(); ++i) names << list->item(i)->text();
+  return names;
+}
+
+TEST_F(BatchWindow, BrowseListsThePicturesOfTheChosenFolder) {
+  ASSERT_NE(ListView1(), nullptr);
+  EXPECT_TRUE(ListView1()->isHidden());
+  BrowseInput(Path("in"));
+  EXPECT_EQ(Main().InputFolder(), Path("in"));
+  EXPECT_EQ(Edit("Edit1")->text(), Path("in"));
+  // One scan per mask, in the order *.jpg, *.jpeg, *.bmp, *.wmf.
+  const QStringList expected = {"a.jpg", "c.jpeg", "b.bmp"};
+  EXPECT_EQ(Items(ListView1()), expected);
+  EXPECT_EQ(Main().BatchFiles(), expected);
+
+  // A cancelled dialog keeps the list; another folder replaces it.
+  Button("SpeedButton2")->click();
+  EXPECT_EQ(Items(ListView1()), expected);
+  std::filesystem::create_directories(LocalPath("other"));
+  SaveBitmap24(TestPicture(), LocalPath("other/Z.BMP"));
+  BrowseInput(Path("other"));
+  EXPECT_EQ(Items(ListView1()), QStringList{"Z.BMP"});
+
+  // Choosing the output folder lists nothing.
+  platform_.folderAnswers.push_back(Path("in"));
+  Button("SpeedButton3")->click();
+  EXPECT_EQ(Items(ListView1()), QStringList{"Z.BMP"});
+}
+
+TEST_F(BatchWindow, ConvertWritesOnePencilSketchPerPicture) {
+  // One step already in the history; the pencil's batch records none.
+  ASSERT_TRUE(
+      Main().ApplyEffect([](const EffectInput&) { return TestPicture(5, 5); }, {}, "Before", true));
+  Main().SetLineArt(true);
+  ToolChild<QSlider>(1, "TrackBar1")->setValue(70);
+  BrowseInput(Path("in"));
+  QSignalSpy progress(Main().statusBar(), &QStatusBar::messageChanged);
+
+  // The output folder does not exist yet, several levels deep; blanks around the names go.
+  Convert("  " + Path("in") + " ", Path("out/deeper/still") + "  ");
+
+  EXPECT_TRUE(platform_.messages.empty());
+  EXPECT_TRUE(platform_.errors.empty());
+  EXPECT_EQ(Entries("out/deeper/still"),
+            (std::vector<std::string>{"a-PencilSketch.jpg", "b-PencilSketch.jpg",
+                                      "c.-PencilSketch.jpg"}));
+  for (const char* name : {"a.jpg", "b.bmp", "c.jpeg"}) {
+    const QString input = name;
+    const QString output = "out/deeper/still/" + input.left(input.size() - 4) + "-PencilSketch.jpg";
+    EXPECT_EQ(ReadBytes(LocalPath(output)),
+              JpegBytes(peccilsketch(Input(input), PencilToneMode::Contrast, 70, 128)))
+        << name;
+  }
+
+  // The document holds the last picture of the list and its result.
+  const TBitmap32 last = Input("b.bmp");
+  EXPECT_EQ(Main().Document().Source(), last);
+  EXPECT_EQ(Main().Document().Opened(), last);
+  EXPECT_EQ(Main().Document().Working(), peccilsketch(last, PencilToneMode::Contrast, 70, 128));
+  EXPECT_EQ(Main().findChild<PictureView*>("Image1")->Image(),
+            OpaqueImage(Main().Document().Working()));
+  EXPECT_EQ(Main().findChild<PictureView*>("Image1")->size(), QSize(17, 11));
+  EXPECT_EQ(Main().Document().UndoCount(), 1);
+  EXPECT_EQ(Main().StatusText(), "Pencil Sketch");
+  EXPECT_FALSE(Main().LineArt());
+  EXPECT_TRUE(Button("Button2")->isEnabled());
+  EXPECT_EQ(Main().InputFolder(), Path("in"));
+  EXPECT_EQ(Main().OutputFolder(), Path("out/deeper/still"));
+  EXPECT_TRUE(Tool(1).isVisible());
+
+  // Progress while it ran, cleared after.
+  QStringList shown;
+  for (const QList<QVariant>& call : progress) shown << call.at(0).toString();
+  EXPECT_EQ(shown,
+            (QStringList{"Converting picture 1 of 3: a.jpg", "Converting picture 2 of 3: c.jpeg",
+                         "Converting picture 3 of 3: b.bmp", ""}));
+
+  EXPECT_TRUE(Completion().isVisible());
+  EXPECT_EQ(Completion().objectName(), "TBatchConvertOk");
+  EXPECT_EQ(Completion().windowTitle(), "BatchConvertOk");
+  EXPECT_EQ(Completion().findChild<QLabel*>("Label1")->text(), "The batch convert is successful.");
+
+  // A second run replaces the files.
+  Completion().findChild<QToolButton*>("SpeedButton1")->click();
+  EXPECT_FALSE(Completion().isVisible());
+  ToolChild<QSlider>(1, "TrackBar1")->setValue(20);
+  Button("SpeedButton4")->click();
+  EXPECT_EQ(Entries("out/deeper/still").size(), 3u);
+  EXPECT_EQ(ReadBytes(LocalPath("out/deeper/still/b-PencilSketch.jpg")),
+            JpegBytes(peccilsketch(last, PencilToneMode::Contrast, 20, 128)));
+  EXPECT_TRUE(Completion().isVisible());
+}
+
+TEST_F(BatchWindow, ConvertRefusesAMissingFolderOrAnEmptyList) {
+  const TBitmap32 before = Main().Document().Working();
+  Convert(Path("nowhere"), Path("out"));
+  // Without a Browse the list is empty, whatever folder is typed.
+  Convert(" " + Path("in") + " ", Path("out"));
+  EXPECT_EQ(platform_.messages,
+            (std::vector<ScriptedPlatform::Message>{{"Sorry", "Input Director in not exist."},
+                                                    {"Sorry", "There is no picture to convert."}}));
+  EXPECT_TRUE(platform_.errors.empty());
+  EXPECT_FALSE(Exists("out"));
+  EXPECT_FALSE(Completion().isVisible());
+  EXPECT_EQ(Main().Document().Working(), before);
+  EXPECT_EQ(Main().StatusText(), "New picture");
+  // The typed input folder is the shared one now; the output folder is not taken.
+  EXPECT_EQ(Main().InputFolder(), Path("in"));
+  EXPECT_EQ(Main().OutputFolder(), "");
+}
+
+TEST_F(BatchWindow, PicturesThatCannotBeLoadedAreSkippedAndListedAfterwards) {
+  WriteBytes(LocalPath("in/bad.jpg"), "\xFF\xD8 not a JPEG at all");
+  SaveBitmap24(TestPicture(), LocalPath("in/gone.bmp"));
+  BrowseInput(Path("in"));
+  std::filesystem::remove(LocalPath("in/gone.bmp"));
+
+  Convert(Path("in"), Path("out"));
+  EXPECT_EQ(Entries("out"), (std::vector<std::string>{"a-PencilSketch.jpg", "b-PencilSketch.jpg",
+                                                      "c.-PencilSketch.jpg"}));
+  ASSERT_EQ(platform_.messages.size(), 1u);
+  EXPECT_EQ(platform_.messages[0].caption, "Sorry");
+  const QStringList lines = platform_.messages[0].text.split('\n');
+  ASSERT_EQ(lines.size(), 3);
+  EXPECT_EQ(lines[0], "These pictures were skipped and have no output file:");
+  EXPECT_TRUE(lines[1].startsWith("\"" + Path("in/bad.jpg") + "\": ")) << lines[1].toStdString();
+  EXPECT_EQ(lines[2], Path("in/gone.bmp") + " is not a valid format");
+  EXPECT_TRUE(platform_.errors.empty());
+  // The rest converted, so the loop ran to its end.
+  EXPECT_TRUE(Completion().isVisible());
+  EXPECT_EQ(Main().Document().Source(), Input("b.bmp"));
+}
+
+TEST_F(BatchWindow, AStoppedLoopShowsItsErrorAndNoCompletion) {
+  BrowseInput(Path("in"));
+  WriteBytes(LocalPath("taken"), "a file where the output folder should be");
+  Convert(Path("in"), Path("taken"));
+  ASSERT_EQ(platform_.errors.size(), 1u);
+  EXPECT_TRUE(platform_.errors[0].contains(Path("taken")));
+  EXPECT_TRUE(platform_.messages.empty());
+  EXPECT_FALSE(Completion().isVisible());
+  EXPECT_TRUE(Main().statusBar()->currentMessage().isEmpty());
+  EXPECT_EQ(Main().StatusText(), "New picture");
+}
+
+// An effect whose batch routine records a history step, and one that fails part way.
+TEST_F(BatchWindow, EachConvertedPictureGoesThroughTheWindowsOwnSteps) {
+  BrowseInput(Path("in"));
+  EffectSpec recording = *FindEffect(1);
+  recording.batchPushesHistory = true;
+  recording.statusText = "Recorded";
+  recording.routine = [](const EffectInput& in) { return Opaque(TBitmap32(in.source.Width(), 3)); };
+  ToolWindow window(recording, Main());
+  window.show();
+  window.findChild<QToolButton*>("SpeedButton1")->click();
+  window.findChild<QLineEdit*>("Edit2")->setText(Path("out"));
+  window.findChild<QToolButton*>("SpeedButton4")->click();
+  EXPECT_EQ(Main().Document().UndoCount(), 3);
+  EXPECT_TRUE(MainChild<QToolButton>("SpeedButton3")->isEnabled());
+  EXPECT_EQ(Main().StatusText(), "Recorded");
+  EXPECT_TRUE(window.findChild<QToolButton*>("Button2")->isEnabled());
+  EXPECT_EQ(Main().Document().Working(), Opaque(TBitmap32(17, 3)));
+  EXPECT_TRUE(Completion().isVisible());
+  Completion().close();
+
+  int calls = 0;
+  recording.routine = [&calls](const EffectInput& in) {
+    if (++calls == 2) throw std::runtime_error("Scan line index out of range");
+    return in.source;
+  };
+  window.findChild<QToolButton*>("SpeedButton4")->click();
+  ASSERT_EQ(platform_.errors.size(), 1u);
+  EXPECT_TRUE(platform_.errors[0].contains("Scan line index out of range"));
+  EXPECT_TRUE(platform_.errors[0].contains(Path("in/c.jpeg")));
+  EXPECT_FALSE(Completion().isVisible());
+  // The picture that failed was loaded; the view shows it.
+  EXPECT_EQ(Main().Document().Working(), Input("c.jpeg"));
+  EXPECT_EQ(Main().findChild<PictureView*>("Image1")->Image(), OpaqueImage(Input("c.jpeg")));
+}
+
+TEST_F(BatchWindow, TheCompletionDialogCanShowTheOutputFolder) {
+  // Created hidden with the main window, on top, with a close box only, not modal.
+  EXPECT_FALSE(Completion().isVisible());
+  EXPECT_TRUE(Completion().windowFlags() & Qt::WindowStaysOnTopHint);
+  EXPECT_TRUE(Completion().windowFlags() & Qt::WindowCloseButtonHint);
+  EXPECT_FALSE(Completion().windowFlags() & Qt::WindowMinimizeButtonHint);
+  EXPECT_FALSE(Completion().windowFlags() & Qt::WindowMaximizeButtonHint);
+
+  BrowseInput(Path("in"));
+  Convert(Path("in"), Path("out"));
+  ASSERT_TRUE(Completion().isVisible());
+  EXPECT_FALSE(Completion().isModal());
+  auto* go = Completion().findChild<QToolButton*>("SpeedButton2");
+  EXPECT_EQ(go->text(), "Go Output Folder");
+  EXPECT_EQ(Completion().findChild<QToolButton*>("SpeedButton1")->text(), "Close");
+  go->click();
+  EXPECT_EQ(platform_.openedFolders, std::vector<QString>{Path("out")});
+  EXPECT_FALSE(Completion().isVisible());
+}
+
+}  // namespace
+}  // namespace quillane
