@@ -10,7 +10,7 @@ GALLERY ?= gallery
 JOBS ?= $(shell nproc)
 
 PACKAGES := build-essential cmake pkg-config clang clang-format \
-	qt6-base-dev qt6-svg-dev qt6-qpa-plugins libgl-dev fonts-dejavu-core \
+	qt6-base-dev qt6-qpa-plugins libgl-dev fonts-dejavu-core \
 	libjpeg62-turbo-dev libgtest-dev libgmock-dev libbenchmark-dev libwmf-dev \
 	xdg-utils
 
