@@ -136,6 +136,19 @@ TEST_F(PictureFiles, TheTypeComesFromTheNameAlone) {
   EXPECT_TRUE(platform_.errors.empty());
 }
 
+TEST_F(PictureFiles, AnUnreadableIconIsReportedThenRefused) {
+  ChangeTheDocument();
+  const DocumentState before = State();
+  WriteBytes(LocalPath("bad.ico"), "not an icon");
+  Open("bad.ico");
+  ASSERT_EQ(platform_.messages.size(), 2u);
+  EXPECT_EQ(platform_.messages[0].caption, "Exit");
+  EXPECT_TRUE(platform_.messages[0].text.startsWith("Input picture" + Path("bad.ico") + "Error."));
+  EXPECT_EQ(platform_.messages[1],
+            (ScriptedPlatform::Message{"Sorry", Path("bad.ico") + " is not a valid format"}));
+  EXPECT_EQ(State(), before);
+}
+
 TEST_F(PictureFiles, ACorruptFileShowsTheErrorAndKeepsTheDocument) {
   ChangeTheDocument();
   const DocumentState before = State();
