@@ -54,21 +54,21 @@ std::optional<TBitmap32> LoadPng(const std::string& path, std::string& error) {
   return picture;
 }
 
+// The picture named by --input or INPUT, or the built-in one when none is named; nothing (with
+// the reason told on err) when it cannot be read.
+std::optional<TBitmap32> InputOrBuiltInPicture(const Options& o, std::ostream& err) {
+  if (o.input.empty()) return StartupPicture();
+  std::string error;
+  std::optional<TBitmap32> loaded = LoadInputPicture(o.input, error, err);
+  if (!loaded) err << "quillane-cli: " << error << "\n";
+  return loaded;
+}
+
 int ApplyCommand(const Options& o, std::ostream& out, std::ostream& err) {
-  TBitmap32 picture;
-  if (o.input.empty()) {
-    picture = StartupPicture();
-  } else {
-    std::string error;
-    std::optional<TBitmap32> loaded = LoadInputPicture(o.input, error, err);
-    if (!loaded) {
-      err << "quillane-cli: " << error << "\n";
-      return kExitFailed;
-    }
-    picture = std::move(*loaded);
-  }
+  std::optional<TBitmap32> picture = InputOrBuiltInPicture(o, err);
+  if (!picture) return kExitFailed;
   // Through a document, as the program does it: alpha 255, source in, working out.
-  PictureDocument document(std::move(picture));
+  PictureDocument document(std::move(*picture));
   try {
     document.SetWorking(o.effect->routine({document.Source(), document.Working(), o.params}));
   } catch (const std::exception& e) {
@@ -209,20 +209,10 @@ std::string GalleryHtml(const std::string& sourceName, const GalleryEntry& origi
 }
 
 int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
-  TBitmap32 picture;
-  std::string sourceName = "the built-in picture";
-  if (o.input.empty()) {
-    picture = StartupPicture();
-  } else {
-    std::string error;
-    std::optional<TBitmap32> loaded = LoadInputPicture(o.input, error, err);
-    if (!loaded) {
-      err << "quillane-cli: " << error << "\n";
-      return kExitFailed;
-    }
-    picture = std::move(*loaded);
-    sourceName = fs::path(o.input).filename().string();
-  }
+  std::optional<TBitmap32> picture = InputOrBuiltInPicture(o, err);
+  if (!picture) return kExitFailed;
+  const std::string sourceName =
+      o.input.empty() ? "the built-in picture" : fs::path(o.input).filename().string();
   std::error_code ec;
   fs::create_directories(o.output, ec);
   if (!fs::is_directory(o.output)) {
@@ -232,7 +222,7 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
   }
 
   const fs::path folder(o.output);
-  PictureDocument document(std::move(picture));
+  PictureDocument document(std::move(*picture));
   int status = kExitOk;
   auto write = [&](const TBitmap32& p, const std::string& file) {
     try {

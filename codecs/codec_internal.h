@@ -68,6 +68,21 @@ void EncodeBitmap24(const TBitmap32& picture, ByteSink& sink);
 void EncodeEnhancedMetafile(const TBitmap32& picture, ByteSink& sink);
 std::vector<std::uint8_t> EncodePng(const TBitmap32& picture);
 
+// Little-endian writers for building headers in a byte buffer.
+inline void Put16(std::uint8_t*& at, std::uint16_t v) {
+  *at++ = static_cast<std::uint8_t>(v);
+  *at++ = static_cast<std::uint8_t>(v >> 8);
+}
+inline void Put32(std::uint8_t*& at, std::uint32_t v) {
+  for (int i = 0; i < 4; ++i) *at++ = static_cast<std::uint8_t>(v >> (8 * i));
+}
+
+// A device-independent bitmap of 24 bits per pixel, bottom-up, as both the bitmap file and the
+// metafile carry it: a 40-byte info header, then the rows in B, G, R order padded to four bytes.
+inline constexpr std::size_t kDibInfoHeaderSize = 40;
+std::uint64_t Dib24BitsSize(const TBitmap32& picture);
+void WriteDib24(const TBitmap32& picture, ByteSink& sink);
+
 // The pixel size a Windows playing device at 96 dots per inch gives an enhanced metafile.
 inline constexpr int kMetafileDotsPerInch = 96;
 

@@ -37,7 +37,7 @@ constexpr int kMmText = 1, kMmIsotropic = 7, kMmAnisotropic = 8;
 constexpr std::size_t kHeaderSize = 108;
 constexpr std::size_t kStretchDiBitsSize = 80;
 constexpr std::size_t kEofSize = 20;
-constexpr std::size_t kInfoHeaderSize = 40;
+constexpr std::size_t kInfoHeaderSize = kDibInfoHeaderSize;
 
 std::uint32_t U32(Bytes d, std::size_t at) {
   return static_cast<std::uint32_t>(d[at]) | static_cast<std::uint32_t>(d[at + 1]) << 8 |
@@ -382,14 +382,6 @@ class Player {
   std::int64_t paintBudget_ = 0;
 };
 
-void Put16(std::uint8_t*& at, std::uint16_t v) {
-  *at++ = static_cast<std::uint8_t>(v);
-  *at++ = static_cast<std::uint8_t>(v >> 8);
-}
-void Put32(std::uint8_t*& at, std::uint32_t v) {
-  for (int i = 0; i < 4; ++i) *at++ = static_cast<std::uint8_t>(v >> (8 * i));
-}
-
 }  // namespace
 
 bool LooksLikeEnhancedMetafile(Bytes data) {
@@ -407,13 +399,12 @@ void EncodeEnhancedMetafile(const TBitmap32& picture, ByteSink& sink) {
   if (picture.Empty()) throw PictureFileError("There is no picture to save");
   const std::uint32_t w = static_cast<std::uint32_t>(picture.Width());
   const std::uint32_t h = static_cast<std::uint32_t>(picture.Height());
-  const std::uint64_t stride = (std::uint64_t{w} * 3 + 3) / 4 * 4;
-  const std::uint64_t bitsSize = stride * h;
+  const std::uint64_t bitsSize = Dib24BitsSize(picture);
   const std::uint64_t dibRecordSize = kStretchDiBitsSize + kInfoHeaderSize + bitsSize;
   const std::uint64_t total = kHeaderSize + dibRecordSize + kEofSize;
   if (total > 0xFFFFFFFFull) throw PictureFileError("The picture is too large for a metafile");
 
-  std::uint8_t head[kHeaderSize + kStretchDiBitsSize + kInfoHeaderSize] = {};
+  std::uint8_t head[kHeaderSize + kStretchDiBitsSize] = {};
   std::uint8_t* at = head;
   const auto frame = [](std::uint32_t pixels) {
     return static_cast<std::uint32_t>(std::nearbyint(pixels * 2540.0 / kMetafileDotsPerInch));
@@ -468,30 +459,9 @@ void EncodeEnhancedMetafile(const TBitmap32& picture, ByteSink& sink) {
   Put32(at, kSrcCopy);
   Put32(at, w);  // cxDest, cyDest
   Put32(at, h);
-  // BITMAPINFOHEADER
-  Put32(at, kInfoHeaderSize);
-  Put32(at, w);
-  Put32(at, h);  // bottom-up
-  Put16(at, 1);
-  Put16(at, 24);
-  Put32(at, 0);  // BI_RGB
-  Put32(at, static_cast<std::uint32_t>(bitsSize));
-  Put32(at, 3780);  // 96 dpi in pixels per metre
-  Put32(at, 3780);
-  Put32(at, 0);
-  Put32(at, 0);
   sink.Write(head, sizeof head);
+  WriteDib24(picture, sink);
 
-  std::vector<std::uint8_t> row(static_cast<std::size_t>(stride), 0);
-  for (std::int64_t y = h; y-- > 0;) {
-    const Pixel* source = picture.ScanLine(static_cast<int>(y));
-    for (std::uint32_t x = 0; x < w; ++x) {
-      row[3 * x] = source[x].b;
-      row[3 * x + 1] = source[x].g;
-      row[3 * x + 2] = source[x].r;
-    }
-    sink.Write(row.data(), row.size());
-  }
   std::uint8_t eof[kEofSize];
   at = eof;
   Put32(at, kEmrEof);

@@ -59,43 +59,30 @@ std::vector<std::uint8_t> ReadWholeFile(const std::string& path) {
   return bytes;
 }
 
-// A bottom-up 24-bit BMP with a 40-byte info header; rows padded to four bytes.
-void EncodeBitmap24(const TBitmap32& picture, ByteSink& sink) {
-  if (picture.Empty()) throw PictureFileError("There is no picture to save");
+std::uint64_t Dib24BitsSize(const TBitmap32& picture) {
+  const std::uint64_t stride = (static_cast<std::uint64_t>(picture.Width()) * 3 + 3) / 4 * 4;
+  return stride * static_cast<std::uint64_t>(picture.Height());
+}
+
+void WriteDib24(const TBitmap32& picture, ByteSink& sink) {
   const auto w = static_cast<std::uint32_t>(picture.Width());
   const auto h = static_cast<std::uint32_t>(picture.Height());
-  const std::uint64_t stride = (std::uint64_t{w} * 3 + 3) / 4 * 4;
-  const std::uint64_t bitsSize = stride * h;
-  const std::uint64_t fileSize = 54 + bitsSize;
-  if (fileSize > 0xFFFFFFFFull) throw PictureFileError("The picture is too large for a bitmap");
-
-  std::uint8_t header[54] = {};
+  std::uint8_t header[kDibInfoHeaderSize] = {};
   std::uint8_t* at = header;
-  const auto put16 = [&at](std::uint16_t v) {
-    *at++ = static_cast<std::uint8_t>(v);
-    *at++ = static_cast<std::uint8_t>(v >> 8);
-  };
-  const auto put32 = [&at](std::uint32_t v) {
-    for (int i = 0; i < 4; ++i) *at++ = static_cast<std::uint8_t>(v >> (8 * i));
-  };
-  *at++ = 'B';
-  *at++ = 'M';
-  put32(static_cast<std::uint32_t>(fileSize));
-  put32(0);
-  put32(54);
-  put32(40);
-  put32(w);
-  put32(h);
-  put16(1);
-  put16(24);
-  put32(0);  // BI_RGB
-  put32(static_cast<std::uint32_t>(bitsSize));
-  put32(3780);  // 96 dpi in pixels per metre
-  put32(3780);
-  put32(0);
-  put32(0);
+  Put32(at, kDibInfoHeaderSize);
+  Put32(at, w);
+  Put32(at, h);  // positive: bottom-up
+  Put16(at, 1);
+  Put16(at, 24);
+  Put32(at, 0);  // BI_RGB
+  Put32(at, static_cast<std::uint32_t>(Dib24BitsSize(picture)));
+  Put32(at, 3780);  // 96 dpi in pixels per metre
+  Put32(at, 3780);
+  Put32(at, 0);
+  Put32(at, 0);
   sink.Write(header, sizeof header);
 
+  const std::uint64_t stride = (std::uint64_t{w} * 3 + 3) / 4 * 4;
   std::vector<std::uint8_t> row(static_cast<std::size_t>(stride), 0);
   for (std::int64_t y = h; y-- > 0;) {
     const Pixel* source = picture.ScanLine(static_cast<int>(y));
@@ -106,6 +93,24 @@ void EncodeBitmap24(const TBitmap32& picture, ByteSink& sink) {
     }
     sink.Write(row.data(), row.size());
   }
+}
+
+// A bitmap file: the 14-byte file header, then the 24-bit DIB.
+void EncodeBitmap24(const TBitmap32& picture, ByteSink& sink) {
+  if (picture.Empty()) throw PictureFileError("There is no picture to save");
+  constexpr std::uint32_t kFileHeaderSize = 14;
+  const std::uint64_t fileSize = kFileHeaderSize + kDibInfoHeaderSize + Dib24BitsSize(picture);
+  if (fileSize > 0xFFFFFFFFull) throw PictureFileError("The picture is too large for a bitmap");
+
+  std::uint8_t header[kFileHeaderSize] = {};
+  std::uint8_t* at = header;
+  *at++ = 'B';
+  *at++ = 'M';
+  Put32(at, static_cast<std::uint32_t>(fileSize));
+  Put32(at, 0);
+  Put32(at, kFileHeaderSize + kDibInfoHeaderSize);
+  sink.Write(header, sizeof header);
+  WriteDib24(picture, sink);
 }
 
 }  // namespace codecs
