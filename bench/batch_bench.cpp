@@ -9,6 +9,7 @@
 
 #include "app/document.h"
 #include "batch/batch_convert.h"
+#include "bench/synthetic_photo.h"
 #include "codecs/picture_file.h"
 
 namespace quillane {
@@ -20,38 +21,6 @@ constexpr int kWidth = 4000;
 constexpr int kHeight = 3000;
 constexpr int kPictures = 20;
 
-std::uint32_t Hash(std::uint32_t x) {
-  x ^= x >> 16;
-  x *= 0x7feb352dU;
-  x ^= x >> 15;
-  x *= 0x846ca68bU;
-  x ^= x >> 16;
-  return x;
-}
-
-// Soft gradients, a few hard-edged shapes and fine grain: roughly the work a photo gives the
-// JPEG codec and the edge map.
-TBitmap32 Photo() {
-  TBitmap32 p(kWidth, kHeight);
-  for (int y = 0; y < kHeight; ++y) {
-    Pixel* row = p.ScanLine(y);
-    for (int x = 0; x < kWidth; ++x) {
-      const std::uint32_t noise = Hash(static_cast<std::uint32_t>(y * kWidth + x));
-      const bool inDisc = (x - 1400) * (x - 1400) + (y - 1200) * (y - 1200) < 700 * 700;
-      const bool inBar = (x / 250) % 5 == 0 && y > 2000;
-      int r = 60 + x * 150 / kWidth, g = 90 + y * 120 / kHeight, b = 200 - y * 140 / kHeight;
-      if (inDisc) r += 70, g -= 40;
-      if (inBar) r -= 50, g -= 50, b -= 50;
-      auto grain = [&](int v, int shift) {
-        const int n = v + static_cast<int>((noise >> shift) & 15) - 8;
-        return static_cast<std::uint8_t>(n < 0 ? 0 : n > 255 ? 255 : n);
-      };
-      row[x] = Pixel{grain(b, 0), grain(g, 4), grain(r, 8), 255};
-    }
-  }
-  return p;
-}
-
 // The input folder, made once per run and removed at exit.
 class BatchFolders {
  public:
@@ -61,7 +30,7 @@ class BatchFolders {
     root_ = pattern;
     fs::create_directory(root_ / "in");
     const std::string first = (root_ / "in" / "photo00.jpg").string();
-    SaveJpeg(Photo(), first, 90);
+    SaveJpeg(bench::SyntheticPhoto(kWidth, kHeight), first, 90);
     for (int i = 1; i < kPictures; ++i) {
       const std::string name = std::string("photo") + (i < 10 ? "0" : "") + std::to_string(i);
       fs::copy_file(first, root_ / "in" / (name + ".jpg"));

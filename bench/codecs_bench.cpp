@@ -1,6 +1,5 @@
-// JPEG decoding and encoding of a 24-megapixel photo-like picture (6000 x 4000: smooth
-// gradients with fine noise, so the entropy coder has real work), through the same calls the
-// program makes.
+// JPEG decoding and encoding of a 24-megapixel photo-like picture (6000 x 4000), through the
+// same calls the program makes.
 #include <benchmark/benchmark.h>
 #include <unistd.h>
 
@@ -8,6 +7,7 @@
 #include <filesystem>
 #include <string>
 
+#include "bench/synthetic_photo.h"
 #include "codecs/codec_internal.h"
 #include "codecs/picture_file.h"
 
@@ -19,25 +19,7 @@ using quillane::TBitmap32;
 constexpr int kWidth = 6000, kHeight = 4000;
 
 const TBitmap32& Photo() {
-  static const TBitmap32 photo = [] {
-    TBitmap32 p(kWidth, kHeight);
-    std::uint32_t noise = 2463534242u;
-    for (int y = 0; y < kHeight; ++y) {
-      Pixel* row = p.ScanLine(y);
-      for (int x = 0; x < kWidth; ++x) {
-        noise ^= noise << 13;
-        noise ^= noise >> 17;
-        noise ^= noise << 5;
-        const int grain = static_cast<int>(noise & 15) - 8;
-        const auto channel = [grain](int v) {
-          return static_cast<std::uint8_t>(v + grain < 0 ? 0 : v + grain > 255 ? 255 : v + grain);
-        };
-        row[x] = Pixel{channel(40 + x * 180 / kWidth), channel(60 + y * 150 / kHeight),
-                       channel(200 - (x + y) * 160 / (kWidth + kHeight)), 255};
-      }
-    }
-    return p;
-  }();
+  static const TBitmap32 photo = quillane::bench::SyntheticPhoto(kWidth, kHeight);
   return photo;
 }
 

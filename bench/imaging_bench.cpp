@@ -6,7 +6,7 @@
 #include <cmath>
 #include <cstring>
 
-#include "data/startup_picture.h"
+#include "bench/synthetic_photo.h"
 #include "effects/mono/bw_sketch.h"
 #include "imaging/edge_map.h"
 #include "imaging/tone.h"
@@ -17,47 +17,8 @@ namespace {
 constexpr int kWidth = 4000;
 constexpr int kHeight = 3000;
 
-std::uint32_t Hash(std::uint32_t x) {
-  x ^= x >> 16;
-  x *= 0x7feb352dU;
-  x ^= x >> 15;
-  x *= 0x846ca68bU;
-  x ^= x >> 16;
-  return x;
-}
-
-// The start-up picture enlarged smoothly to 4000 by 3000 with a little per-channel grain, so
-// that it has the soft gradients, edges and noise (and the many distinct colours) of a photo.
 const TBitmap32& Photo() {
-  static const TBitmap32 photo = [] {
-    const TBitmap32 small = StartupPicture();
-    TBitmap32 big(kWidth, kHeight);
-    const int sw = small.Width(), sh = small.Height();
-    for (int y = 0; y < kHeight; ++y) {
-      const double fy = (y + 0.5) * sh / kHeight - 0.5;
-      const int y0 = std::clamp(static_cast<int>(std::floor(fy)), 0, sh - 1);
-      const int y1 = std::min(y0 + 1, sh - 1);
-      const double ty = std::clamp(fy - y0, 0.0, 1.0);
-      const Pixel* r0 = small.ScanLine(y0);
-      const Pixel* r1 = small.ScanLine(y1);
-      Pixel* out = big.ScanLine(y);
-      for (int x = 0; x < kWidth; ++x) {
-        const double fx = (x + 0.5) * sw / kWidth - 0.5;
-        const int x0 = std::clamp(static_cast<int>(std::floor(fx)), 0, sw - 1);
-        const int x1 = std::min(x0 + 1, sw - 1);
-        const double tx = std::clamp(fx - x0, 0.0, 1.0);
-        const std::uint32_t noise = Hash(static_cast<std::uint32_t>(y * kWidth + x));
-        const auto channel = [&](std::uint8_t Pixel::*c, int shift) {
-          const double top = r0[x0].*c + (r0[x1].*c - r0[x0].*c) * tx;
-          const double bottom = r1[x0].*c + (r1[x1].*c - r1[x0].*c) * tx;
-          const double v = top + (bottom - top) * ty + static_cast<int>((noise >> shift) & 7) - 3.5;
-          return static_cast<std::uint8_t>(std::clamp(static_cast<int>(std::lround(v)), 0, 255));
-        };
-        out[x] = Pixel{channel(&Pixel::b, 0), channel(&Pixel::g, 3), channel(&Pixel::r, 6), 255};
-      }
-    }
-    return big;
-  }();
+  static const TBitmap32 photo = bench::SyntheticPhoto(kWidth, kHeight);
   return photo;
 }
 
