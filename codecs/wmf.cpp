@@ -1,18 +1,21 @@
-// Windows metafiles through libwmf, played by its gd device. libwmf reads the bytes through its own
-// bounds-checked memory stream; the header is checked here first so that only plausible files reach
-// it, and a status callback stops playback that runs on without end. Qt first: libwmf's headers
-// define short macros that clash with Qt's names.
-#include <QImage>
-// clang-format off
-#include <libwmf/api.h>
-#include <libwmf/gd.h>
-// clang-format on
+// Windows metafiles through libwmf, played by its gd device in quillane-wmf-render, a process of
+// its own: a hostile file can keep libwmf drawing for minutes inside a single record, or have it
+// allocate without bound, and only a child process can be limited and killed. The header and the
+// record sizes are checked here first so that only plausible files are handed over.
+#include <signal.h>
+#include <unistd.h>
 
 #include <algorithm>
+#include <cerrno>
 #include <chrono>
-#include <cmath>
+#include <cstdlib>
+#include <cstring>
+#include <filesystem>
+#include <string>
 
 #include "codecs/codec_internal.h"
+#include "codecs/helper_process.h"
+#include "codecs/wmf_render.h"
 
 namespace quillane::codecs {
 namespace {
@@ -55,64 +58,93 @@ std::uint32_t CheckRecords(Bytes data, std::size_t at) {
   }
 }
 
-struct Playback {
-  std::chrono::steady_clock::time_point deadline;
-  bool timedOut = false;
-};
-
-int Status(void* context, float) {
-  auto* playback = static_cast<Playback*>(context);
-  if (std::chrono::steady_clock::now() > playback->deadline) playback->timedOut = true;
-  return playback->timedOut ? 1 : 0;
-}
-
-// Collects the PNG the player writes. A C callback: nothing may be thrown out of it.
-int CollectPng(void* context, char* buffer, int length) {
-  if (length <= 0) return 0;
-  try {
-    auto* png = static_cast<std::vector<std::uint8_t>*>(context);
-    png->insert(png->end(), reinterpret_cast<std::uint8_t*>(buffer),
-                reinterpret_cast<std::uint8_t*>(buffer) + length);
-    return length;
-  } catch (...) {
-    return 0;
+// The renderer's own folder first (an installed program), then the one it was built in.
+std::string FindRenderer() {
+  if (const char* chosen = std::getenv("QUILLANE_WMF_RENDER"); chosen != nullptr && *chosen) {
+    return ::access(chosen, X_OK) == 0 ? chosen : "";
   }
+  std::error_code error;
+  const std::filesystem::path self = std::filesystem::read_symlink("/proc/self/exe", error);
+  if (!error) {
+    const std::string beside = (self.parent_path() / wmf_render::kProgramName).string();
+    if (::access(beside.c_str(), X_OK) == 0) return beside;
+  }
+#ifdef QUILLANE_WMF_RENDER_BUILT
+  if (::access(QUILLANE_WMF_RENDER_BUILT, X_OK) == 0) return QUILLANE_WMF_RENDER_BUILT;
+#endif
+  return {};
 }
 
-class WmfApi {
+// Takes the renderer's reply apart as it arrives; the pixels go straight into the picture,
+// which is only allocated once its size has been checked.
+class RenderReply : public HelperOutput {
  public:
-  WmfApi() {
-    wmfAPI_Options options{};
-    options.function = wmf_gd_function;
-    const unsigned long flags =
-        WMF_OPT_FUNCTION | WMF_OPT_IGNORE_NONFATAL | WMF_OPT_NO_ERROR | WMF_OPT_NO_DEBUG;
-    if (wmf_api_create(&api_, flags, &options) != wmf_E_None) {
-      if (api_ != nullptr) wmf_api_destroy(api_);
-      api_ = nullptr;
-      throw PictureFileError("The metafile reader could not start");
-    }
-  }
-  ~WmfApi() {
-    if (opened_) wmf_mem_close(api_);
-    wmf_api_destroy(api_);  // frees everything the player allocated, the gd image included
-  }
-  WmfApi(const WmfApi&) = delete;
-  WmfApi& operator=(const WmfApi&) = delete;
+  explicit RenderReply(std::int64_t maxPixels) : maxPixels_(maxPixels) {}
 
-  wmfAPI* get() { return api_; }
-  void Open(Bytes data) {
-    // libwmf only reads through this pointer; its interface lacks the const.
-    if (wmf_mem_open(api_, const_cast<unsigned char*>(data.data()),
-                     static_cast<long>(data.size())) != wmf_E_None) {
-      throw PictureFileError("The metafile cannot be opened");
+  std::span<std::uint8_t> Space() override {
+    if (headerGot_ < wmf_render::kReplyHeaderSize) {
+      return {header_ + headerGot_, wmf_render::kReplyHeaderSize - headerGot_};
     }
-    opened_ = true;
+    if (reply_ != wmf_render::Reply::kPicture) return {};
+    auto* pixels = reinterpret_cast<std::uint8_t*>(picture_.Data());
+    return {pixels + pixelsGot_, PixelBytes() - pixelsGot_};
   }
+  void Received(std::size_t count) override {
+    if (headerGot_ < wmf_render::kReplyHeaderSize) {
+      headerGot_ += count;
+      if (headerGot_ == wmf_render::kReplyHeaderSize) TakeHeader();
+    } else {
+      pixelsGot_ += count;
+    }
+  }
+
+  bool Complete() const {
+    return headerGot_ == wmf_render::kReplyHeaderSize &&
+           (reply_ != wmf_render::Reply::kPicture || pixelsGot_ == PixelBytes());
+  }
+  wmf_render::Reply reply() const { return reply_; }
+  std::uint32_t width() const { return width_; }
+  std::uint32_t height() const { return height_; }
+  TBitmap32 TakePicture() { return std::move(picture_); }
 
  private:
-  wmfAPI* api_ = nullptr;
-  bool opened_ = false;
+  std::size_t PixelBytes() const { return picture_.PixelCount() * sizeof(Pixel); }
+  void TakeHeader() {
+    std::uint32_t words[3];
+    std::memcpy(words, header_, sizeof words);
+    reply_ = static_cast<wmf_render::Reply>(words[0]);
+    width_ = words[1];
+    height_ = words[2];
+    if (reply_ != wmf_render::Reply::kPicture) return;
+    // At most TBitmap32::kMaxPixels, so each side fits an int.
+    CheckPictureSize(width_, height_, maxPixels_, "metafile");
+    picture_ = TBitmap32(static_cast<int>(width_), static_cast<int>(height_));
+  }
+
+  std::int64_t maxPixels_;
+  std::uint8_t header_[wmf_render::kReplyHeaderSize] = {};
+  std::size_t headerGot_ = 0;
+  wmf_render::Reply reply_{};
+  std::uint32_t width_ = 0, height_ = 0;
+  TBitmap32 picture_;
+  std::size_t pixelsGot_ = 0;
 };
+
+[[noreturn]] void ThrowForIncompleteReply(const HelperEnding& ending) {
+  using Kind = HelperEnding::Kind;
+  if (ending.kind == Kind::kNotStarted) {
+    if (ending.value == ENOENT || ending.value == EACCES || ending.value == ENOEXEC) {
+      throw PictureFileError("The metafile reader is not installed");
+    }
+    throw PictureFileError("The metafile reader could not start");
+  }
+  // The renderer's CPU limit ends it with SIGXCPU, then SIGKILL.
+  if (ending.kind == Kind::kTimedOut ||
+      (ending.kind == Kind::kSignalled && (ending.value == SIGXCPU || ending.value == SIGKILL))) {
+    throw PictureFileError("The metafile takes too long to draw");
+  }
+  throw PictureFileError("The metafile cannot be drawn");
+}
 
 }  // namespace
 
@@ -134,84 +166,37 @@ TBitmap32 DecodeWindowsMetafile(Bytes data, std::int64_t maxPixels) {
         static_cast<std::uint8_t>(largest >> (8 * i));
   }
 
-  WmfApi api;
-  api.Open(file);
-  Playback playback;
-  playback.deadline = std::chrono::steady_clock::now() + std::chrono::seconds(20);
-  wmf_status_function(api.get(), &playback, Status);
-
-  wmfD_Rect bounds{};
-  if (wmf_scan(api.get(), 0, &bounds) != wmf_E_None) {
-    throw PictureFileError(playback.timedOut ? "The metafile takes too long to read"
-                                             : "The metafile is damaged");
+  const std::string renderer = FindRenderer();
+  if (renderer.empty()) throw PictureFileError("The metafile reader is not installed");
+  // The renderer never makes a picture larger than the program could hold.
+  const std::int64_t rendererMaxPixels =
+      std::clamp<std::int64_t>(maxPixels, 0, TBitmap32::kMaxPixels);
+  RenderReply reply(rendererMaxPixels);
+  const HelperEnding ending =
+      RunHelper(renderer, {std::to_string(rendererMaxPixels), std::to_string(file.size())}, file,
+                std::chrono::seconds(wmf_render::WallClockSeconds(rendererMaxPixels)), reply);
+  if (!reply.Complete()) ThrowForIncompleteReply(ending);
+  using wmf_render::Reply;
+  switch (reply.reply()) {
+    case Reply::kPicture:
+      return reply.TakePicture();
+    case Reply::kSize:
+      CheckPictureSize(reply.width(), reply.height(), rendererMaxPixels, "metafile");
+      break;
+    case Reply::kNotStarted:
+      throw PictureFileError("The metafile reader could not start");
+    case Reply::kNotOpened:
+      throw PictureFileError("The metafile cannot be opened");
+    case Reply::kDamaged:
+      throw PictureFileError("The metafile is damaged");
+    case Reply::kNoUnitsPerInch:
+      throw PictureFileError("The metafile has no units per inch");
+    case Reply::kNoPictureSize:
+      throw PictureFileError("The metafile has no picture size");
+    case Reply::kNotDrawn:
+      break;
   }
-  // The player works in points. A placeable file's frame is its bounding box, with the box's
-  // top-left corner as the window origin the file's records set; other files are as large as
-  // what they draw.
-  if (header == kPlaceableSize) {
-    const auto frame = [&data](std::size_t at) {
-      return static_cast<std::int16_t>(ReadWord(data, at));
-    };
-    const int unitsPerInch = ReadWord(data, 14);
-    if (unitsPerInch == 0) throw PictureFileError("The metafile has no units per inch");
-    const double toPoints = 72.0 / unitsPerInch;
-    bounds.TL.x = 0;
-    bounds.TL.y = 0;
-    bounds.BR.x = static_cast<float>((frame(10) - frame(6)) * toPoints);
-    bounds.BR.y = static_cast<float>((frame(12) - frame(8)) * toPoints);
-  }
-  unsigned int width = 0, height = 0;
-  if (wmf_display_size(api.get(), &width, &height, kMetafileDotsPerInch, kMetafileDotsPerInch) !=
-      wmf_E_None) {
-    throw PictureFileError("The metafile has no picture size");
-  }
-  if (!(std::isfinite(bounds.TL.x) && std::isfinite(bounds.TL.y) && std::isfinite(bounds.BR.x) &&
-        std::isfinite(bounds.BR.y)) ||
-      !(bounds.BR.x > bounds.TL.x) || !(bounds.BR.y > bounds.TL.y)) {
-    throw PictureFileError("The metafile has no picture size");
-  }
-  CheckPictureSize(width, height, maxPixels, "metafile");
-
-  // The player hands its picture over as PNG: its in-memory image cannot be freed through
-  // this version's interface (it would leak), whereas the PNG path frees everything itself.
-  std::vector<std::uint8_t> png;
-  auto* device = WMF_GD_GetData(api.get());
-  if ((device->flags & WMF_GD_SUPPORTS_PNG) == 0) {
-    throw PictureFileError("The metafile reader was built without PNG output");
-  }
-  device->type = wmf_gd_png;
-  device->flags |= WMF_GD_OUTPUT_MEMORY | WMF_GD_OWN_BUFFER;
-  device->sink.context = &png;
-  device->sink.function = CollectPng;
-  device->bbox = bounds;
-  device->width = width;
-  device->height = height;
-  if (wmf_play(api.get(), 0, &bounds) != wmf_E_None || png.empty()) {
-    throw PictureFileError(playback.timedOut ? "The metafile takes too long to draw"
-                                             : "The metafile cannot be drawn");
-  }
-  QImage image;
-  if (!image.loadFromData(png.data(), static_cast<int>(png.size()), "png") ||
-      image.width() != static_cast<int>(width) || image.height() != static_cast<int>(height)) {
-    throw PictureFileError("The metafile cannot be drawn");
-  }
-  image.convertTo(QImage::Format_ARGB32);
-  if (image.isNull()) throw PictureFileError("Out of memory");
-
-  // Whatever the player left transparent shows the white background.
-  TBitmap32 result(static_cast<int>(width), static_cast<int>(height));
-  for (int y = 0; y < result.Height(); ++y) {
-    Pixel* row = result.ScanLine(y);
-    const auto* source = reinterpret_cast<const Pixel*>(image.constScanLine(y));
-    for (int x = 0; x < result.Width(); ++x) {
-      const Pixel p = source[x];
-      const auto over = [alpha = unsigned{p.a}](unsigned c) {
-        return static_cast<std::uint8_t>((c * alpha + 255 * (255 - alpha) + 127) / 255);
-      };
-      row[x] = Pixel{over(p.b), over(p.g), over(p.r), 255};
-    }
-  }
-  return result;
+  throw PictureFileError("The metafile cannot be drawn");
 }
 
 TBitmap32 DecodeMetafile(Bytes data, std::int64_t maxPixels) {

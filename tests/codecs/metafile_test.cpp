@@ -1,4 +1,9 @@
 // Windows metafiles (played by libwmf) and enhanced metafiles (our own reader and writer).
+#include <sys/wait.h>
+
+#include <cerrno>
+#include <cstdlib>
+
 #include "tests/codecs/test_support.h"
 
 namespace quillane::testing {
@@ -79,6 +84,62 @@ TEST(WindowsMetafile, MadeUpLargestRecordFieldIsCorrected) {
     const TBitmap32 p = DecodeMetafile(file);
     EXPECT_EQ(p.At(20, 15), kRed) << claimed;
     EXPECT_EQ(p.At(2, 2), kWhite) << claimed;
+  }
+}
+
+// The error message of decoding file, or "" when it decodes.
+std::string DecodeError(const std::vector<std::uint8_t>& file) {
+  try {
+    DecodeMetafile(file, 1 << 22);
+    return "";
+  } catch (const PictureFileError& error) {
+    return error.what();
+  }
+}
+
+// Found by fuzzing: a pen 3841 units wide on a 40 x 30 window kept libwmf drawing for minutes
+// inside a single record, out of reach of any check between records.
+TEST(WindowsMetafile, EndlessDrawingIsStoppedAndReported) {
+  ByteWriter file;
+  file.U32(0x9AC6CDD7).U16(0).I16(-2304).I16(-1).I16(215).I16(30).U16(96).U32(0).U16(0x5747);
+  file.U16(1).U16(9).U16(0x0300).U32(0x3B).U16(2).U32(6).U16(0);
+  file.U32(5).U16(0x020C).I16(30).I16(40);                     // SetWindowExt
+  file.U32(7).U16(0x02FC).U16(0).U32(0x00FF).U16(0);           // CreateBrushIndirect
+  file.U32(4).U16(0x017A).U16(0);                              // SetPolyFillMode
+  file.U32(8).U16(0x02FA).U16(0).U32(0x0F01).U32(0x0F00);      // CreatePenIndirect, width 3841
+  file.U32(4).U16(0x012D).U16(1);                              // SelectObject
+  file.U32(7).U16(0x041B).I16(25).I16(30).I16(5).I16(10);      // Rectangle
+  file.U32(7).U16(0x0418).I16(28).I16(0x5526).I16(2).I16(20);  // Ellipse
+  file.U32(3).U16(0);
+  ASSERT_EQ(file.Size(), 130u);
+  const std::string error = DecodeError(file.bytes);
+  EXPECT_TRUE(error == "The metafile takes too long to draw" ||
+              error == "The metafile cannot be drawn")
+      << error;
+  // The renderer was killed and reaped, as after an ordinary picture.
+  EXPECT_EQ(DecodeMetafile(WmfWithRectangle()).At(20, 15), kRed);
+  errno = 0;
+  EXPECT_EQ(::waitpid(-1, nullptr, WNOHANG), -1);
+  EXPECT_EQ(errno, ECHILD);
+}
+
+TEST(WindowsMetafile, MissingOrWrongRendererIsReported) {
+  struct Renderer {
+    explicit Renderer(const char* path) { ::setenv("QUILLANE_WMF_RENDER", path, 1); }
+    ~Renderer() { ::unsetenv("QUILLANE_WMF_RENDER"); }
+  };
+  {
+    Renderer missing("/nonexistent/quillane-wmf-render");
+    EXPECT_EQ(DecodeError(WmfWithRectangle()), "The metafile reader is not installed");
+  }
+  {
+    Renderer silent("/bin/true");
+    EXPECT_EQ(DecodeError(WmfWithRectangle()), "The metafile cannot be drawn");
+  }
+  {
+    // Sends the file back: no reply it could mean, and more bytes than any reply without pixels.
+    Renderer echo("/bin/cat");
+    EXPECT_EQ(DecodeError(WmfWithRectangle()), "The metafile cannot be drawn");
   }
 }
 
