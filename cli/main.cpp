@@ -1,6 +1,7 @@
 // quillane-cli: the effects of Quillane from the command line, without any window.
 #include <unistd.h>
 
+#include <QtGlobal>
 #include <iostream>
 #include <string>
 #include <vector>
@@ -8,7 +9,22 @@
 #include "cli/cli_commands.h"
 #include "cli/cli_options.h"
 
+namespace {
+
+QtMessageHandler qtDefaultHandler = nullptr;
+
+// The command line reports a file it cannot read in its own words; the warnings Qt's image
+// readers print about the same hostile file are noise. Critical and fatal messages still show.
+void QuietQtMessages(QtMsgType type, const QMessageLogContext& context, const QString& message) {
+  if ((type == QtCriticalMsg || type == QtFatalMsg) && qtDefaultHandler != nullptr) {
+    qtDefaultHandler(type, context, message);
+  }
+}
+
+}  // namespace
+
 int main(int argc, char** argv) {
+  qtDefaultHandler = qInstallMessageHandler(QuietQtMessages);
   using namespace quillane::cli;
   const std::vector<std::string> args(argv + 1, argv + argc);
   const ParseResult parsed = ParseCommandLine(args);
