@@ -9,6 +9,7 @@
 #include <sys/resource.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <cmath>
 #include <cstdint>
@@ -43,8 +44,12 @@ constexpr bool kAddressSanitizer = false;
 constexpr bool kAddressSanitizer = false;
 #endif
 
+// Never above a limit the program was started with: only lowering is allowed.
 bool SetLimit(int resource, rlim_t soft, rlim_t hard) {
-  const rlimit limit{soft, hard};
+  rlimit limit{};
+  if (getrlimit(resource, &limit) != 0) return false;
+  hard = std::min(hard, limit.rlim_max);  // RLIM_INFINITY is the largest value
+  limit = {std::min(soft, hard), hard};
   return setrlimit(resource, &limit) == 0;
 }
 
