@@ -1,18 +1,46 @@
 // Quillane: turns photographs into artwork.
 #include <QApplication>
+#include <exception>
 
 #include "app/main_window.h"
 #include "app/qt_platform.h"
 #include "app/tool_windows.h"
 
+namespace {
+
+// The last line of defence: an error that no command caught ends that command and is shown in
+// the standard error box, instead of escaping into the event loop, which would end the
+// program and lose the user's picture.
+class Application : public QApplication {
+ public:
+  Application(int& argc, char** argv, quillane::PlatformServices& platform)
+      : QApplication(argc, argv), platform_(platform) {}
+
+  bool notify(QObject* receiver, QEvent* event) override {
+    try {
+      return QApplication::notify(receiver, event);
+    } catch (const std::exception& e) {
+      platform_.ShowError(QString::fromLocal8Bit(e.what()));
+    } catch (...) {
+      platform_.ShowError("An unexpected error ended the command.");
+    }
+    return false;
+  }
+
+ private:
+  quillane::PlatformServices& platform_;
+};
+
+}  // namespace
+
 int main(int argc, char* argv[]) {
-  QApplication app(argc, argv);
+  quillane::QtPlatformServices platform;
+  Application app(argc, argv, platform);
   QApplication::setApplicationName("Quillane");
   QApplication::setApplicationVersion("4.36");
   // The program ends when its main window closes, whatever tool window is still open.
   QApplication::setQuitOnLastWindowClosed(false);
 
-  quillane::QtPlatformServices platform;
   quillane::TMyPicture mainWindow(platform);
   quillane::CreateToolWindows(mainWindow);
   QObject::connect(&mainWindow, &quillane::TMyPicture::closed, &app, &QApplication::quit);

@@ -322,8 +322,7 @@ void ToolWindow::SpeedButton3Click() {
 }
 
 void ToolWindow::SpeedButton4Click() {
-  if (edit1_ == nullptr || edit2_ == nullptr) return;
-  emit batchConvertRequested();
+  if (edit1_ == nullptr || edit2_ == nullptr || !spec_.routine) return;
   BeforeBatch();
   // The loop itself runs the routine (and the history step of the effects whose batch does);
   // the window adds its own steps after each picture.

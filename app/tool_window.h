@@ -62,8 +62,6 @@ class ToolWindow : public QWidget {
  signals:
   // "Color up" was pressed: the freehand painting windows take over the working picture.
   void colorUpRequested();
-  // "Convert" was pressed; the batch loop runs right after.
-  void batchConvertRequested();
 
  protected:
   // What showing and closing the window do; subclasses call the base version first.
