@@ -25,8 +25,7 @@ void PictureDocument::RestoreCurrentSlot() {
   working_ = slots_[static_cast<std::size_t>(currentSlot_ - 1)];
   // Only the widths are compared: a change of height alone leaves the source as it is.
   if (working_.Width() != source_.Width() && !source_.Empty()) {
-    const long double heightFactor =
-        static_cast<long double>(working_.Height()) / source_.Height();
+    const long double heightFactor = static_cast<long double>(working_.Height()) / source_.Height();
     const long double widthFactor = static_cast<long double>(working_.Width()) / source_.Width();
     ZoomInandOut(source_, heightFactor, widthFactor);
   }

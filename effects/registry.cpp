@@ -10,8 +10,7 @@ namespace {
 
 EffectSpec Window(int number, std::string menu, std::string entry, std::string handler,
                   std::string windowClass, std::string caption, std::string status,
-                  std::string cliName, std::string tag, int collapsed, int expanded,
-                  bool colorUp) {
+                  std::string cliName, std::string tag, int collapsed, int expanded, bool colorUp) {
   EffectSpec e;
   e.toolNumber = number;
   e.menu = std::move(menu);
@@ -82,8 +81,8 @@ void AddPencilSketch(EffectSpec& e) {
 std::vector<EffectSpec> BuildEffects() {
   std::vector<EffectSpec> all;
   all.push_back(Window(1, kMono, "Pencil sketch", "Pencilsketch1Click", "TBack_and_White_Sketch",
-                       "Pencil_Sketch", "Pencil Sketch", "pencil-sketch", "PencilSketch", 108,
-                       184, true));
+                       "Pencil_Sketch", "Pencil Sketch", "pencil-sketch", "PencilSketch", 108, 184,
+                       true));
   AddPencilSketch(all.back());
   all.push_back(Window(2, kMono, "Pen sketch", "Pensketch1Click", "TPen_Sketch", "Pen_Sketch",
                        "Pen Sketch", "pen-sketch", "PenSketch", 108, 184, true));
@@ -94,32 +93,31 @@ std::vector<EffectSpec> BuildEffects() {
   all.push_back(Window(5, kColor, "Color Pencil", "Colorsketch1Click", "TColor_Sketch",
                        "Color_Pencil", "Color Sketch", "color-pencil", "ZidovUzivid", 107, 184,
                        false));
-  all.push_back(Window(6, kColor, "Realism", "Realism1Click", "TFormOfFringe1",
-                       "Setup for Realism", "Realism", "realism", "Realism", 157, 240, false));
+  all.push_back(Window(6, kColor, "Realism", "Realism1Click", "TFormOfFringe1", "Setup for Realism",
+                       "Realism", "realism", "Realism", 157, 240, false));
   all.push_back(Window(7, kColor, "Abstract", "Abstract1Click", "TFormOfFringe2",
                        "Setup for Abstract", "Abstract art", "abstract", "Abstract", 157, 240,
                        false));
-  all.push_back(Window(8, kColor, "Pop art", "Popart1Click", "TFormOfFringe3",
-                       "Setup for Pop art", "Pop art", "pop-art", "Pop-art", 157, 240, false));
-  all.push_back(Window(9, kColor, "Water color", "Watercolor1Click", "TWater_Color",
-                       "Water_Color", "Water color", "water-color", "WaterColor", 103, 184,
-                       false));
+  all.push_back(Window(8, kColor, "Pop art", "Popart1Click", "TFormOfFringe3", "Setup for Pop art",
+                       "Pop art", "pop-art", "Pop-art", 157, 240, false));
+  all.push_back(Window(9, kColor, "Water color", "Watercolor1Click", "TWater_Color", "Water_Color",
+                       "Water color", "water-color", "WaterColor", 103, 184, false));
   all.push_back(Window(10, kColor, "Brume", "Brume1Click", "TBrume", "Brume", "Brume", "brume",
                        "Brume", 103, 184, false));
-  all.push_back(Window(11, kAdjust, "HSL adjust", "HSLadjust1Click", "THSL_Adjust",
-                       "HSL_Adjust", "HSL Adjusted", "hsl-adjust", "", 0, 0, false));
+  all.push_back(Window(11, kAdjust, "HSL adjust", "HSLadjust1Click", "THSL_Adjust", "HSL_Adjust",
+                       "HSL Adjusted", "hsl-adjust", "", 0, 0, false));
   all.push_back(Window(12, kAdjust, "Color variety", "Colorvariety1Click", "TColor_variety",
                        "Color_variety", "Color Varied", "color-variety", "", 0, 0, false));
   all.push_back(Window(13, kAdjust, "Color panel", "Colorpanel1Click", "TColor_Panel",
                        "Color_Panel", "Color Panels", "color-panel", "", 0, 0, false));
-  all.push_back(Window(14, kVeins, "Texture", "exture1Click", "TTexture", "Texture",
-                       "Made texture", "texture", "Texture", 288, 368, false));
+  all.push_back(Window(14, kVeins, "Texture", "exture1Click", "TTexture", "Texture", "Made texture",
+                       "texture", "Texture", 288, 368, false));
   all.push_back(Window(15, kVeins, "Emboss", "Emboss1Click", "TEmboss", "Emboss", "Emboss",
                        "emboss", "Emboss", 103, 184, false));
   all.push_back(Window(16, kAdjust, "Color Filter", "ColorFilter2Click", "TColor_Filter",
                        "Color_Filter", "Color Filter", "color-filter", "", 0, 0, false));
-  all.push_back(Window(17, kVeins, "Stria", "Verticalstria1Click", "TStria", "Stria",
-                       "Added stria", "stria", "Stria", 159, 240, false));
+  all.push_back(Window(17, kVeins, "Stria", "Verticalstria1Click", "TStria", "Stria", "Added stria",
+                       "stria", "Stria", 159, 240, false));
   return all;
 }
 

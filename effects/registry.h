@@ -43,16 +43,16 @@ struct ControlSpec {
   int minimum = 0;
   int maximum = 0;
   int defaultValue = 0;
-  int pageStep = 0;          // 0: the toolkit's default
-  std::string numberLabel;   // the label showing the number: "Label4" (may be empty)
-  std::string initialNumber; // its caption before the control first moves: "50"
+  int pageStep = 0;           // 0: the toolkit's default
+  std::string numberLabel;    // the label showing the number: "Label4" (may be empty)
+  std::string initialNumber;  // its caption before the control first moves: "50"
   // The number shown for a position; empty: the position itself.
   std::function<int(int)> numberFor;
   // Moving this control sets another parameter: for example the pencil's sliders choose the
   // tone mode. Empty when it selects nothing.
   std::string selects;
   int selectValue = 0;
-  std::string help;          // one line for the command line's list
+  std::string help;  // one line for the command line's list
 };
 
 // What a routine reads: the source picture (the picture as opened, after rotation or
@@ -66,21 +66,21 @@ struct EffectInput {
 using EffectRoutine = std::function<TBitmap32(const EffectInput&)>;
 
 struct EffectSpec {
-  int toolNumber = 0;          // 1..17, the active tool number while the window is open
-  std::string menu;            // the menu's caption: " B&&W"
-  std::string menuEntry;       // the entry's caption as displayed: "Pencil sketch"
-  std::string menuHandler;     // "Pencilsketch1Click"; also the menu action's object name
-  std::string windowClass;     // "TBack_and_White_Sketch"; the window's object name
-  std::string caption;         // window title: "Pencil_Sketch"
-  std::string statusText;      // status line after apply: "Pencil Sketch"
-  std::string cliName;         // "pencil-sketch"
-  std::string batchTag;        // output name tag; empty when the window has no batch panel
-  int collapsedHeight = 0;     // 0 for windows without a batch panel
+  int toolNumber = 0;       // 1..17, the active tool number while the window is open
+  std::string menu;         // the menu's caption: " B&&W"
+  std::string menuEntry;    // the entry's caption as displayed: "Pencil sketch"
+  std::string menuHandler;  // "Pencilsketch1Click"; also the menu action's object name
+  std::string windowClass;  // "TBack_and_White_Sketch"; the window's object name
+  std::string caption;      // window title: "Pencil_Sketch"
+  std::string statusText;   // status line after apply: "Pencil Sketch"
+  std::string cliName;      // "pencil-sketch"
+  std::string batchTag;     // output name tag; empty when the window has no batch panel
+  int collapsedHeight = 0;  // 0 for windows without a batch panel
   int expandedHeight = 0;
-  bool colorUp = false;        // has the "Color up" button
+  bool colorUp = false;             // has the "Color up" button
   bool batchPushesHistory = false;  // its batch routine records a history step per picture
   std::vector<ControlSpec> controls;
-  EffectRoutine routine;       // empty until the effect is built
+  EffectRoutine routine;  // empty until the effect is built
 
   bool HasBatchPanel() const { return !batchTag.empty(); }
   const ControlSpec* FindControl(const std::string& param) const;

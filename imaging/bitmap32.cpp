@@ -87,8 +87,7 @@ void ZoomInandOut(TBitmap32& bitmap, long double heightFactor, long double width
   TBitmap32 result(newW, newH);
   std::vector<int> column(static_cast<std::size_t>(newW));
   for (int x = 0; x < newW; ++x)
-    column[static_cast<std::size_t>(x)] =
-        static_cast<int>(static_cast<std::int64_t>(x) * w / newW);
+    column[static_cast<std::size_t>(x)] = static_cast<int>(static_cast<std::int64_t>(x) * w / newW);
   for (int y = 0; y < newH; ++y) {
     const Pixel* src = bitmap.ScanLine(static_cast<int>(static_cast<std::int64_t>(y) * h / newH));
     Pixel* dst = result.ScanLine(y);

@@ -17,13 +17,19 @@ static_assert(sizeof(Extended) > sizeof(double),
 // Round to nearest, halves to the even neighbour (2.5 -> 2, 3.5 -> 4), on an extended value.
 // The caller forms the value in extended precision; the default rounding mode is never
 // changed anywhere in the program.
-inline int Round(Extended v) { return static_cast<int>(std::nearbyintl(v)); }
+inline int Round(Extended v) {
+  return static_cast<int>(std::nearbyintl(v));
+}
 
 // Truncation toward zero.
-inline int Trunc(Extended v) { return static_cast<int>(v); }
+inline int Trunc(Extended v) {
+  return static_cast<int>(v);
+}
 
 // Max(0, Min(255, v)) on signed integers.
-constexpr int ClampByte(int v) { return v < 0 ? 0 : (v > 255 ? 255 : v); }
+constexpr int ClampByte(int v) {
+  return v < 0 ? 0 : (v > 255 ? 255 : v);
+}
 
 // Gray value of a pixel: Round(0.3 R + 0.59 G + 0.11 B) summed in extended precision in the
 // order red, green, blue, clamped to a byte.

@@ -5,7 +5,9 @@
 namespace quillane {
 namespace {
 
-TBitmap32 Flat(int w, int h, std::uint8_t v) { return TBitmap32(w, h, Pixel{v, v, v, 255}); }
+TBitmap32 Flat(int w, int h, std::uint8_t v) {
+  return TBitmap32(w, h, Pixel{v, v, v, 255});
+}
 
 TEST(PictureDocument, StartsWithOnePictureEverywhere) {
   PictureDocument doc(TBitmap32(3, 2, Pixel{1, 2, 3, 0}));

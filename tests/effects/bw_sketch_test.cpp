@@ -9,8 +9,12 @@
 namespace quillane {
 namespace {
 
-TBitmap32 Flat(int w, int h, Pixel p) { return TBitmap32(w, h, p); }
-Pixel Gray(std::uint8_t v) { return Pixel{v, v, v, 255}; }
+TBitmap32 Flat(int w, int h, Pixel p) {
+  return TBitmap32(w, h, p);
+}
+Pixel Gray(std::uint8_t v) {
+  return Pixel{v, v, v, 255};
+}
 
 TEST(PencilSketch, FlatPictureGivesUniformTones) {
   const TBitmap32 flat = Flat(6, 5, Pixel{40, 90, 200, 255});

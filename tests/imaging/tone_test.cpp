@@ -94,9 +94,9 @@ TEST(PencilContrastPass, GrayLevelsAtNeutralPosition) {
   const std::vector<int> out = {0, 0, 3, 128, 131, 199, 255, 255};
   const TBitmap32 result = PencilContrastPass(GrayRamp(in), 45);
   for (std::size_t x = 0; x < in.size(); ++x)
-    EXPECT_EQ(result.At(static_cast<int>(x), 1), (Pixel{static_cast<std::uint8_t>(out[x]),
-                                                         static_cast<std::uint8_t>(out[x]),
-                                                         static_cast<std::uint8_t>(out[x]), 255}))
+    EXPECT_EQ(result.At(static_cast<int>(x), 1),
+              (Pixel{static_cast<std::uint8_t>(out[x]), static_cast<std::uint8_t>(out[x]),
+                     static_cast<std::uint8_t>(out[x]), 255}))
         << "level " << in[x];
 }
 
