@@ -9,7 +9,7 @@ FUZZ_SECONDS ?= 20
 GALLERY ?= gallery
 JOBS ?= $(shell nproc)
 
-PACKAGES := build-essential cmake pkg-config clang clang-format \
+PACKAGES := build-essential cmake pkg-config clang libclang-rt-14-dev clang-format \
 	qt6-base-dev qt6-qpa-plugins libgl-dev fonts-dejavu-core \
 	libjpeg62-turbo-dev libgtest-dev libgmock-dev libbenchmark-dev libwmf-dev \
 	xdg-utils
