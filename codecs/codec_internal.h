@@ -56,9 +56,9 @@ TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels = TBi
 
 // Metafiles are told apart by their content: an enhanced metafile starts with an EMR_HEADER
 // record carrying the " EMF" signature; anything else must be a Windows metafile (placeable
-// or not). The picture is played onto a white background; alpha is 255. Windows metafiles are
-// played by libwmf in a separate, limited process (codecs/wmf_render.h); a file that keeps it
-// drawing too long is refused.
+// or not). The picture is played onto a white background; alpha is 255. Windows metafiles, and
+// enhanced metafiles with more than bitmaps in them, are drawn in a separate, limited process
+// (codecs/metafile_render.h); a file that keeps it drawing too long is refused.
 TBitmap32 DecodeMetafile(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels);
 bool LooksLikeEnhancedMetafile(Bytes data);
 TBitmap32 DecodeEnhancedMetafile(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels);

@@ -3,13 +3,17 @@
 //
 // The reader understands the records that place device-independent bitmaps (StretchDIBits,
 // BitBlt, StretchBlt, SetDIBitsToDevice) together with the window, viewport and world
-// transforms that position them. Vector drawing (lines, shapes, text) is not played; such
-// content leaves the white background showing.
+// transforms that position them, and plays such files itself. A file with any other drawing
+// (lines, shapes, text, fills) goes to quillane-emf-render, a limited process of its own
+// (metafile_render.h), once its header and record sizes have been checked here.
 #include <algorithm>
 #include <cmath>
+#include <cstdio>
 #include <cstring>
 
 #include "codecs/codec_internal.h"
+#include "codecs/metafile_render.h"
+#include "codecs/render_client.h"
 
 namespace quillane::codecs {
 namespace {
@@ -21,15 +25,31 @@ enum : std::uint32_t {
   kEmrSetWindowOrgEx = 10,
   kEmrSetViewportExtEx = 11,
   kEmrSetViewportOrgEx = 12,
+  kEmrSetBrushOrgEx = 13,
+  kEmrSetMapperFlags = 16,
   kEmrSetMapMode = 17,
+  kEmrSetBkMode = 18,
+  kEmrSetPolyFillMode = 19,
+  kEmrSetRop2 = 20,
+  kEmrSetStretchBltMode = 21,
+  kEmrSetTextAlign = 22,
+  kEmrSetTextColor = 24,
+  kEmrSetBkColor = 25,
   kEmrSaveDc = 33,
   kEmrRestoreDc = 34,
   kEmrSetWorldTransform = 35,
   kEmrModifyWorldTransform = 36,
+  kEmrSelectObject = 37,
+  kEmrCreatePen = 38,
+  kEmrCreateBrushIndirect = 39,
+  kEmrDeleteObject = 40,
+  kEmrSetMiterLimit = 58,
+  kEmrGdiComment = 70,
   kEmrBitBlt = 76,
   kEmrStretchBlt = 77,
   kEmrSetDiBitsToDevice = 80,
   kEmrStretchDiBits = 81,
+  kEmrSetIcmMode = 98,
 };
 constexpr std::uint32_t kEmfSignature = 0x464D4520;  // " EMF"
 constexpr std::uint32_t kSrcCopy = 0x00CC0020;
@@ -119,10 +139,28 @@ TBitmap32 DecodeRecordBitmap(Bytes record, std::uint32_t offBmi, std::uint32_t c
 
 class Player {
  public:
-  Player(Bytes data, std::int64_t maxPixels) : data_(data), maxPixels_(maxPixels) {}
+  Player(Bytes data, std::int64_t maxPixels) : data_(data), maxPixels_(maxPixels) { ReadHeader(); }
+
+  // Whether the file draws anything besides bitmaps: it then goes to the renderer. The walk
+  // refuses records of a bad size as playing would.
+  bool HasVectorDrawing() const {
+    bool vector = false;
+    for (std::size_t at = headerSize_; at < data_.size();) {
+      if (data_.size() - at < 8) throw PictureFileError("The metafile ends inside a record");
+      const std::uint32_t type = U32(data_, at);
+      const std::uint32_t size = U32(data_, at + 4);
+      if (size < 8 || size > data_.size() - at) {
+        throw PictureFileError("The metafile has a record of a bad size");
+      }
+      if (type == kEmrEof) break;
+      vector = vector || !Playable(type, data_.subspan(at, size));
+      at += size;
+    }
+    return vector;
+  }
 
   TBitmap32 Play() {
-    ReadHeader();
+    canvas_ = TBitmap32(width_, height_, Pixel{255, 255, 255, 255});
     std::size_t at = headerSize_;
     while (at < data_.size()) {
       if (data_.size() - at < 8) throw PictureFileError("The metafile ends inside a record");
@@ -139,7 +177,51 @@ class Player {
     return std::move(canvas_);
   }
 
+  TBitmap32 Render() const;
+
  private:
+  // The records played here, and those that only set state the bitmaps do not depend on.
+  // A bitmap record without a bitmap is a brush fill, which is not played here.
+  static bool Playable(std::uint32_t type, Bytes r) {
+    switch (type) {
+      case kEmrSetWindowExtEx:
+      case kEmrSetWindowOrgEx:
+      case kEmrSetViewportExtEx:
+      case kEmrSetViewportOrgEx:
+      case kEmrSetBrushOrgEx:
+      case kEmrSetMapperFlags:
+      case kEmrSetMapMode:
+      case kEmrSetBkMode:
+      case kEmrSetPolyFillMode:
+      case kEmrSetRop2:
+      case kEmrSetStretchBltMode:
+      case kEmrSetTextAlign:
+      case kEmrSetTextColor:
+      case kEmrSetBkColor:
+      case kEmrSaveDc:
+      case kEmrRestoreDc:
+      case kEmrSetWorldTransform:
+      case kEmrModifyWorldTransform:
+      case kEmrSelectObject:
+      case kEmrCreatePen:
+      case kEmrCreateBrushIndirect:
+      case kEmrDeleteObject:
+      case kEmrSetMiterLimit:
+      case kEmrGdiComment:
+      case kEmrSetIcmMode:
+        return true;
+      // Too short to hold the bitmap fields: refused when played.
+      case kEmrStretchDiBits:
+      case kEmrSetDiBitsToDevice:
+        return r.size() < 56 || U32(r, 52) != 0;
+      case kEmrBitBlt:
+      case kEmrStretchBlt:
+        return r.size() < 92 || U32(r, 88) != 0;
+      default:
+        return false;
+    }
+  }
+
   void ReadHeader() {
     if (!LooksLikeEnhancedMetafile(data_)) {
       throw PictureFileError("The file is not an enhanced metafile");
@@ -188,8 +270,8 @@ class Player {
     if (width > 1e9 || height > 1e9) width = height = 1e9;  // refused just below
     CheckPictureSize(static_cast<std::int64_t>(width), static_cast<std::int64_t>(height),
                      maxPixels_, "metafile");
-    canvas_ =
-        TBitmap32(static_cast<int>(width), static_cast<int>(height), Pixel{255, 255, 255, 255});
+    width_ = static_cast<int>(width);
+    height_ = static_cast<int>(height);
     deviceToCanvas_.m11 = width / deviceWidth;
     deviceToCanvas_.m22 = height / deviceHeight;
     deviceToCanvas_.dx = -deviceLeft * deviceToCanvas_.m11;
@@ -375,12 +457,40 @@ class Player {
   Bytes data_;
   std::int64_t maxPixels_;
   std::size_t headerSize_ = 0;
+  int width_ = 0, height_ = 0;
   TBitmap32 canvas_;
   Transform deviceToCanvas_;
   DcState dc_;
   std::vector<DcState> saved_;
   std::int64_t paintBudget_ = 0;
 };
+
+TBitmap32 Player::Render() const {
+  if (data_.size() > 0x7FFFFFFF) throw PictureFileError("The metafile is too large");
+  if (!deviceToCanvas_.Finite()) throw PictureFileError("The metafile cannot be drawn");
+  const std::string renderer = FindRenderer("QUILLANE_EMF_RENDER", metafile_render::kEmfProgramName,
+                                            QUILLANE_EMF_RENDER_BUILT);
+  if (renderer.empty()) throw PictureFileError("The metafile reader is not installed");
+  const auto number = [](double value) {
+    char text[40];
+    std::snprintf(text, sizeof text, "%.17g", value);
+    return std::string(text);
+  };
+  RendererAnswer answer =
+      RunRenderer(renderer,
+                  {std::to_string(width_), std::to_string(height_), std::to_string(data_.size()),
+                   number(deviceToCanvas_.m11), number(deviceToCanvas_.m22),
+                   number(deviceToCanvas_.dx), number(deviceToCanvas_.dy)},
+                  data_, std::int64_t{width_} * height_);
+  if (answer.reply == metafile_render::Reply::kNotStarted) {
+    throw PictureFileError("The metafile reader could not start");
+  }
+  if (answer.reply != metafile_render::Reply::kPicture || answer.picture.Width() != width_ ||
+      answer.picture.Height() != height_) {
+    throw PictureFileError("The metafile cannot be drawn");
+  }
+  return std::move(answer.picture);
+}
 
 }  // namespace
 
@@ -389,7 +499,8 @@ bool LooksLikeEnhancedMetafile(Bytes data) {
 }
 
 TBitmap32 DecodeEnhancedMetafile(Bytes data, std::int64_t maxPixels) {
-  return Player(data, maxPixels).Play();
+  Player player(data, maxPixels);
+  return player.HasVectorDrawing() ? player.Render() : player.Play();
 }
 
 // A header, one StretchDIBits record holding the picture as a bottom-up 24-bit DIB drawn at

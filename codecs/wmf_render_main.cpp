@@ -1,28 +1,23 @@
 // quillane-wmf-render: plays one Windows metafile through libwmf's gd device and hands back its
-// pixels (the exchange is described in wmf_render.h). It limits itself before it reads a byte,
+// pixels (the exchange is described in metafile_render.h). It limits itself before it reads a byte,
 // so a file that makes libwmf draw without end or allocate without bound only ends this process.
 // The decoder has already walked the file's records and refused malformed ones.
 // clang-format off
 #include <libwmf/api.h>
 #include <libwmf/gd.h>
 // clang-format on
-#include <sys/resource.h>
-#include <unistd.h>
-
-#include <algorithm>
-#include <cerrno>
 #include <cmath>
 #include <cstdint>
-#include <cstdlib>
-#include <cstring>
 #include <vector>
 
-#include "codecs/wmf_render.h"
+#include "codecs/metafile_render.h"
+#include "codecs/render_child.h"
 
 namespace {
 
-using quillane::codecs::wmf_render::Reply;
-namespace limits = quillane::codecs::wmf_render;
+using quillane::codecs::metafile_render::Reply;
+namespace limits = quillane::codecs::metafile_render;
+using namespace quillane::codecs::render_child;
 
 constexpr std::uint32_t kPlaceableKey = 0x9AC6CDD7;
 constexpr std::size_t kPlaceableSize = 22;
@@ -32,70 +27,10 @@ constexpr unsigned kDotsPerInch = 96;
 // keeping the player reachable from here lets it end without a leak checker's complaint.
 wmfAPI* gPlayer = nullptr;
 
-#if defined(__SANITIZE_ADDRESS__)
-constexpr bool kAddressSanitizer = true;
-#elif defined(__has_feature)
-#if __has_feature(address_sanitizer)
-constexpr bool kAddressSanitizer = true;
-#else
-constexpr bool kAddressSanitizer = false;
-#endif
-#else
-constexpr bool kAddressSanitizer = false;
-#endif
-
-// Never above a limit the program was started with: only lowering is allowed.
-bool SetLimit(int resource, rlim_t soft, rlim_t hard) {
-  rlimit limit{};
-  if (getrlimit(resource, &limit) != 0) return false;
-  hard = std::min(hard, limit.rlim_max);  // RLIM_INFINITY is the largest value
-  limit = {std::min(soft, hard), hard};
-  return setrlimit(resource, &limit) == 0;
-}
-
-// Until the picture's size is known, the CPU allowance is the fixed one; neither SIGXCPU nor
-// SIGKILL leaves a core behind.
-bool LimitSelf(std::uint64_t maxPixels, std::uint64_t fileSize) {
-  bool done = SetLimit(RLIMIT_CORE, 0, 0) &&
-              SetLimit(RLIMIT_CPU, limits::kCpuSeconds, limits::CpuSeconds(maxPixels) + 1) &&
-              SetLimit(RLIMIT_FSIZE, 0, 0);
-  // AddressSanitizer reserves terabytes of address space for its shadow memory at start-up, so
-  // a sanitizer build can only rely on the CPU limit and the sanitizer's own allocation checks.
-  if (!kAddressSanitizer) {
-    const std::uint64_t bytes = maxPixels * 4 + fileSize + limits::kSpareAddressSpace;
-    done = done && SetLimit(RLIMIT_AS, bytes, bytes);
-  }
-  return done;
-}
-
-bool WriteAll(const void* data, std::size_t size) {
-  const auto* at = static_cast<const std::uint8_t*>(data);
-  while (size > 0) {
-    const ssize_t put = write(STDOUT_FILENO, at, size);
-    if (put < 0) {
-      if (errno == EINTR) continue;
-      return false;
-    }
-    at += put;
-    size -= static_cast<std::size_t>(put);
-  }
-  return true;
-}
-
-int Answer(Reply reply, std::uint32_t width = 0, std::uint32_t height = 0) {
-  const std::uint32_t header[3] = {static_cast<std::uint32_t>(reply), width, height};
-  return WriteAll(header, sizeof header) ? 0 : 1;
-}
-
-bool ReadAll(std::vector<std::uint8_t>& bytes) {
-  std::size_t done = 0;
-  while (done < bytes.size()) {
-    const ssize_t got = read(STDIN_FILENO, bytes.data() + done, bytes.size() - done);
-    if (got < 0 && errno == EINTR) continue;
-    if (got <= 0) return false;
-    done += static_cast<std::size_t>(got);
-  }
-  return true;
+// Until the picture's size is known, the CPU allowance is the fixed one.
+bool LimitBeforeReading(std::uint64_t maxPixels, std::uint64_t fileSize) {
+  return LimitSelf(limits::kCpuSeconds, limits::CpuSeconds(maxPixels) + 1,
+                   maxPixels * 4 + fileSize + limits::kSpareAddressSpace);
 }
 
 std::uint16_t ReadWord(const std::vector<std::uint8_t>& d, std::size_t at) {
@@ -128,15 +63,6 @@ bool SendPicture(const int* pixels, std::uint32_t width, std::uint32_t height) {
   return true;
 }
 
-bool ParseCount(const char* text, std::uint64_t most, std::uint64_t& value) {
-  char* end = nullptr;
-  errno = 0;
-  const unsigned long long parsed = std::strtoull(text, &end, 10);
-  if (errno != 0 || end == text || *end != '\0' || parsed > most) return false;
-  value = parsed;
-  return true;
-}
-
 }  // namespace
 
 int main(int argc, char** argv) {
@@ -145,7 +71,7 @@ int main(int argc, char** argv) {
       !ParseCount(argv[2], 0x7FFFFFFF, fileSize) || fileSize < kPlaceableSize) {
     return Answer(Reply::kNotStarted);
   }
-  if (!LimitSelf(maxPixels, fileSize)) return Answer(Reply::kNotStarted);
+  if (!LimitBeforeReading(maxPixels, fileSize)) return Answer(Reply::kNotStarted);
   std::vector<std::uint8_t> file(static_cast<std::size_t>(fileSize));
   if (!ReadAll(file)) return Answer(Reply::kNotOpened);
   const bool placeable =

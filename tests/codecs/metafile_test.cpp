@@ -1,4 +1,5 @@
-// Windows metafiles (played by libwmf) and enhanced metafiles (our own reader and writer).
+// Windows metafiles (played by libwmf) and enhanced metafiles (our own reader and writer, and
+// the renderer program for vector content).
 #include <sys/wait.h>
 
 #include <cerrno>
@@ -255,11 +256,93 @@ TEST(EnhancedMetafile, RefusesDamagedAndHostileFiles) {
   EXPECT_THROW(DecodeMetafile(wide), PictureFileError);
 }
 
+// A solid blue brush, the stock null pen, and a polygon filling (10, 5) to (30, 25) on a 40 x 30
+// frame: vector drawing, which the renderer program draws.
+std::vector<std::uint8_t> EmfWithPolygon() {
+  ByteWriter w;
+  w.U32(39).U32(24).U32(1).U32(0).U32(0x00FF0000).U32(0);  // CreateBrushIndirect: solid, blue
+  w.U32(37).U32(12).U32(1);                                // SelectObject
+  w.U32(37).U32(12).U32(0x80000008);                       // SelectObject: NULL_PEN
+  w.U32(86).U32(28 + 4 * 4).I32(10).I32(5).I32(30).I32(25).U32(4);  // Polygon16
+  w.I16(10).I16(5).I16(30).I16(5).I16(30).I16(25).I16(10).I16(25);
+  return Emf(40, 30, w.bytes);
+}
+
+TEST(EnhancedMetafile, DrawsVectorContentOnWhite) {
+  const TBitmap32 p = DecodeMetafile(EmfWithPolygon());
+  ASSERT_EQ(p.Width(), 40);
+  ASSERT_EQ(p.Height(), 30);
+  // Inside, away from the antialiased edges, and well outside.
+  for (const auto& [x, y] : {std::pair{12, 7}, {20, 15}, {28, 23}}) {
+    EXPECT_EQ(p.At(x, y), kBlue) << x << "," << y;
+  }
+  for (const auto& [x, y] : {std::pair{0, 0}, {7, 15}, {33, 15}, {20, 2}, {20, 28}, {39, 29}}) {
+    EXPECT_EQ(p.At(x, y), kWhite) << x << "," << y;
+  }
+
+  // Bitmaps and shapes in one file: the renderer draws both.
+  ByteWriter both;
+  both.Append(StretchDiBits(0, 0, 8, 8));
+  both.U32(39).U32(24).U32(1).U32(0).U32(0x000000FF).U32(0);
+  both.U32(37).U32(12).U32(1).U32(37).U32(12).U32(0x80000008);
+  both.U32(43).U32(24).I32(10).I32(5).I32(30).I32(25);  // Rectangle
+  const TBitmap32 mixed = DecodeMetafile(Emf(40, 30, both.bytes));
+  EXPECT_EQ(mixed.At(1, 1), kRed);
+  EXPECT_EQ(mixed.At(6, 1), kGreen);
+  EXPECT_EQ(mixed.At(1, 6), kBlue);
+  EXPECT_EQ(mixed.At(20, 15), kRed);
+  EXPECT_EQ(mixed.At(35, 15), kWhite);
+}
+
+// Text needs fonts, which the renderer finds with no display.
+TEST(EnhancedMetafile, DrawsText) {
+  ByteWriter w;
+  w.U32(82).U32(12 + 92).U32(1).I32(-40).I32(0).I32(0).I32(0).I32(400).U32(0).U32(0);
+  ByteWriter face;
+  for (char c : std::string("DejaVu Sans")) face.U16(static_cast<unsigned char>(c));
+  face.bytes.resize(64);
+  w.Append(face.bytes);                                // ExtCreateFontIndirectW
+  w.U32(37).U32(12).U32(1);                            // SelectObject
+  w.U32(84).U32(76 + 12).I32(0).I32(0).I32(0).I32(0);  // ExtTextOutW
+  w.U32(1).F32(0).F32(0).I32(10).I32(10).U32(5).U32(76).U32(0);
+  w.I32(0).I32(0).I32(0).I32(0).U32(0);
+  for (char c : std::string("Hello")) w.U16(static_cast<unsigned char>(c));
+  w.U16(0);
+  const TBitmap32 p = DecodeMetafile(Emf(200, 60, w.bytes));
+  int dark = 0;
+  for (int y = 0; y < p.Height(); ++y) {
+    for (int x = 0; x < p.Width(); ++x) dark += p.At(x, y).g < 128;
+  }
+  EXPECT_GT(dark, 200);
+  EXPECT_EQ(p.At(190, 5), kWhite);
+}
+
+TEST(EnhancedMetafile, MissingRendererFailsOnlyVectorFiles) {
+  struct Renderer {
+    explicit Renderer(const char* path) { ::setenv("QUILLANE_EMF_RENDER", path, 1); }
+    ~Renderer() { ::unsetenv("QUILLANE_EMF_RENDER"); }
+  };
+  {
+    Renderer missing("/nonexistent/quillane-emf-render");
+    EXPECT_EQ(DecodeError(EmfWithPolygon()), "The metafile reader is not installed");
+    // Bitmaps alone are still played here.
+    ExpectBlocks(DecodeMetafile(Emf(4, 4, StretchDiBits(0, 0, 4, 4))), 0, 0, 2);
+  }
+  {
+    Renderer silent("/bin/true");
+    EXPECT_EQ(DecodeError(EmfWithPolygon()), "The metafile cannot be drawn");
+  }
+  {
+    Renderer echo("/bin/cat");
+    EXPECT_EQ(DecodeError(EmfWithPolygon()), "The metafile cannot be drawn");
+  }
+}
+
 TEST(Metafiles, BitFlippedFilesNeverCrash) {
   codecs::MemorySink sink;
   codecs::EncodeEnhancedMetafile(PatternPicture(12, 9), sink);
   for (const std::vector<std::uint8_t>& file :
-       {sink.bytes(), WmfWithRectangle(), Emf(6, 4, BitBlt(3, 1))}) {
+       {sink.bytes(), WmfWithRectangle(), Emf(6, 4, BitBlt(3, 1)), EmfWithPolygon()}) {
     std::uint32_t random = 99;
     for (int trial = 0; trial < 300; ++trial) {
       std::vector<std::uint8_t> damaged = file;
