@@ -35,6 +35,31 @@ struct Writer {
   }
 };
 
+// The header of a written metafile followed by shapes, a path and text instead of its bitmap:
+// the vector content that goes to the renderer program.
+Bytes VectorEmf(const Bytes& written) {
+  Writer w;
+  w.Add(Bytes(written.begin(), written.begin() + 108));
+  w.U32(39).U32(24).U32(1).U32(0).U32(0x00FF8000).U32(0);         // CreateBrushIndirect
+  w.U32(38).U32(28).U32(2).U32(0).U32(1).U32(0).U32(0x000000FF);  // CreatePen
+  w.U32(37).U32(12).U32(1).U32(37).U32(12).U32(2);                // SelectObject twice
+  w.U32(43).U32(24).U32(0).U32(0).U32(2).U32(1);                  // Rectangle
+  w.U32(42).U32(24).U32(1).U32(0).U32(3).U32(2);                  // Ellipse
+  w.U32(86).U32(40).U32(0).U32(0).U32(3).U32(2).U32(3);           // Polygon16
+  w.U16(0).U16(0).U16(3).U16(0).U16(1).U16(2);
+  w.U32(59).U32(8);                                                    // BeginPath
+  w.U32(27).U32(16).U32(0).U32(0).U32(54).U32(16).U32(2).U32(2);       // MoveTo, LineTo
+  w.U32(60).U32(8).U32(62).U32(24).U32(0).U32(0).U32(2).U32(2);        // EndPath, StrokeAndFillPath
+  w.U32(84).U32(80).U32(0).U32(0).U32(0).U32(0).U32(1).U32(0).U32(0);  // ExtTextOutW "A"
+  w.U32(0).U32(0).U32(1).U32(76).U32(0).U32(0).U32(0).U32(0).U32(0).U32(0).U16('A').U16(0);
+  w.U32(14).U32(20).U32(0).U32(16).U32(20);  // EOF
+  const auto size = static_cast<std::uint32_t>(w.b.size());
+  for (int i = 0; i < 4; ++i)
+    w.b[48 + static_cast<std::size_t>(i)] = static_cast<std::uint8_t>(size >> (8 * i));
+  w.b[52] = 15;  // records
+  return w.b;
+}
+
 TBitmap32 Pattern(int w, int h) {
   TBitmap32 p(w, h);
   for (int y = 0; y < h; ++y) {
@@ -214,6 +239,7 @@ int main(int argc, char** argv) {
     c::MemorySink tiny;
     c::EncodeEnhancedMetafile(Pattern(3, 2), tiny);
     Save(folder, "emf", 1, tiny.bytes());
+    Save(folder, "emf", 2, VectorEmf(tiny.bytes()));
   } catch (const std::exception& error) {
     std::cerr << error.what() << "\n";
     return 1;
