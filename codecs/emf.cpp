@@ -7,8 +7,8 @@
 // (lines, shapes, text, fills) goes to quillane-emf-render, a limited process of its own
 // (metafile_render.h), once its header and record sizes have been checked here.
 #include <algorithm>
+#include <charconv>
 #include <cmath>
-#include <cstdio>
 #include <cstring>
 
 #include "codecs/codec_internal.h"
@@ -471,10 +471,11 @@ TBitmap32 Player::Render() const {
   const std::string renderer = FindRenderer("QUILLANE_EMF_RENDER", metafile_render::kEmfProgramName,
                                             QUILLANE_EMF_RENDER_BUILT);
   if (renderer.empty()) throw PictureFileError("The metafile reader is not installed");
+  // Whatever the program's locale: the renderer reads a decimal point.
   const auto number = [](double value) {
     char text[40];
-    std::snprintf(text, sizeof text, "%.17g", value);
-    return std::string(text);
+    const auto end = std::to_chars(text, text + sizeof text, value).ptr;
+    return std::string(text, end);
   };
   RendererAnswer answer =
       RunRenderer(renderer,

@@ -12,6 +12,7 @@
 #include <QImage>
 #include <QPainter>
 #include <QSvgRenderer>
+#include <charconv>
 #include <cmath>
 #include <cstdint>
 #include <cstdlib>
@@ -31,10 +32,9 @@ constexpr std::uint64_t kMostPixels = std::uint64_t{1} << 31;
 constexpr std::size_t kHeaderSize = 88;
 
 bool ParseNumber(const char* text, double& value) {
-  char* end = nullptr;
-  errno = 0;
-  value = std::strtod(text, &end);
-  return errno == 0 && end != text && *end == '\0' && std::isfinite(value);
+  const char* end = text + std::strlen(text);
+  const auto [stop, error] = std::from_chars(text, end, value);
+  return error == std::errc() && stop == end && std::isfinite(value);
 }
 
 std::int32_t ReadLong(const std::vector<std::uint8_t>& d, std::size_t at) {
