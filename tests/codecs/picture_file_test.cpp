@@ -1,13 +1,11 @@
 // The loader's choice by name, the writers' round trips and their behaviour on failure.
 #include "codecs/picture_file.h"
 
-#include <signal.h>
-#include <sys/resource.h>
-
 #include <QImage>
 #include <filesystem>
 
 #include "tests/codecs/test_support.h"
+#include "tests/file_size_limit.h"
 
 namespace quillane::testing {
 namespace {
@@ -169,12 +167,6 @@ TEST_F(PictureFiles, EmptyPictureIsNotSaved) {
 TEST_F(PictureFiles, FailedWriteLeavesTheOldFileUntouched) {
   const std::vector<std::uint8_t> old = {'o', 'l', 'd', ' ', 'f', 'i', 'l', 'e'};
   const TBitmap32 picture = PatternPicture(300, 300);
-  struct sigaction ignore {
-  }, previous{};
-  ignore.sa_handler = SIG_IGN;
-  ASSERT_EQ(::sigaction(SIGXFSZ, &ignore, &previous), 0);
-  rlimit saved{};
-  ASSERT_EQ(::getrlimit(RLIMIT_FSIZE, &saved), 0);
 
   const std::vector<std::pair<const char*, void (*)(const TBitmap32&, const std::string&)>>
       writers = {{"out.bmp", [](const TBitmap32& p, const std::string& f) { SaveBitmap24(p, f); }},
@@ -183,21 +175,17 @@ TEST_F(PictureFiles, FailedWriteLeavesTheOldFileUntouched) {
                  {"out.png", [](const TBitmap32& p, const std::string& f) { SavePng(p, f); }}};
   for (const auto& [name, write] : writers) {
     WriteBytes(Path(name), old);
-    rlimit small = saved;
-    small.rlim_cur = 4096;
-    ASSERT_EQ(::setrlimit(RLIMIT_FSIZE, &small), 0);
     std::string message;
     try {
+      const FileSizeLimit full(4096);
       write(picture, Path(name));
     } catch (const PictureFileError& error) {
       message = error.what();
     }
-    ::setrlimit(RLIMIT_FSIZE, &saved);
     EXPECT_NE(message.find("Cannot save \"" + Path(name) + "\""), std::string::npos)
         << name << ": " << message;
     EXPECT_EQ(ReadBytes(Path(name)), old) << name;
   }
-  ::sigaction(SIGXFSZ, &previous, nullptr);
   EXPECT_EQ(Entries(), (std::vector<std::string>{"out.bmp", "out.jpg", "out.png", "out.wmf"}));
 
   // And with room to write, each replaces the old file.

@@ -1,6 +1,3 @@
-#include <signal.h>
-#include <sys/resource.h>
-
 #include <QPushButton>
 #include <QScrollArea>
 #include <QScrollBar>
@@ -8,6 +5,7 @@
 
 #include "app/picture_view.h"
 #include "codecs/picture_file.h"
+#include "tests/file_size_limit.h"
 #include "tests/gui/temp_folder.h"
 
 namespace quillane {
@@ -217,18 +215,10 @@ TEST_F(PictureFiles, SaveWritesTheChosenTypeUnderItsOwnExtension) {
 TEST_F(PictureFiles, AFailedSaveKeepsTheOldFile) {
   Main().ShowNewPicture(TestPicture(300, 300), true);
   WriteBytes(LocalPath("result.bmp"), "old file");
-  struct sigaction ignore {
-  }, previous{};
-  ignore.sa_handler = SIG_IGN;
-  ASSERT_EQ(::sigaction(SIGXFSZ, &ignore, &previous), 0);
-  rlimit saved{};
-  ASSERT_EQ(::getrlimit(RLIMIT_FSIZE, &saved), 0);
-  rlimit small = saved;
-  small.rlim_cur = 4096;
-  ASSERT_EQ(::setrlimit(RLIMIT_FSIZE, &small), 0);
-  Save("result.bmp", 2);
-  ::setrlimit(RLIMIT_FSIZE, &saved);
-  ::sigaction(SIGXFSZ, &previous, nullptr);
+  {
+    const FileSizeLimit full(4096);
+    Save("result.bmp", 2);
+  }
 
   ASSERT_EQ(platform_.errors.size(), 1u);
   EXPECT_TRUE(platform_.errors[0].contains(Path("result.bmp")));
