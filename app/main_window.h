@@ -10,7 +10,7 @@
 #include <functional>
 #include <vector>
 
-#include "app/document.h"
+#include "document/document.h"
 #include "effects/registry.h"
 
 class QAction;

@@ -10,7 +10,7 @@
 #include <string_view>
 #include <vector>
 
-#include "app/document.h"
+#include "document/document.h"
 #include "effects/registry.h"
 
 namespace quillane {

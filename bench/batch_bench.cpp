@@ -7,7 +7,7 @@
 #include <stdexcept>
 #include <string>
 
-#include "app/document.h"
+#include "document/document.h"
 #include "batch/batch_convert.h"
 #include "bench/synthetic_photo.h"
 #include "codecs/picture_file.h"

@@ -10,7 +10,7 @@
 #include <sstream>
 #include <vector>
 
-#include "app/document.h"
+#include "document/document.h"
 #include "batch/batch_convert.h"
 #include "codecs/picture_file.h"
 #include "data/startup_picture.h"
