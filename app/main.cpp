@@ -37,7 +37,7 @@ int main(int argc, char* argv[]) {
   quillane::QtPlatformServices platform;
   Application app(argc, argv, platform);
   QApplication::setApplicationName("Quillane");
-  QApplication::setApplicationVersion("4.36");
+  QApplication::setApplicationVersion(QUILLANE_VERSION);
   // The program ends when its main window closes, whatever tool window is still open.
   QApplication::setQuitOnLastWindowClosed(false);
 

@@ -38,19 +38,6 @@ constexpr int kButtonSide = 25;
 const QColor kStatusGray(128, 128, 128);
 const QColor kScrollBoxBackground(96, 100, 106);
 
-// Pairs of displayed name and mask. Icons load through "All files" though no filter lists them.
-const QString kOpenFilter =
-    "*.jpg|*.jpg|*.jpeg|*.jpeg|*.bmp|*.bmp|*.wmf|*.wmf|*.emf|*.emf|*.gif|*.gif|All files|*.*";
-const QString kSaveFilter = "*.jpg|*.jpg|*.bmp|*.bmp|*.wmf|*.wmf";
-
-// File names cross between Qt and the codecs in the file system's own encoding.
-std::string LocalPath(const QString& path) {
-  return QFile::encodeName(path).toStdString();
-}
-QString FromLocalPath(const std::string& path) {
-  return QFile::decodeName(QByteArray::fromStdString(path));
-}
-
 // The toolbar strip: bands (the panels inside it), each with a grip drawn to its left.
 class ControlBar : public QFrame {
  public:
@@ -90,7 +77,7 @@ TMyPicture::TMyPicture(PlatformServices& platform) : TMyPicture(platform, Startu
 TMyPicture::TMyPicture(PlatformServices& platform, TBitmap32 picture)
     : platform_(platform), document_(std::move(picture)), toolWindows_(Effects().size() + 1) {
   setObjectName("TMyPicture");
-  setWindowTitle("Quillane v4.36");
+  setWindowTitle("Quillane v" QUILLANE_VERSION);
 
   auto* central = new QWidget(this);
   central->setObjectName("centralWidget");
@@ -166,17 +153,15 @@ void TMyPicture::BuildMenus() {
   connect(redoAction_, &QAction::triggered, this, &TMyPicture::SpeedButton18Click);
   addEntry(edit, "Image size", "Imagesize1");
 
-  static const char* const kMenuNames[] = {"BW1", "Color1", "ColorAdjust1", "Veins1"};
-  int menuIndex = 0;
-  for (const MenuSpec& menuSpec : EffectMenus()) {
-    QMenu* menu = addMenu(QString::fromStdString(menuSpec.caption), kMenuNames[menuIndex++]);
-    for (int number : menuSpec.toolNumbers) {
-      const EffectSpec* spec = FindEffect(number);
+  for (EffectMenu effectMenu : kEffectMenus) {
+    QMenu* menu = addMenu(MenuCaption(effectMenu), MenuObjectName(effectMenu));
+    for (const EffectSpec* spec : MenuEffects(effectMenu)) {
       // The entry is named after its handler without "Click", as every other entry is.
       QString name = QString::fromStdString(spec->menuHandler);
       name.chop(static_cast<int>(QStringLiteral("Click").size()));
       QAction* entry =
           addEntry(menu, QString::fromStdString(spec->menuEntry), name.toUtf8().constData());
+      const int number = spec->toolNumber;
       connect(entry, &QAction::triggered, this, [this, number] { OpenTool(number); });
     }
   }
@@ -305,303 +290,6 @@ void TMyPicture::closeEvent(QCloseEvent* event) {
 
 void TMyPicture::Exit1Click() {
   close();
-}
-
-// --- Document --------------------------------------------------------------------------------
-
-void TMyPicture::ShowWorking(double zoom) {
-  image1_->SetPicture(document_.Working());
-  SetDisplaySize(zoom);
-}
-
-void TMyPicture::SetDisplaySize(double zoom) {
-  const TBitmap32& picture = document_.Working();
-  const Extended z = zoom;
-  image1_->resize(Round(picture.Width() * z / 100), Round(picture.Height() * z / 100));
-}
-
-double TMyPicture::ZoomFromLabel() const {
-  QString number = zoomLabel_->text();
-  number.chop(1);
-  bool ok = false;
-  const double z = QLocale().toDouble(number, &ok);
-  if (ok) return z;
-  // The zoom commands write the label with the locale's separator; a label written in the C
-  // locale still reads.
-  const double c = QLocale::c().toDouble(number, &ok);
-  return ok ? c : zoomPercent_;
-}
-
-void TMyPicture::ShowNewPicture(TBitmap32 picture, bool resetHistory) {
-  document_.Load(std::move(picture));
-  ShowLoadedPicture(resetHistory);
-}
-
-void TMyPicture::ShowLoadedPicture(bool resetHistory) {
-  if (resetHistory) document_.ResetHistory();
-  ShowWorking(zoomPercent_);
-  scrollBox_->horizontalScrollBar()->setValue(0);
-  scrollBox_->verticalScrollBar()->setValue(0);
-  UpdateHistoryControls();
-}
-
-bool TMyPicture::ApplyEffect(const EffectRoutine& routine, const EffectParams& params,
-                             const QString& status, bool recordHistory) {
-  TBitmap32 result;
-  try {
-    result = routine(EffectInput{document_.Source(), document_.Working(), params});
-  } catch (const std::exception& e) {
-    platform_.ShowError(QString::fromStdString(e.what()));
-    return false;
-  } catch (...) {
-    platform_.ShowError("The effect failed.");
-    return false;
-  }
-  document_.SetWorking(std::move(result));
-  ShowWorking(zoomPercent_);
-  if (recordHistory) backup();
-  SetStatusText(status);
-  return true;
-}
-
-void TMyPicture::backup() {
-  document_.Backup();
-  UpdateHistoryControls();
-}
-
-void TMyPicture::UpdateHistoryControls() {
-  undoButton_->setEnabled(document_.CanUndo());
-  undoAction_->setEnabled(document_.CanUndo());
-  redoButton_->setEnabled(document_.CanRedo());
-  redoAction_->setEnabled(document_.CanRedo());
-}
-
-void TMyPicture::SpeedButton3Click() {
-  if (document_.Undo()) {
-    ShowWorking(ZoomFromLabel());
-    SetStatusText("Undo");
-  }
-  UpdateHistoryControls();
-}
-
-void TMyPicture::SpeedButton18Click() {
-  if (document_.Redo()) {
-    ShowWorking(ZoomFromLabel());
-    SetStatusText("Redo");
-  }
-  UpdateHistoryControls();
-}
-
-void TMyPicture::SpeedButton7Click() {
-  document_.Renew();
-  ShowWorking(zoomPercent_);
-  scrollBox_->horizontalScrollBar()->setValue(0);
-  scrollBox_->verticalScrollBar()->setValue(0);
-  UpdateHistoryControls();
-}
-
-void TMyPicture::SpeedButton1Click() {
-  closetool();
-  const std::optional<FileChoice> choice = platform_.OpenPictureDialog(kOpenFilter);
-  if (!choice) return;
-
-  // Decoded once into a bitmap of its own: a file that cannot be read leaves the document as
-  // it was.
-  std::optional<TBitmap32> picture;
-  try {
-    picture = LoadPictureFile(
-        LocalPath(choice->path), [this](const std::string& caption, const std::string& text) {
-          platform_.ShowMessage(QString::fromStdString(caption), QString::fromStdString(text));
-        });
-  } catch (const std::exception& e) {
-    platform_.ShowError(QString::fromStdString(e.what()));
-    return;
-  }
-  if (!picture || picture->Empty()) {
-    platform_.ShowMessage("Sorry", choice->path + " is not a valid format");
-    return;
-  }
-  ShowNewPicture(std::move(*picture), true);
-}
-
-void TMyPicture::SpeedButton2Click() {
-  const std::optional<FileChoice> choice = platform_.SavePictureDialog(kSaveFilter);
-  if (!choice) return;
-  const std::string name = LocalPath(choice->path);
-  // The writers replace an existing file only once the new one is complete, so a failed save
-  // keeps what was there.
-  try {
-    switch (choice->filterIndex) {
-      case 2:
-        SaveBitmap24(document_.Working(), ReplaceExtension(name, ".bmp"));
-        break;
-      case 3:
-        SaveMetafile(document_.Working(), ReplaceExtension(name, ".wmf"));
-        break;
-      default:  // 1, and whatever a dialog gives that is not one of the three types
-        SaveJpeg(document_.Working(), ReplaceExtension(name, ".jpg"), 90);
-        break;
-    }
-  } catch (const std::exception& e) {
-    platform_.ShowError(QString::fromStdString(e.what()));
-  }
-}
-
-QString TMyPicture::StatusText() const {
-  return statusLine_->text();
-}
-
-void TMyPicture::SetStatusText(const QString& text) {
-  statusLine_->setText(text);
-  statusLine_->adjustSize();
-}
-
-// --- Tool windows ----------------------------------------------------------------------------
-
-void TMyPicture::RegisterToolWindow(ToolWindow* window) {
-  const int number = window->Number();
-  if (number < 1 || number >= static_cast<int>(toolWindows_.size())) return;
-  toolWindows_[static_cast<std::size_t>(number)] = window;
-}
-
-ToolWindow* TMyPicture::ToolWindowAt(int number) const {
-  if (number < 1 || number >= static_cast<int>(toolWindows_.size())) return nullptr;
-  return toolWindows_[static_cast<std::size_t>(number)];
-}
-
-void TMyPicture::closetool() {
-  if (ToolWindow* open = ToolWindowAt(activeTool_)) open->close();
-}
-
-void TMyPicture::OpenTool(int number) {
-  closetool();
-  ToolWindow* window = ToolWindowAt(number);
-  if (window == nullptr) return;
-  const QRect main = frameGeometry();
-  // A window that was never shown has no frame yet; its frame is taken to be as wide as ours.
-  const int toolFrameWidth = window->width() + (main.width() - width());
-  window->move(main.left() + main.width() - toolFrameWidth - 25, main.top() + 84);
-  window->show();
-  window->raise();
-  window->activateWindow();
-}
-
-QIcon TMyPicture::DownArrowIcon() const {
-  return downArrow_->icon();
-}
-QIcon TMyPicture::UpArrowIcon() const {
-  return upArrow_->icon();
-}
-
-QRect TMyPicture::DisplayImageGeometry(int pictureWidth, int pictureHeight) {
-  if (pictureWidth < 1 || pictureHeight < 1) return QRect(2, 2, 0, 0);
-  if (static_cast<Extended>(pictureWidth) / pictureHeight >= 1) {
-    const int h = MulDiv(105, pictureHeight, pictureWidth);
-    const int t = (105 - h) / 2;
-    return QRect(2, t + 2, 105, h + 2);
-  }
-  const int w = MulDiv(105, pictureWidth, pictureHeight);
-  const int l = (105 - w) / 2;
-  return QRect(l + 2, 2, w + 2, 105);
-}
-
-void TMyPicture::DisplayImage(PictureView& control) const {
-  const QSize size = control.PictureSize();
-  control.setGeometry(DisplayImageGeometry(size.width(), size.height()));
-}
-
-void TMyPicture::OpenDir() {
-  const std::optional<QString> folder =
-      platform_.BrowseFolder("Open a directory to input pictures to convert.", inputFolder_);
-  if (!folder) return;
-  inputFolder_ = *folder;
-  listView1_->clear();
-  for (const std::string& name : ScanBatchFolder(LocalPath(inputFolder_)))
-    listView1_->addItem(FromLocalPath(name));
-}
-
-void TMyPicture::OpenDir2() {
-  // Opens at the input folder, as the batch panels always have.
-  const std::optional<QString> folder =
-      platform_.BrowseFolder("Open a directory to output pictures.", inputFolder_);
-  if (!folder) return;
-  outputFolder_ = *folder;
-}
-
-QStringList TMyPicture::BatchFiles() const {
-  QStringList names;
-  for (int i = 0; i < listView1_->count(); ++i) names << listView1_->item(i)->text();
-  return names;
-}
-
-BatchResult TMyPicture::ConvertBatchFolder(const EffectSpec& effect, const EffectParams& params,
-                                           const QString& inputField, const QString& outputField,
-                                           const std::function<void()>& afterEffect) {
-  BatchJob job;
-  job.inputFolder = TrimBlanks(LocalPath(inputField));
-  job.outputFolder = TrimBlanks(LocalPath(outputField));
-  for (const QString& name : BatchFiles()) job.files.push_back(LocalPath(name));
-  inputFolder_ = FromLocalPath(job.inputFolder);
-
-  BatchObserver observer;
-  observer.message = [this](const std::string& caption, const std::string& text) {
-    platform_.ShowMessage(QString::fromStdString(caption), QString::fromStdString(text));
-  };
-  // The loop blocks the event loop; repaint() draws the window at once, so the user sees each
-  // picture as it is loaded and converted without any input getting through meanwhile.
-  observer.progress = [this](const BatchProgress& progress) {
-    switch (progress.step) {
-      case BatchProgress::Step::Loading:
-        statusBar()->showMessage(QStringLiteral("Converting picture %1 of %2: %3")
-                                     .arg(progress.index)
-                                     .arg(progress.count)
-                                     .arg(FromLocalPath(progress.name)));
-        break;
-      case BatchProgress::Step::Loaded:
-        ShowLoadedPicture(false);
-        repaint();
-        break;
-      case BatchProgress::Step::Converted:
-        ShowWorking(zoomPercent_);
-        UpdateHistoryControls();
-        repaint();
-        break;
-      case BatchProgress::Step::Written:
-      case BatchProgress::Step::Skipped:
-        break;
-    }
-  };
-  observer.afterEffect = [&afterEffect](const BatchProgress&, const PictureDocument&) {
-    if (afterEffect) afterEffect();
-  };
-
-  BatchResult result;
-  try {
-    result = ConvertBatch(document_, effect, params, job, observer);
-  } catch (const std::exception& e) {
-    result.end = BatchResult::End::Stopped;
-    result.error = e.what();
-  }
-  statusBar()->clearMessage();
-  // A loop that stopped half-way may have loaded a picture it never showed converted.
-  ShowWorking(zoomPercent_);
-  UpdateHistoryControls();
-  // The output folder is taken from its field only once the input has been accepted.
-  if (result.end != BatchResult::End::Refused) outputFolder_ = FromLocalPath(job.outputFolder);
-
-  if (!result.skipped.empty()) {
-    QString text = "These pictures were skipped and have no output file:";
-    for (const BatchSkipped& skipped : result.skipped) text += "\n" + FromLocalPath(skipped.reason);
-    platform_.ShowMessage("Sorry", text);
-  }
-  if (result.end == BatchResult::End::Stopped) platform_.ShowError(FromLocalPath(result.error));
-  return result;
-}
-
-void TMyPicture::ShowBatchConvertOk() {
-  batchConvertOk_->show();
-  batchConvertOk_->raise();
-  batchConvertOk_->activateWindow();
 }
 
 }  // namespace quillane

@@ -1,6 +1,8 @@
 // The main window: the picture document with its history, the view of the working picture,
 // the menus and toolbar, and the shared state the tool windows work on (active tool number,
-// batch folders, line-art flag).
+// batch folders, line-art flag), which they reach through ToolHost. Its code is split by what
+// it does: main_window.cpp builds the window; main_window_history.cpp, _files, _view and _tools
+// hold the document actions, opening and saving, the view, and the tool windows with batch.
 #pragma once
 
 #include <QMainWindow>
@@ -10,6 +12,7 @@
 #include <functional>
 #include <vector>
 
+#include "app/tool_host.h"
 #include "document/document.h"
 #include "effects/registry.h"
 
@@ -29,7 +32,7 @@ class TBatchConvertOk;
 class ToolWindow;
 struct BatchResult;
 
-class TMyPicture : public QMainWindow {
+class TMyPicture : public QMainWindow, public ToolHost {
   Q_OBJECT
 
  public:
@@ -39,8 +42,8 @@ class TMyPicture : public QMainWindow {
   TMyPicture(PlatformServices& platform, TBitmap32 picture);
   ~TMyPicture() override;
 
-  PlatformServices& Platform() { return platform_; }
-  const PictureDocument& Document() const { return document_; }
+  PlatformServices& Platform() override { return platform_; }
+  const PictureDocument& Document() const override { return document_; }
 
   // --- Document -----------------------------------------------------------------------------
 
@@ -49,12 +52,9 @@ class TMyPicture : public QMainWindow {
   // is left as it is.
   void ShowNewPicture(TBitmap32 picture, bool resetHistory);
 
-  // Runs routine on the document (source picture in) and makes its result the working picture,
-  // then records a history step if asked and sets the status line to status. If the routine
-  // throws, the standard error box shows its message and document, history and status line
-  // stay as they were; the result is then false.
-  bool ApplyEffect(const EffectRoutine& routine, const EffectParams& params, const QString& status,
-                   bool recordHistory);
+  bool ApplyEffect(const EffectSpec& effect, const EffectParams& params,
+                   bool recordHistory) override;
+  void SetWorkingPicture(TBitmap32 picture, bool recordHistory) override;
 
   // The history step after a tool has written the working picture.
   void backup();
@@ -62,7 +62,7 @@ class TMyPicture : public QMainWindow {
   // --- Status line and zoom -----------------------------------------------------------------
 
   QString StatusText() const;
-  void SetStatusText(const QString& text);
+  void SetStatusText(const QString& text) override;
   double ZoomPercent() const { return zoomPercent_; }
   // The number the zoom label shows (its caption without the "%").
   double ZoomFromLabel() const;
@@ -74,49 +74,45 @@ class TMyPicture : public QMainWindow {
   void RegisterToolWindow(ToolWindow* window);
   ToolWindow* ToolWindowAt(int number) const;
   int ActiveTool() const { return activeTool_; }
-  void SetActiveTool(int number) { activeTool_ = number; }
+  void SetActiveTool(int number) override { activeTool_ = number; }
   // Closes the open tool window, if any.
   void closetool();
   // What a menu entry does: close the open tool window, place this one beside the main window
   // and show it.
   void OpenTool(int number);
   // The arrows the batch toggles show, taken from the hidden buttons dd and uu.
-  QIcon DownArrowIcon() const;
-  QIcon UpArrowIcon() const;
+  QIcon DownArrowIcon() const override;
+  QIcon UpArrowIcon() const override;
 
-  // Fits a thumbnail control into a 105 by 105 area by its picture's proportions.
-  void DisplayImage(PictureView& control) const;
+  void DisplayImage(PictureView& control) const override;
   static QRect DisplayImageGeometry(int pictureWidth, int pictureHeight);
 
   // --- Shared tool-window settings ------------------------------------------------------------
 
-  QString InputFolder() const { return inputFolder_; }
-  QString OutputFolder() const { return outputFolder_; }
+  QString InputFolder() const override { return inputFolder_; }
+  QString OutputFolder() const override { return outputFolder_; }
   void SetInputFolder(const QString& folder) { inputFolder_ = folder; }
   void SetOutputFolder(const QString& folder) { outputFolder_ = folder; }
   // The batch panels' Browse buttons: choose the input or output folder. Choosing the input
   // folder also lists its pictures in the batch file list.
-  void OpenDir();
-  void OpenDir2();
+  void OpenDir() override;
+  void OpenDir2() override;
   // The batch file list (the hidden ListView1): bare file names, as the last input-folder
   // Browse found them.
   QStringList BatchFiles() const;
 
-  // The Convert button of a batch panel: runs effect with params over every listed file, looked
-  // for in the folder typed in inputField, writing into the folder typed in outputField (both
-  // become the shared folders). Each loaded picture is shown and the progress is written in
-  // the status bar while the loop runs; afterEffect runs after each picture's effect (the
-  // window's own steps). "Sorry" messages, the list of skipped files and the error that stopped
-  // the loop are shown here; the completion dialog is left to the caller.
+  // Both typed folders become the shared folders. Each loaded picture is shown and the progress
+  // is written in the status bar while the loop runs; "Sorry" messages, the list of skipped
+  // files and the error that stopped the loop are shown here.
   BatchResult ConvertBatchFolder(const EffectSpec& effect, const EffectParams& params,
                                  const QString& inputField, const QString& outputField,
-                                 const std::function<void()>& afterEffect);
+                                 const std::function<void()>& afterEffect) override;
   // The dialog a finished batch conversion shows; created hidden with the main window.
   TBatchConvertOk& BatchConvertOk() { return *batchConvertOk_; }
-  void ShowBatchConvertOk();
+  void ShowBatchConvertOk() override;
 
-  bool LineArt() const { return lineArt_; }
-  void SetLineArt(bool on) { lineArt_ = on; }
+  bool LineArt() const override { return lineArt_; }
+  void SetLineArt(bool on) override { lineArt_ = on; }
 
  public slots:
   void SpeedButton1Click();   // open a picture
@@ -143,6 +139,8 @@ class TMyPicture : public QMainWindow {
   void ShowWorking(double zoom);
   // Shows a picture the document has just loaded from the top-left corner, at the current zoom.
   void ShowLoadedPicture(bool resetHistory);
+  // The view after the working picture changed in place: shown again, history buttons updated.
+  void ShowWorkingChanged();
   void UpdateHistoryControls();
 
   PlatformServices& platform_;

@@ -13,29 +13,23 @@
 #include <QVBoxLayout>
 
 #include "app/glyphs.h"
-#include "app/main_window.h"
+#include "app/platform.h"
 #include "batch/batch_convert.h"
 
 namespace quillane {
 namespace {
 
 constexpr int kWindowWidth = 300;
-constexpr int kCaptionWidth = 62;
-constexpr int kNumberWidth = 30;
 // Windows without a batch panel are never shorter than this.
 constexpr int kMinimumHeight = 90;
 
-QString NumberText(const ControlSpec& control, int position) {
-  return QString::number(control.numberFor ? control.numberFor(position) : position);
-}
-
 }  // namespace
 
-ToolWindow::ToolWindow(const EffectSpec& spec, TMyPicture& main)
-    : QWidget(&main, Qt::Tool | Qt::WindowStaysOnTopHint | Qt::CustomizeWindowHint |
-                         Qt::WindowTitleHint | Qt::WindowCloseButtonHint),
+ToolWindow::ToolWindow(const EffectSpec& spec, ToolHost& host, QWidget* parent)
+    : QWidget(parent, Qt::Tool | Qt::WindowStaysOnTopHint | Qt::CustomizeWindowHint |
+                          Qt::WindowTitleHint | Qt::WindowCloseButtonHint),
       spec_(spec),
-      main_(main) {
+      host_(host) {
   setObjectName(QString::fromStdString(spec.windowClass));
   setWindowTitle(QString::fromStdString(spec.caption));
 
@@ -51,19 +45,9 @@ ToolWindow::ToolWindow(const EffectSpec& spec, TMyPicture& main)
   controlsLayout_ = new QVBoxLayout;
   controlsLayout_->setSpacing(2);
   body->addLayout(controlsLayout_);
-  for (const ControlSpec& control : spec_.controls) {
-    switch (control.kind) {
-      case ControlKind::Slider:
-        AddSliderRow(control);
-        break;
-      case ControlKind::CheckBox:
-        AddCheckBox(control);
-        break;
-      case ControlKind::Hidden:
-        hidden_[control.param] = control.defaultValue;
-        break;
-    }
-  }
+  for (const ParamSpec& param : spec_.params)
+    params_[param.name] = BuildParamWidget(param, *this, *controlsLayout_, host_.Platform(),
+                                           [this, &param] { ParamChanged(param); });
   body->addStretch(1);
   BuildButtonRow(body);
   if (spec_.HasBatchPanel()) BuildBatchPanel(outer);
@@ -74,52 +58,7 @@ ToolWindow::ToolWindow(const EffectSpec& spec, TMyPicture& main)
     SetWindowHeights(std::max(kMinimumHeight, sizeHint().height()), 0);
 }
 
-void ToolWindow::AddSliderRow(const ControlSpec& control) {
-  auto* row = new QHBoxLayout;
-  row->setSpacing(6);
-  auto* caption = new QLabel(QString::fromStdString(control.caption), this);
-  if (!control.captionLabel.empty())
-    caption->setObjectName(QString::fromStdString(control.captionLabel));
-  caption->setFixedWidth(kCaptionWidth);
-  row->addWidget(caption);
-
-  auto* slider = new QSlider(Qt::Horizontal, this);
-  slider->setObjectName(QString::fromStdString(control.objectName));
-  slider->setRange(control.minimum, control.maximum);
-  slider->setValue(control.defaultValue);
-  if (control.pageStep > 0) slider->setPageStep(control.pageStep);
-  row->addWidget(slider, 1);
-
-  QLabel* number = nullptr;
-  if (!control.numberLabel.empty()) {
-    const QString initial = control.initialNumber.empty()
-                                ? NumberText(control, control.defaultValue)
-                                : QString::fromStdString(control.initialNumber);
-    number = new QLabel(initial, this);
-    number->setObjectName(QString::fromStdString(control.numberLabel));
-    number->setFixedWidth(kNumberWidth);
-    number->setAlignment(Qt::AlignRight | Qt::AlignVCenter);
-    row->addWidget(number);
-  }
-  controlsLayout_->addLayout(row);
-
-  connect(slider, &QSlider::valueChanged, this, [this, &control, number](int value) {
-    if (number != nullptr) number->setText(NumberText(control, value));
-    SelectFrom(control);
-    ControlChanged(control, value);
-  });
-}
-
-void ToolWindow::AddCheckBox(const ControlSpec& control) {
-  auto* box = new QCheckBox(QString::fromStdString(control.caption), this);
-  box->setObjectName(QString::fromStdString(control.objectName));
-  box->setChecked(control.defaultValue != 0);
-  controlsLayout_->addWidget(box);
-  connect(box, &QCheckBox::toggled, this, [this, &control](bool checked) {
-    SelectFrom(control);
-    ControlChanged(control, checked ? 1 : 0);
-  });
-}
+ToolWindow::~ToolWindow() = default;
 
 void ToolWindow::BuildButtonRow(QBoxLayout* outer) {
   auto* row = new QHBoxLayout;
@@ -128,7 +67,7 @@ void ToolWindow::BuildButtonRow(QBoxLayout* outer) {
     batchToggle_ = new QToolButton(this);
     batchToggle_->setObjectName("SpeedButton1");
     batchToggle_->setAutoRaise(true);
-    batchToggle_->setIcon(main_.DownArrowIcon());
+    batchToggle_->setIcon(host_.DownArrowIcon());
     batchToggle_->setIconSize(QSize(16, 16));
     batchToggle_->setToolTip("Show batch convert");
     connect(batchToggle_, &QToolButton::clicked, this, &ToolWindow::SpeedButton1Click);
@@ -136,22 +75,28 @@ void ToolWindow::BuildButtonRow(QBoxLayout* outer) {
   }
   row->addStretch(1);
   if (spec_.colorUp) {
-    button2_ = new QToolButton(this);
-    button2_->setObjectName("Button2");
-    button2_->setText("Color up");
-    button2_->setToolTip("Color up");
-    button2_->setIcon(GlyphIcon(Glyph::ColorUp));
-    button2_->setIconSize(QSize(16, 16));
-    button2_->setToolButtonStyle(Qt::ToolButtonTextBesideIcon);
-    button2_->setEnabled(false);
-    connect(button2_, &QToolButton::clicked, this, &ToolWindow::Button2Click);
-    row->addWidget(button2_);
+    colorUp_ = new QToolButton(this);
+    colorUp_->setObjectName("Button2");
+    colorUp_->setText("Color up");
+    colorUp_->setToolTip("Color up");
+    colorUp_->setIcon(GlyphIcon(Glyph::ColorUp));
+    colorUp_->setIconSize(QSize(16, 16));
+    colorUp_->setToolButtonStyle(Qt::ToolButtonTextBesideIcon);
+    colorUp_->setEnabled(false);
+    connect(colorUp_, &QToolButton::clicked, this, &ToolWindow::ColorUpClick);
+    row->addWidget(colorUp_);
   }
-  button1_ = new QPushButton("OK", this);
-  button1_->setObjectName("Button1");
-  button1_->setMinimumWidth(75);
-  connect(button1_, &QPushButton::clicked, this, &ToolWindow::Button1Click);
-  row->addWidget(button1_);
+  auto addButton = [&](const ButtonSpec& b, void (ToolWindow::*click)()) {
+    auto* button = new QPushButton(QString::fromStdString(b.caption), this);
+    button->setObjectName(QString::fromStdString(b.objectName));
+    if (!b.hint.empty()) button->setToolTip(QString::fromStdString(b.hint));
+    button->setMinimumWidth(75);
+    connect(button, &QPushButton::clicked, this, click);
+    row->addWidget(button);
+  };
+  addButton(spec_.apply, &ToolWindow::ApplyClick);
+  if (!spec_.restoreDefaults.objectName.empty())
+    addButton(spec_.restoreDefaults, &ToolWindow::RestoreDefaultsClick);
   outer->addLayout(row);
 }
 
@@ -179,10 +124,11 @@ void ToolWindow::BuildBatchPanel(QBoxLayout* outer) {
     grid->addWidget(browse, row, 2);
     return std::make_pair(edit, browse);
   };
-  auto [edit1, browseIn] = addRow(0, "Label6", "Input:", "Edit1", "SpeedButton2");
-  auto [edit2, browseOut] = addRow(1, "Label7", "Output:", "Edit2", "SpeedButton3");
-  edit1_ = edit1;
-  edit2_ = edit2;
+  auto [input, browseIn] = addRow(0, "Label6", "Input:", spec_.inputField.c_str(), "SpeedButton2");
+  auto [output, browseOut] =
+      addRow(1, "Label7", "Output:", spec_.outputField.c_str(), "SpeedButton3");
+  inputField_ = input;
+  outputField_ = output;
   connect(browseIn, &QToolButton::clicked, this, &ToolWindow::SpeedButton2Click);
   connect(browseOut, &QToolButton::clicked, this, &ToolWindow::SpeedButton3Click);
 
@@ -206,40 +152,34 @@ void ToolWindow::SetWindowHeights(int collapsed, int expanded) {
 // --- Settings --------------------------------------------------------------------------------
 
 EffectParams ToolWindow::Params() const {
-  EffectParams params;
-  for (const ControlSpec& control : spec_.controls) {
-    const QString name = QString::fromStdString(control.objectName);
-    switch (control.kind) {
-      case ControlKind::Slider:
-        if (auto* slider = findChild<QSlider*>(name)) params.Set(control.param, slider->value());
-        break;
-      case ControlKind::CheckBox:
-        if (auto* box = findChild<QCheckBox*>(name)) params.Set(control.param, box->isChecked());
-        break;
-      case ControlKind::Hidden:
-        params.Set(control.param, hidden_.at(control.param));
-        break;
-    }
+  EffectParams values;
+  for (const ParamSpec& param : spec_.params)
+    values.SetList(param.name, params_.at(param.name)->Value());
+  return values;
+}
+
+void ToolWindow::SetParam(const std::string& name, const EffectParams::Values& value) {
+  if (auto it = params_.find(name); it != params_.end()) it->second->SetValue(value);
+}
+
+void ToolWindow::ParamChanged(const ParamSpec& param) {
+  if (!param.selects.empty()) SetParam(param.selects, {param.selectValue});
+  ControlChanged(param);
+}
+
+void ToolWindow::ControlChanged(const ParamSpec&) {}
+
+std::optional<EffectParams> ToolWindow::CheckedParams() {
+  try {
+    return Params();
+  } catch (const ParamError& e) {
+    host_.Platform().ShowError(QString::fromStdString(e.what()));
+    return std::nullopt;
   }
-  return params;
 }
-
-void ToolWindow::SetHiddenParam(const std::string& name, int value) {
-  auto it = hidden_.find(name);
-  if (it != hidden_.end()) it->second = value;
-}
-
-void ToolWindow::SelectFrom(const ControlSpec& control) {
-  if (!control.selects.empty()) SetHiddenParam(control.selects, control.selectValue);
-}
-
-void ToolWindow::ControlChanged(const ControlSpec&, int) {}
 
 QLabel* ToolWindow::FindLabel(const QString& name) const {
   return findChild<QLabel*>(name);
-}
-QSlider* ToolWindow::FindSlider(const QString& name) const {
-  return findChild<QSlider*>(name);
 }
 
 // --- Showing and closing ---------------------------------------------------------------------
@@ -256,38 +196,45 @@ void ToolWindow::closeEvent(QCloseEvent* event) {
 }
 
 void ToolWindow::FormShow() {
-  main_.SetActiveTool(Number());
-  if (edit1_ != nullptr) edit1_->setText(main_.InputFolder());
-  if (edit2_ != nullptr) edit2_->setText(main_.OutputFolder());
-  if (button2_ != nullptr) button2_->setEnabled(false);
+  host_.SetActiveTool(Number());
+  for (const ParamSpec& param : spec_.params)
+    if (param.resetOnShow) SetParam(param.name, DefaultValue(param));
+  if (inputField_ != nullptr) inputField_->setText(host_.InputFolder());
+  if (outputField_ != nullptr) outputField_->setText(host_.OutputFolder());
+  if (colorUp_ != nullptr) colorUp_->setEnabled(false);
 }
 
 void ToolWindow::FormClose() {
-  main_.SetActiveTool(0);
+  host_.SetActiveTool(0);
 }
 
 // --- Buttons ---------------------------------------------------------------------------------
 
 bool ToolWindow::Apply(bool recordHistory) {
   if (!spec_.routine) return false;
-  if (!main_.ApplyEffect(spec_.routine, Params(), QString::fromStdString(spec_.statusText),
-                         recordHistory))
-    return false;
+  const std::optional<EffectParams> params = CheckedParams();
+  if (!params || !host_.ApplyEffect(spec_, *params, recordHistory)) return false;
   AfterEffect();
   return true;
 }
 
 void ToolWindow::AfterEffect() {
-  main_.SetStatusText(QString::fromStdString(spec_.statusText));
-  if (button2_ != nullptr) button2_->setEnabled(true);
+  host_.SetStatusText(QString::fromStdString(spec_.statusText));
+  if (spec_.lineArtAfterApply) host_.SetLineArt(*spec_.lineArtAfterApply);
+  if (colorUp_ != nullptr) colorUp_->setEnabled(true);
   AfterApply();
 }
 
-void ToolWindow::Button1Click() {
+void ToolWindow::ApplyClick() {
   Apply(true);
 }
 
-void ToolWindow::Button2Click() {
+void ToolWindow::RestoreDefaultsClick() {
+  for (const ParamSpec& param : spec_.params) SetParam(param.name, DefaultValue(param));
+  Apply(true);
+}
+
+void ToolWindow::ColorUpClick() {
   emit colorUpRequested();
 }
 
@@ -300,37 +247,40 @@ void ToolWindow::SpeedButton1Click() {
   if (panel2_->isHidden()) {
     setFixedHeight(expandedHeight_);
     panel2_->show();
-    batchToggle_->setIcon(main_.UpArrowIcon());
+    batchToggle_->setIcon(host_.UpArrowIcon());
     batchToggle_->setToolTip("Hide batch convert");
   } else {
     panel2_->hide();
     setFixedHeight(collapsedHeight_);
-    batchToggle_->setIcon(main_.DownArrowIcon());
+    batchToggle_->setIcon(host_.DownArrowIcon());
     batchToggle_->setToolTip("Show batch convert");
   }
 }
 
 void ToolWindow::SpeedButton2Click() {
-  main_.OpenDir();
+  host_.OpenDir();
   // Refreshed even after a cancel: the shared folder may have been chosen in another window.
-  if (edit1_ != nullptr) edit1_->setText(main_.InputFolder());
+  if (inputField_ != nullptr) inputField_->setText(host_.InputFolder());
 }
 
 void ToolWindow::SpeedButton3Click() {
-  main_.OpenDir2();
-  if (edit2_ != nullptr) edit2_->setText(main_.OutputFolder());
+  host_.OpenDir2();
+  if (outputField_ != nullptr) outputField_->setText(host_.OutputFolder());
 }
 
 void ToolWindow::SpeedButton4Click() {
-  if (edit1_ == nullptr || edit2_ == nullptr || !spec_.routine) return;
+  if (inputField_ == nullptr || outputField_ == nullptr || !spec_.routine) return;
+  // Every setting is checked before the first picture is loaded, so a bad one converts nothing.
+  const std::optional<EffectParams> params = CheckedParams();
+  if (!params) return;
   BeforeBatch();
-  // The loop itself runs the routine (and the history step of the effects whose batch does);
+  // The loop itself runs the effect (and the history step of the effects whose batch does);
   // the window adds its own steps after each picture.
-  const BatchResult result = main_.ConvertBatchFolder(spec_, Params(), edit1_->text(),
-                                                      edit2_->text(), [this] { AfterEffect(); });
+  const BatchResult result = host_.ConvertBatchFolder(
+      spec_, *params, inputField_->text(), outputField_->text(), [this] { AfterEffect(); });
   if (result.end != BatchResult::End::Completed) return;
   AfterBatch();
-  main_.ShowBatchConvertOk();
+  host_.ShowBatchConvertOk();
 }
 
 }  // namespace quillane

@@ -1,24 +1,41 @@
 #include "app/tool_windows.h"
 
+#include <algorithm>
+#include <iterator>
+
 #include "app/main_window.h"
 #include "app/tool_window.h"
 #include "effects/mono/bw_sketch_window.h"
 
 namespace quillane {
+namespace {
+
+using ToolWindowFactory = ToolWindow* (*)(const EffectSpec&, ToolHost&, QWidget* parent);
+
+template <typename Window>
+ToolWindow* Make(const EffectSpec& spec, ToolHost& host, QWidget* parent) {
+  return new Window(spec, host, parent);
+}
+
+// The windows with behaviour of their own, by tool number.
+struct SpecialWindow {
+  int toolNumber;
+  ToolWindowFactory make;
+};
+constexpr SpecialWindow kSpecialWindows[] = {
+    {1, Make<TBack_and_White_Sketch>},
+};
+
+}  // namespace
 
 void CreateToolWindows(TMyPicture& main) {
-  // The order the windows have always been created in; it decides nothing visible.
-  static const int kCreationOrder[] = {6, 7, 8, 1, 2, 3, 14, 4, 5, 9, 10, 11, 12, 13, 15, 16, 17};
-  for (int number : kCreationOrder) {
-    ToolWindow* window = nullptr;
-    switch (number) {
-      case 1:
-        window = new TBack_and_White_Sketch(main);
-        break;
-      default:
-        window = new ToolWindow(*FindEffect(number), main);
-        break;
-    }
+  for (const EffectSpec* spec : Effects()) {
+    const auto special =
+        std::find_if(std::begin(kSpecialWindows), std::end(kSpecialWindows),
+                     [&](const SpecialWindow& w) { return w.toolNumber == spec->toolNumber; });
+    const ToolWindowFactory make =
+        special != std::end(kSpecialWindows) ? special->make : Make<ToolWindow>;
+    ToolWindow* window = make(*spec, main, &main);
     window->hide();
     main.RegisterToolWindow(window);
   }

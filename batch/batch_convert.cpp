@@ -9,6 +9,7 @@
 #include <utility>
 
 #include "codecs/picture_file.h"
+#include "document/run_effect.h"
 
 namespace quillane {
 namespace fs = std::filesystem;
@@ -116,10 +117,6 @@ BatchResult ConvertBatch(PictureDocument& document, const EffectSpec& effect,
                   (ec ? ": " + ec.message() : std::string(": a file of that name exists")));
   }
 
-  // Settings the caller left out keep their defaults, so every routine finds all it reads.
-  EffectParams settings = effect.Defaults();
-  for (const auto& [name, value] : params.Values()) settings.Set(name, value);
-
   const int count = static_cast<int>(job.files.size());
   const LoaderNotice notice = observer.message;
   for (int i = 1; i <= count; ++i) {
@@ -156,11 +153,10 @@ BatchResult ConvertBatch(PictureDocument& document, const EffectSpec& effect,
     report(BatchProgress::Step::Loaded);
 
     try {
-      document.SetWorking(effect.routine({document.Source(), document.Working(), settings}));
+      RunEffect(document, effect, params, effect.batchPushesHistory);
     } catch (const std::exception& e) {
       return stop(NamingTheFile(path, e.what()));
     }
-    if (effect.batchPushesHistory) document.Backup();
     if (observer.afterEffect) observer.afterEffect(progress, document);
     report(BatchProgress::Step::Converted);
 

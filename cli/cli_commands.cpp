@@ -1,19 +1,24 @@
 #include "cli/cli_commands.h"
 
+#include <unistd.h>
+
 #include <QFile>
 #include <QImage>
 #include <QImageReader>
 #include <QString>
+#include <cstdlib>
 #include <exception>
 #include <filesystem>
 #include <fstream>
+#include <iostream>
+#include <iterator>
 #include <sstream>
 #include <vector>
 
-#include "document/document.h"
 #include "batch/batch_convert.h"
 #include "codecs/picture_file.h"
 #include "data/startup_picture.h"
+#include "document/run_effect.h"
 
 namespace quillane::cli {
 namespace fs = std::filesystem;
@@ -54,14 +59,74 @@ std::optional<TBitmap32> LoadPng(const std::string& path, std::string& error) {
   return picture;
 }
 
-// The picture named by --input or INPUT, or the built-in one when none is named; nothing (with
-// the reason told on err) when it cannot be read.
+// A file of our own in the temporary folder, removed when done with.
+class TempFile {
+ public:
+  explicit TempFile(const std::string& extension) {
+    std::string pattern = (fs::temp_directory_path() / "quillane-cli-XXXXXX").string() + extension;
+    const int fd = mkstemps(pattern.data(), static_cast<int>(extension.size()));
+    if (fd < 0) throw PictureFileError("cannot create a temporary file: " + pattern);
+    close(fd);
+    path_ = pattern;
+  }
+  ~TempFile() {
+    std::error_code ec;
+    fs::remove(path_, ec);
+  }
+  const std::string& Path() const { return path_; }
+
+ private:
+  std::string path_;
+};
+
+// The loader goes by the name's ending, so bytes from standard input are named by what their
+// first bytes say they are.
+std::string ExtensionForContent(const std::string& bytes) {
+  auto starts = [&](std::string_view magic) { return bytes.compare(0, magic.size(), magic) == 0; };
+  if (starts("\xFF\xD8")) return ".jpg";
+  if (starts("BM")) return ".bmp";
+  if (starts("GIF8")) return ".gif";
+  if (starts("\x89PNG")) return ".png";
+  if (starts(std::string_view("\0\0\1\0", 4))) return ".ico";
+  if (starts("\xD7\xCD\xC6\x9A") || starts(std::string_view("\1\0\x09\0", 4)) ||
+      starts(std::string_view("\2\0\x09\0", 4)))
+    return ".wmf";
+  if (bytes.size() > 44 && bytes.compare(40, 4, " EMF") == 0) return ".emf";
+  return ".unknown";
+}
+
+// The picture named by --input or INPUT ("-": standard input), or the built-in one when none is
+// named; nothing (with the reason told on err) when it cannot be read.
 std::optional<TBitmap32> InputOrBuiltInPicture(const Options& o, std::ostream& err) {
   if (o.input.empty()) return StartupPicture();
   std::string error;
-  std::optional<TBitmap32> loaded = LoadInputPicture(o.input, error, err);
+  std::optional<TBitmap32> loaded;
+  if (o.input == "-") {
+    const std::string bytes{std::istreambuf_iterator<char>(std::cin),
+                            std::istreambuf_iterator<char>()};
+    TempFile copy(ExtensionForContent(bytes));
+    std::ofstream(copy.Path(), std::ios::binary) << bytes;
+    loaded = LoadInputPicture(copy.Path(), error, err);
+    if (!loaded) error = "standard input is not a picture the program reads";
+  } else {
+    loaded = LoadInputPicture(o.input, error, err);
+  }
   if (!loaded) err << "quillane-cli: " << error << "\n";
   return loaded;
+}
+
+// Writes picture to o.output, or as o.format to out when the output is "-".
+void WriteOutput(const TBitmap32& picture, const Options& o, std::ostream& out) {
+  if (o.output != "-") {
+    SaveOutputPicture(picture, o.output);
+    return;
+  }
+  TempFile file("." + o.format);
+  SaveOutputPicture(picture, file.Path());
+  std::ifstream in(file.Path(), std::ios::binary);
+  out << in.rdbuf();
+  out.flush();
+  if (!out) throw PictureFileError("standard output could not be written");
 }
 
 int ApplyCommand(const Options& o, std::ostream& out, std::ostream& err) {
@@ -70,18 +135,19 @@ int ApplyCommand(const Options& o, std::ostream& out, std::ostream& err) {
   // Through a document, as the program does it: alpha 255, source in, working out.
   PictureDocument document(std::move(*picture));
   try {
-    document.SetWorking(o.effect->routine({document.Source(), document.Working(), o.params}));
+    RunEffect(document, *o.effect, o.params, false);
   } catch (const std::exception& e) {
     err << "quillane-cli: " << o.effect->cliName << ": " << e.what() << "\n";
     return kExitFailed;
   }
   try {
-    SaveOutputPicture(document.Working(), o.output);
+    WriteOutput(document.Working(), o, out);
   } catch (const std::exception& e) {
-    err << "quillane-cli: cannot write " << o.output << ": " << e.what() << "\n";
+    err << "quillane-cli: cannot write " << (o.output == "-" ? "to standard output" : o.output)
+        << ": " << e.what() << "\n";
     return kExitFailed;
   }
-  out << o.output << "\n";
+  if (o.output != "-") out << o.output << "\n";
   return kExitOk;
 }
 
@@ -239,22 +305,22 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
   std::vector<std::pair<std::string, std::vector<GalleryEntry>>> menus;
   std::vector<std::string> unavailable;
   int written = 0;
-  for (const MenuSpec& menu : EffectMenus()) {
-    menus.push_back({DisplayedCaption(menu.caption), {}});
-    for (int number : menu.toolNumbers) {
-      const EffectSpec& effect = *FindEffect(number);
-      const std::string title = DisplayedCaption(effect.menuEntry);
-      if (!effect.routine) {
+  for (EffectMenu menu : kEffectMenus) {
+    menus.push_back({DisplayedCaption(MenuCaption(menu)), {}});
+    for (const EffectSpec* effect : MenuEffects(menu)) {
+      const std::string title = DisplayedCaption(effect->menuEntry);
+      if (!effect->routine) {
         unavailable.push_back(title);
         continue;
       }
-      const std::string file = effect.cliName + ".png";
+      const std::string file = effect->cliName + ".png";
       try {
-        const TBitmap32 result =
-            effect.routine({document.Source(), document.Working(), effect.Defaults()});
-        if (!write(result, file)) continue;
+        // Every effect starts from the picture as opened, as it does in the program.
+        PictureDocument trial = document;
+        RunEffect(trial, *effect, {}, false);
+        if (!write(trial.Working(), file)) continue;
       } catch (const std::exception& e) {
-        err << "quillane-cli: " << effect.cliName << ": " << e.what() << "\n";
+        err << "quillane-cli: " << effect->cliName << ": " << e.what() << "\n";
         status = kExitFailed;
         continue;
       }
@@ -370,43 +436,39 @@ std::string EffectListText() {
   std::ostringstream text;
   text << "Effects (quillane-cli apply EFFECT [--PARAM VALUE ...]); parameters not given keep "
           "their defaults.\n";
-  for (const MenuSpec& menu : EffectMenus()) {
-    text << "\n" << DisplayedCaption(menu.caption) << "\n";
-    for (int number : menu.toolNumbers) {
-      const EffectSpec& e = *FindEffect(number);
-      text << "  " << e.cliName << "  (" << DisplayedCaption(e.menuEntry) << ")";
-      if (!e.routine) {
+  for (EffectMenu menu : kEffectMenus) {
+    text << "\n" << DisplayedCaption(MenuCaption(menu)) << "\n";
+    for (const EffectSpec* e : MenuEffects(menu)) {
+      text << "  " << e->cliName << "  (" << DisplayedCaption(e->menuEntry) << ")";
+      if (!e->routine) {
         text << "  not yet available\n";
         continue;
       }
-      text << (e.HasBatchPanel() ? "  batch output NAME-" + e.batchTag + ".jpg"
-                                 : std::string("  no batch conversion"))
+      text << (e->HasBatchPanel() ? "  batch output NAME-" + e->batchTag + ".jpg"
+                                  : std::string("  no batch conversion"))
            << "\n";
-      bool any = false;
-      for (const ControlSpec& c : e.controls) {
-        if (c.kind == ControlKind::Hidden) continue;
-        any = true;
-        std::string option = "--" + c.param + " N";
+      for (const ParamSpec& p : e->params) {
+        if (p.kind == ParamKind::Hidden) {
+          std::string selectors;
+          for (const ParamSpec& s : e->params)
+            if (s.selects == p.name) selectors += (selectors.empty() ? "--" : " or --") + s.name;
+          text << "      " << p.name << " is not an option of its own: ";
+          if (!selectors.empty()) text << "giving " << selectors << " chooses it; ";
+          text << DescribeParam(p);
+          if (!p.help.empty()) text << " (" << p.help << ")";
+          text << "\n";
+          continue;
+        }
+        const std::string description = DescribeParam(p);
+        const std::size_t gap = description.find("  ");
+        std::string option = "--" + p.name + " " + description.substr(0, gap);
         if (option.size() < 18) option.resize(18, ' ');
-        text << "      " << option << c.minimum << ".." << c.maximum << ", default "
-             << c.defaultValue;
-        if (c.kind == ControlKind::CheckBox) text << " (0 off, 1 on)";
-        if (!c.help.empty()) text << "; " << c.help;
+        text << "      " << option << " "
+             << (gap == std::string::npos ? "" : description.substr(gap + 2));
+        if (!p.help.empty()) text << "; " << p.help;
         text << "\n";
       }
-      for (const ControlSpec& h : e.controls) {
-        if (h.kind != ControlKind::Hidden) continue;
-        std::string selectors;
-        for (const ControlSpec& c : e.controls)
-          if (c.selects == h.param) selectors += (selectors.empty() ? "--" : " or --") + c.param;
-        text << "      " << h.param << " is not an option of its own: ";
-        if (!selectors.empty()) text << "giving " << selectors << " chooses it; ";
-        text << "default " << h.defaultValue;
-        if (!h.help.empty()) text << " (" << h.help << ")";
-        text << "\n";
-        any = true;
-      }
-      if (!any) text << "      no parameters\n";
+      if (e->params.empty()) text << "      no parameters\n";
     }
   }
   return text.str();

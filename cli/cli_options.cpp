@@ -1,12 +1,8 @@
 #include "cli/cli_options.h"
 
-#include <charconv>
-#include <cstdint>
+#include <filesystem>
+#include <map>
 #include <optional>
-
-#ifndef QUILLANE_VERSION
-#define QUILLANE_VERSION "4.36"
-#endif
 
 namespace quillane::cli {
 namespace {
@@ -24,29 +20,19 @@ ParseResult Plain(Command command) {
   return r;
 }
 
-std::optional<std::int64_t> ParseInteger(std::string_view text) {
-  if (!text.empty() && text.front() == '+') text.remove_prefix(1);
-  if (text.empty() || text.front() == '+') return std::nullopt;
-  std::int64_t value = 0;
-  const char* end = text.data() + text.size();
-  const auto [ptr, ec] = std::from_chars(text.data(), end, value);
-  if (ec != std::errc() || ptr != end) return std::nullopt;
-  return value;
-}
-
 std::string Lower(std::string s) {
   for (char& c : s)
     if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
   return s;
 }
 
-// The parameters a user can give for effect: its sliders and check boxes.
+// The parameters a user can give for effect.
 std::string SettableList(const EffectSpec& effect) {
   std::string list;
-  for (const ControlSpec& c : effect.controls) {
-    if (c.kind == ControlKind::Hidden) continue;
+  for (const ParamSpec& p : effect.params) {
+    if (p.kind == ParamKind::Hidden) continue;
     if (!list.empty()) list += ", ";
-    list += "--" + c.param;
+    list += "--" + p.name;
   }
   return list.empty() ? "none" : list;
 }
@@ -71,6 +57,8 @@ class ArgumentWalker {
     }
     return arg;
   }
+  // The next argument as it stands, after "--" has ended the options.
+  std::string TakeRaw() { return args_[next_++]; }
   std::optional<std::string> TakeValue() {
     if (inlineValue_) {
       std::string v = std::move(*inlineValue_);
@@ -91,28 +79,12 @@ bool IsOption(const std::string& arg) {
   return arg.size() > 1 && arg.front() == '-';
 }
 
-// Sets one effect parameter from "--name value"; an error message, or empty.
-std::string SetParameter(const EffectSpec& effect, const std::string& name,
-                         const std::string& value, EffectParams& params) {
-  const ControlSpec* control = effect.FindControl(name);
-  if (control == nullptr)
-    return "unknown option --" + name + " for " + effect.cliName +
-           " (its parameters: " + SettableList(effect) + ")";
-  if (control->kind == ControlKind::Hidden) {
-    std::string selectors;
-    for (const ControlSpec& c : effect.controls)
-      if (c.selects == name) selectors += (selectors.empty() ? "--" : " or --") + c.param;
-    return "--" + name + " is not an option: it is chosen by " +
-           (selectors.empty() ? std::string("the other parameters") : "giving " + selectors);
-  }
-  const std::string range =
-      std::to_string(control->minimum) + " to " + std::to_string(control->maximum);
-  const std::optional<std::int64_t> number = ParseInteger(value);
-  if (!number || *number < control->minimum || *number > control->maximum)
-    return "--" + name + " must be an integer from " + range + ", not '" + value + "'";
-  params.Set(name, *number);
-  if (!control->selects.empty()) params.Set(control->selects, control->selectValue);
-  return {};
+// "--a or --b": the options that select the hidden parameter name.
+std::string Selectors(const EffectSpec& effect, const std::string& name) {
+  std::string selectors;
+  for (const ParamSpec& p : effect.params)
+    if (p.selects == name) selectors += (selectors.empty() ? "--" : " or --") + p.name;
+  return selectors;
 }
 
 // "apply", "batch": EFFECT first, then options and positional arguments.
@@ -134,25 +106,43 @@ ParseResult ParseEffectCommand(Command command, const std::vector<std::string>& 
   o.params = effect->Defaults();
   bool haveInput = false;
   bool haveOutput = false;
+  bool optionsEnded = false;
+  std::map<std::string, std::string> given;     // parameter -> the option that gave it
+  std::map<std::string, std::string> selected;  // hidden parameter -> the option that chose it
 
   ArgumentWalker walker(args, 2);
   while (!walker.Done()) {
-    const std::string arg = walker.Take();
-    if (!IsOption(arg) || arg == "-") {
+    const std::string arg = optionsEnded ? walker.TakeRaw() : walker.Take();
+    if (!optionsEnded && arg == "--") {
+      optionsEnded = true;
+      continue;
+    }
+    if (optionsEnded || !IsOption(arg) || arg == "-") {
       if (command == Command::Batch)
         return Fail("batch: unexpected argument '" + arg + "' (use --input DIR --output DIR)");
       if (haveInput) return Fail("apply: only one input picture, but also got '" + arg + "'");
+      if (arg.empty()) return Fail("apply: the input picture's name is empty");
       o.input = arg;
       haveInput = true;
       continue;
     }
     const bool isOutput = arg == "-o" || arg == "--output";
     const bool isInput = command == Command::Batch && arg == "--input";
-    if (isOutput || isInput) {
+    const bool isFormat = command == Command::Apply && arg == "--format";
+    if (isOutput || isInput || isFormat) {
       const std::optional<std::string> value = walker.TakeValue();
       if (!value || value->empty())
         return Fail(arg + " needs a " +
-                    (isOutput && command == Command::Apply ? "file name" : "folder"));
+                    (isFormat                                ? "type: jpg, bmp, wmf or png"
+                     : isOutput && command == Command::Apply ? "file name"
+                                                             : "folder"));
+      if (isFormat) {
+        if (!o.format.empty()) return Fail("--format given twice");
+        o.format = Lower(*value);
+        if (OutputTypeFor("x." + o.format) == OutputType::Unknown)
+          return Fail("--format must be jpg, jpeg, bmp, wmf, emf or png, not '" + *value + "'");
+        continue;
+      }
       bool& have = isOutput ? haveOutput : haveInput;
       if (have) return Fail(arg + " given twice");
       (isOutput ? o.output : o.input) = *value;
@@ -162,20 +152,49 @@ ParseResult ParseEffectCommand(Command command, const std::vector<std::string>& 
     if (arg.compare(0, 2, "--") != 0)
       return Fail("unknown option " + arg + " (quillane-cli --help shows the usage)");
     const std::string name = arg.substr(2);
-    const ControlSpec* control = effect->FindControl(name);
-    if (control == nullptr || control->kind == ControlKind::Hidden)
-      return Fail(SetParameter(*effect, name, "", o.params));
+    const ParamSpec* param = effect->FindParam(name);
+    if (param == nullptr)
+      return Fail("unknown option --" + name + " for " + effect->cliName +
+                  " (its parameters: " + SettableList(*effect) + ")");
+    if (param->kind == ParamKind::Hidden) {
+      const std::string selectors = Selectors(*effect, name);
+      return Fail(
+          "--" + name + " is not an option: it is chosen by " +
+          (selectors.empty() ? std::string("the other parameters") : "giving " + selectors));
+    }
     const std::optional<std::string> value = walker.TakeValue();
     if (!value) return Fail(arg + " needs a value");
-    if (std::string error = SetParameter(*effect, name, *value, o.params); !error.empty())
-      return Fail(error);
+    if (given.count(name)) return Fail(arg + " given twice");
+    given[name] = arg;
+    if (!param->selects.empty()) {
+      // Two sliders that each choose the tone cannot both be meant.
+      const auto other = selected.find(param->selects);
+      if (other != selected.end())
+        return Fail(other->second + " and " + arg + " cannot be given together: each chooses the " +
+                    param->selects + " (give one of them)");
+      selected[param->selects] = arg;
+      o.params.Set(param->selects, param->selectValue);
+    }
+    try {
+      o.params.SetList(name, ParseParamText(*param, *value));
+    } catch (const ParamError& e) {
+      return Fail(e.what());
+    }
   }
 
   if (command == Command::Apply) {
     if (!haveOutput) return Fail("apply: say where to write the result with -o OUTPUT");
-    if (OutputTypeFor(o.output) == OutputType::Unknown)
-      return Fail("apply: cannot tell the output type of '" + o.output +
-                  "'; end it in .jpg, .jpeg, .bmp, .wmf, .emf or .png");
+    if (o.output == "-") {
+      if (o.format.empty()) o.format = "png";
+    } else {
+      if (!o.format.empty()) return Fail("--format is for -o -; a file's type is its extension");
+      std::error_code ec;
+      if (std::filesystem::is_directory(o.output, ec))
+        return Fail("apply: " + o.output + " is a folder; name the file to write in it");
+      if (OutputTypeFor(o.output) == OutputType::Unknown)
+        return Fail("apply: cannot tell the output type of '" + o.output +
+                    "'; end it in .jpg, .jpeg, .bmp, .wmf, .emf or .png");
+    }
   } else {
     if (!haveInput) return Fail("batch: name the input folder with --input DIR");
     if (!haveOutput) return Fail("batch: name the output folder with --output DIR");
@@ -252,7 +271,7 @@ std::string VersionText() {
 std::string UsageText() {
   return R"(Usage:
   quillane-cli list
-  quillane-cli apply EFFECT [--PARAM VALUE ...] [INPUT] -o OUTPUT
+  quillane-cli apply EFFECT [--PARAM VALUE ...] [INPUT] -o OUTPUT [--format TYPE]
   quillane-cli batch EFFECT [--PARAM VALUE ...] --input DIR --output DIR
   quillane-cli gallery DIR [--input FILE]
   quillane-cli --help | --version
@@ -262,16 +281,19 @@ Turns photographs into artwork with the effects of Quillane, without a window.
   list     every effect with its parameters, their ranges and defaults
   apply    one effect on one picture (the built-in picture when INPUT is left out);
            OUTPUT ends in .jpg or .jpeg (JPEG, quality 90), .bmp (24-bit bitmap),
-           .wmf or .emf (metafile) or .png (lossless, keeps alpha)
+           .wmf or .emf (metafile) or .png (lossless, keeps alpha); INPUT "-" reads
+           standard input and OUTPUT "-" writes standard output, as PNG unless
+           --format jpg, bmp or wmf says otherwise
   batch    one effect over every *.jpg, *.jpeg, *.bmp and *.wmf file of DIR (any case,
            sorted by name, subfolders not entered); each result is written as
            NAME-Tag.jpg into the output folder, which is created when missing
   gallery  the built-in picture (or FILE) through every effect with its defaults: one
            PNG per effect, the original, and index.html to look at them side by side
 
-INPUT may be a .jpg, .jpeg, .bmp, .ico, .gif, .wmf, .emf or .png file. Parameters are
-whole numbers within the ranges "list" shows; unset ones keep their defaults. Values
-may also be written --PARAM=VALUE.
+INPUT may be a .jpg, .jpeg, .bmp, .ico, .gif, .wmf, .emf or .png file. Parameters take
+the values "list" shows (whole numbers within their ranges, words, lists, colours);
+unset ones keep their defaults; each may be given once. Values may also be written
+--PARAM=VALUE, and "--" ends the options.
 
 Examples:
   quillane-cli apply pencil-sketch --contrast 60 photo.jpg -o sketch.png

@@ -22,12 +22,14 @@ struct Options {
   Command command = Command::Help;
   const EffectSpec* effect = nullptr;  // Apply and Batch
   // Every parameter of effect: its default, or the value given. A parameter that selects a
-  // hidden one (the pencil's --lighting selects the lighting tone) sets it when given; when
-  // several such options are given, the last one decides, as the slider moved last does.
+  // hidden one (the pencil's --lighting selects the lighting tone) sets it when given; two
+  // options that select the same one, or one option given twice, are refused.
   EffectParams params;
-  std::string input;   // Apply: the picture (empty: the built-in one); Batch: the folder;
-                       // Gallery: --input FILE (empty: the built-in picture)
-  std::string output;  // Apply: the file written; Batch and Gallery: the folder
+  std::string input;   // Apply: the picture (empty: the built-in one; "-": standard input);
+                       // Batch: the folder; Gallery: --input FILE (empty: the built-in picture)
+  std::string output;  // Apply: the file written ("-": standard output); Batch and Gallery: the
+                       // folder
+  std::string format;  // Apply to "-": the output type's extension without its dot ("png")
 };
 
 struct ParseResult {
@@ -38,7 +40,7 @@ struct ParseResult {
 };
 
 // Parses the arguments after the program name. Values are written "--name value" or
-// "--name=value".
+// "--name=value"; "--" ends the options, so a picture named "-x.jpg" can be given.
 ParseResult ParseCommandLine(const std::vector<std::string>& args);
 
 // The text of --help.

@@ -1,62 +1,22 @@
-// The one description of every effect: its menu entry, its tool window and that window's
-// controls, and its routine. Tool windows, batch conversion and the command line are all
-// generated from this table, so a caption, range or default is written exactly once.
+// Every effect declares itself beside its routine in one table entry: its menu entry, its tool
+// window and that window's buttons, its parameters and its routine. Tool windows, batch
+// conversion and the command line are all generated from these entries, so a caption, range
+// or default is written exactly once; this file only collects them.
 #pragma once
 
-#include <cstdint>
 #include <functional>
-#include <map>
 #include <optional>
 #include <string>
 #include <vector>
 
+#include "effects/params.h"
 #include "imaging/bitmap32.h"
 
 namespace quillane {
 
-// Parameter values by parameter name (the kebab-case name the command line uses).
-class EffectParams {
- public:
-  void Set(const std::string& name, std::int64_t value) { values_[name] = value; }
-  bool Has(const std::string& name) const { return values_.count(name) != 0; }
-  // The value of name; std::out_of_range when it was never set.
-  std::int64_t Get(const std::string& name) const { return values_.at(name); }
-  int GetInt(const std::string& name) const { return static_cast<int>(Get(name)); }
-  const std::map<std::string, std::int64_t>& Values() const { return values_; }
-
- private:
-  std::map<std::string, std::int64_t> values_;
-};
-
-enum class ControlKind {
-  Slider,    // a track bar with an optional number label beside it
-  CheckBox,  // 0 or 1
-  Hidden,    // a setting with no control of its own (chosen by other controls)
-};
-
-struct ControlSpec {
-  ControlKind kind = ControlKind::Slider;
-  std::string param;         // parameter name: "contrast"
-  std::string objectName;    // the control's name: "TrackBar1"
-  std::string captionLabel;  // the label naming it: "Label1" (may be empty)
-  std::string caption;       // that label's text: "Contrast:"
-  int minimum = 0;
-  int maximum = 0;
-  int defaultValue = 0;
-  int pageStep = 0;           // 0: the toolkit's default
-  std::string numberLabel;    // the label showing the number: "Label4" (may be empty)
-  std::string initialNumber;  // its caption before the control first moves: "50"
-  // The number shown for a position; empty: the position itself.
-  std::function<int(int)> numberFor;
-  // Moving this control sets another parameter: for example the pencil's sliders choose the
-  // tone mode. Empty when it selects nothing.
-  std::string selects;
-  int selectValue = 0;
-  std::string help;  // one line for the command line's list
-};
-
 // What a routine reads: the source picture (the picture as opened, after rotation or
-// resizing), the working picture (for the windows that can start from it) and the settings.
+// resizing), the working picture (for the windows that can start from it) and the settings,
+// every parameter of the effect present.
 struct EffectInput {
   const TBitmap32& source;
   const TBitmap32& working;
@@ -65,11 +25,28 @@ struct EffectInput {
 
 using EffectRoutine = std::function<TBitmap32(const EffectInput&)>;
 
+// The four effect menus, in the order the main window shows them.
+enum class EffectMenu { Mono, Color, Adjust, Veins };
+inline constexpr EffectMenu kEffectMenus[] = {EffectMenu::Mono, EffectMenu::Color,
+                                              EffectMenu::Adjust, EffectMenu::Veins};
+// The menu's caption as the menu bar takes it: " B&&W".
+const char* MenuCaption(EffectMenu menu);
+// The menu's object name: "BW1".
+const char* MenuObjectName(EffectMenu menu);
+
+// One button of a tool window that the entry names: OK, or "Convert" and "Default".
+struct ButtonSpec {
+  std::string objectName;
+  std::string caption;
+  std::string hint;
+};
+
 struct EffectSpec {
-  int toolNumber = 0;       // 1..17, the active tool number while the window is open
-  std::string menu;         // the menu's caption: " B&&W"
-  std::string menuEntry;    // the entry's caption as displayed: "Pencil sketch"
-  std::string menuHandler;  // "Pencilsketch1Click"; also the menu action's object name
+  int toolNumber = 0;  // 1..17, the active tool number while the window is open
+  EffectMenu menu = EffectMenu::Mono;
+  int menuPosition = 0;     // 1-based place in its menu
+  std::string menuEntry;    // the entry's caption as the menu takes it: "Pen && Ink"
+  std::string menuHandler;  // "Pencilsketch1Click"; the action is named without "Click"
   std::string windowClass;  // "TBack_and_White_Sketch"; the window's object name
   std::string caption;      // window title: "Pencil_Sketch"
   std::string statusText;   // status line after apply: "Pencil Sketch"
@@ -79,27 +56,32 @@ struct EffectSpec {
   int expandedHeight = 0;
   bool colorUp = false;             // has the "Color up" button
   bool batchPushesHistory = false;  // its batch routine records a history step per picture
-  std::vector<ControlSpec> controls;
+  // After each apply the line-art flag becomes this; nothing: left as it is.
+  std::optional<bool> lineArtAfterApply;
+  // The button that applies the settings shown.
+  ButtonSpec apply{"Button1", "OK", ""};
+  // A second button that restores every parameter's default, then applies; empty name: none.
+  ButtonSpec restoreDefaults;
+  // The batch panel's input and output folder fields.
+  std::string inputField = "Edit1";
+  std::string outputField = "Edit2";
+  std::vector<ParamSpec> params;
   EffectRoutine routine;  // empty until the effect is built
 
   bool HasBatchPanel() const { return !batchTag.empty(); }
-  const ControlSpec* FindControl(const std::string& param) const;
+  const ParamSpec* FindParam(const std::string& name) const;
   // Every parameter at its default.
   EffectParams Defaults() const;
 };
 
-// The seventeen effects in tool-number order.
-const std::vector<EffectSpec>& Effects();
+// Every effect in tool-number order.
+const std::vector<const EffectSpec*>& Effects();
 
 // By tool number (1..17), or by command-line name; nullptr when there is none.
 const EffectSpec* FindEffect(int toolNumber);
 const EffectSpec* FindEffectByCliName(const std::string& cliName);
 
-// The menus in the order the main window shows them, with their entries in menu order.
-struct MenuSpec {
-  std::string caption;
-  std::vector<int> toolNumbers;
-};
-const std::vector<MenuSpec>& EffectMenus();
+// The entries of one menu, in menu order.
+std::vector<const EffectSpec*> MenuEffects(EffectMenu menu);
 
 }  // namespace quillane

@@ -1,6 +1,8 @@
 #include "effects/mono/bw_sketch.h"
 
+#include "effects/registry.h"
 #include "imaging/edge_map.h"
+#include "imaging/numeric.h"
 #include "imaging/tone.h"
 
 namespace quillane {
@@ -11,6 +13,65 @@ TBitmap32 peccilsketch(const TBitmap32& source, PencilToneMode mode, int contras
   if (mode == PencilToneMode::Lighting) return PencilLightingPass(edges, lighting);
   ConvertToGray(edges);
   return PencilContrastPass(edges, contrast);
+}
+
+const EffectSpec& PencilSketchEffect() {
+  static const EffectSpec entry{
+      .toolNumber = 1,
+      .menu = EffectMenu::Mono,
+      .menuPosition = 1,
+      .menuEntry = "Pencil sketch",
+      .menuHandler = "Pencilsketch1Click",
+      .windowClass = "TBack_and_White_Sketch",
+      .caption = "Pencil_Sketch",
+      .statusText = "Pencil Sketch",
+      .cliName = "pencil-sketch",
+      .batchTag = "PencilSketch",
+      .collapsedHeight = 108,
+      .expandedHeight = 184,
+      .colorUp = true,
+      .lineArtAfterApply = false,
+      .params =
+          {
+              {.name = "contrast",
+               .objectName = "TrackBar1",
+               .captionLabel = "Label1",
+               .caption = "Contrast:",
+               .maximum = 89,
+               .defaultValue = 45,
+               .numberLabel = "Label4",
+               .initialNumber = "50",
+               .numberFor = [](int c) { return Round(static_cast<Extended>(c) * 100 / 89); },
+               .selects = "tone-mode",
+               .selectValue = static_cast<int>(PencilToneMode::Contrast),
+               .help = "contrast curve position; giving it selects the contrast tone"},
+              {.name = "lighting",
+               .objectName = "TrackBar2",
+               .captionLabel = "Label2",
+               .caption = "Lighting:",
+               .maximum = 255,
+               .defaultValue = 128,
+               .numberLabel = "Label3",
+               .initialNumber = "50",
+               .numberFor = [](int v) { return Round(static_cast<Extended>(v) * 100 / 255); },
+               .selects = "tone-mode",
+               .selectValue = static_cast<int>(PencilToneMode::Lighting),
+               .help = "brightness shift, 128 neutral; giving it selects the lighting tone"},
+              {.kind = ParamKind::Hidden,
+               .name = "tone-mode",
+               .maximum = 1,
+               .defaultValue = static_cast<int>(PencilToneMode::Contrast),
+               .help = "0 contrast, 1 lighting: the slider moved last",
+               .resetOnShow = true},
+          },
+      .routine =
+          [](const EffectInput& in) {
+            return peccilsketch(in.source,
+                                static_cast<PencilToneMode>(in.params.GetInt("tone-mode")),
+                                in.params.GetInt("contrast"), in.params.GetInt("lighting"));
+          },
+  };
+  return entry;
 }
 
 }  // namespace quillane

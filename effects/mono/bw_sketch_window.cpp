@@ -4,8 +4,6 @@
 #include <QPainter>
 #include <QVBoxLayout>
 
-#include "app/main_window.h"
-
 namespace quillane {
 namespace {
 
@@ -34,8 +32,9 @@ void SetTextColor(QLabel* label, const QColor& color) {
 
 }  // namespace
 
-TBack_and_White_Sketch::TBack_and_White_Sketch(TMyPicture& main)
-    : ToolWindow(*FindEffect(1), main) {
+TBack_and_White_Sketch::TBack_and_White_Sketch(const EffectSpec& spec, ToolHost& host,
+                                               QWidget* parent)
+    : ToolWindow(spec, host, parent) {
   auto* separator = new DashedSeparator(this);
   separator->setObjectName("Label5");
   ControlsLayout()->insertWidget(1, separator);
@@ -47,18 +46,13 @@ PencilToneMode TBack_and_White_Sketch::ToneMode() const {
 }
 
 void TBack_and_White_Sketch::FormShow() {
+  // The shared steps put the tone mode back to Contrast; the labels follow it.
   ToolWindow::FormShow();
-  SetHiddenParam("tone-mode", static_cast<int>(PencilToneMode::Contrast));
-  // The labels follow the mode, so a showing that chooses Contrast also shows it.
-  MarkToneMode(PencilToneMode::Contrast);
-  Main().SetLineArt(false);
+  MarkToneMode(ToneMode());
+  Host().SetLineArt(false);
 }
 
-void TBack_and_White_Sketch::AfterApply() {
-  Main().SetLineArt(false);
-}
-
-void TBack_and_White_Sketch::ControlChanged(const ControlSpec&, int) {
+void TBack_and_White_Sketch::ControlChanged(const ParamSpec&) {
   MarkToneMode(ToneMode());
 }
 

@@ -11,14 +11,13 @@ class TBack_and_White_Sketch : public ToolWindow {
   Q_OBJECT
 
  public:
-  explicit TBack_and_White_Sketch(TMyPicture& main);
+  TBack_and_White_Sketch(const EffectSpec& spec, ToolHost& host, QWidget* parent);
 
   PencilToneMode ToneMode() const;
 
  protected:
   void FormShow() override;
-  void AfterApply() override;
-  void ControlChanged(const ControlSpec& control, int value) override;
+  void ControlChanged(const ParamSpec& param) override;
 
  private:
   // Label1 and Label4 for Contrast, Label2 and Label3 for Lighting: the chosen pair in the

@@ -77,7 +77,7 @@ std::string ExpectedJpeg(const std::string& file, const EffectParams& params,
   TBitmap32 picture = *LoadPictureFile(file);
   SetAlphaChannel(picture, 255);
   EffectParams settings = Pencil().Defaults();
-  for (const auto& [name, value] : params.Values()) settings.Set(name, value);
+  settings.Merge(params);
   SaveJpeg(Pencil().routine({picture, picture, settings}), scratch, 90);
   return ReadBytes(scratch);
 }

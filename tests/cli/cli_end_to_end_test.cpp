@@ -160,7 +160,8 @@ TEST_F(CliRun, ListShowsEveryEffectWithRangesAndDefaults) {
   // Menu captions as displayed: "&&" shows a single "&".
   EXPECT_NE(out_.find("(Pen & Ink)"), std::string::npos) << out_;
   EXPECT_EQ(out_.find("&&"), std::string::npos) << out_;
-  for (const EffectSpec& e : Effects()) {
+  for (const EffectSpec* eEntry : Effects()) {
+    const EffectSpec& e = *eEntry;
     const std::size_t at = out_.find("  " + e.cliName + "  ");
     ASSERT_NE(at, std::string::npos) << e.cliName;
     const std::string line = out_.substr(at, out_.find('\n', at) - at);
@@ -181,7 +182,8 @@ TEST_F(CliRun, GalleryWritesAPngPerAvailableEffectAndAContactSheet) {
   EXPECT_NE(html.find("B&amp;W"), std::string::npos);
   EXPECT_EQ(html.find("&&"), std::string::npos);
   int pictures = 0;
-  for (const EffectSpec& e : Effects()) {
+  for (const EffectSpec* eEntry : Effects()) {
+    const EffectSpec& e = *eEntry;
     const std::string file = gallery + "/" + e.cliName + ".png";
     EXPECT_EQ(fs::exists(file), static_cast<bool>(e.routine)) << file;
     if (!e.routine) continue;

@@ -40,19 +40,40 @@ TEST(ParseCommandLineTest, ApplyTakesParametersInputAndOutput) {
   // Nothing given: every default, contrast tone.
   r = Parse({"apply", "pencil-sketch", "-o", "x.bmp"});
   ASSERT_TRUE(r.Ok()) << r.error;
-  EXPECT_EQ(r.options.params.Values(), r.options.effect->Defaults().Values());
+  EXPECT_EQ(r.options.params, r.options.effect->Defaults());
 }
 
-TEST(ParseCommandLineTest, TheLastSelectingParameterDecidesTheTone) {
+TEST(ParseCommandLineTest, ARepeatedOrConflictingParameterIsRefusedNamingBoth) {
   ParseResult r =
       Parse({"apply", "pencil-sketch", "--lighting", "10", "--contrast", "20", "-o", "o.png"});
-  ASSERT_TRUE(r.Ok());
-  EXPECT_EQ(r.options.params.Get("tone-mode"), kContrast);
-  EXPECT_EQ(r.options.params.Get("lighting"), 10);
-  r = Parse({"apply", "pencil-sketch", "--contrast", "20", "--lighting", "+255", "-o", "o.png"});
-  ASSERT_TRUE(r.Ok());
-  EXPECT_EQ(r.options.params.Get("tone-mode"), kLighting);
-  EXPECT_EQ(r.options.params.Get("lighting"), 255);
+  EXPECT_EQ(r.exitCode, kExitUsage);
+  EXPECT_NE(r.error.find("--lighting and --contrast"), std::string::npos) << r.error;
+  r = Parse({"apply", "pencil-sketch", "--contrast", "20", "--contrast=30", "-o", "o.png"});
+  EXPECT_EQ(r.exitCode, kExitUsage);
+  EXPECT_NE(r.error.find("--contrast given twice"), std::string::npos) << r.error;
+}
+
+TEST(ParseCommandLineTest, DashesEndOptionsAndStandForTheStandardStreams) {
+  ParseResult r = Parse({"apply", "pencil-sketch", "-o", "o.png", "--", "-x.jpg"});
+  ASSERT_TRUE(r.Ok()) << r.error;
+  EXPECT_EQ(r.options.input, "-x.jpg");
+  r = Parse({"apply", "pencil-sketch", "-", "-o", "-"});
+  ASSERT_TRUE(r.Ok()) << r.error;
+  EXPECT_EQ(r.options.input, "-");
+  EXPECT_EQ(r.options.format, "png");
+  r = Parse({"apply", "pencil-sketch", "-o", "-", "--format", "JPG"});
+  ASSERT_TRUE(r.Ok()) << r.error;
+  EXPECT_EQ(r.options.format, "jpg");
+  for (const std::vector<std::string>& wrong : std::vector<std::vector<std::string>>{
+           {"apply", "pencil-sketch", "", "-o", "o.png"},
+           {"apply", "pencil-sketch", "-o", "-", "--format", "tiff"},
+           {"apply", "pencil-sketch", "-o", "o.png", "--format", "png"},
+           {"apply", "pencil-sketch", "-o", "/"}}) {
+    r = Parse(wrong);
+    EXPECT_EQ(r.exitCode, kExitUsage) << wrong[2] << wrong[3];
+  }
+  EXPECT_NE(Parse({"apply", "pencil-sketch", "-o", "/"}).error.find("is a folder"),
+            std::string::npos);
 }
 
 TEST(ParseCommandLineTest, BadValuesNameTheParameterAndItsRange) {
@@ -109,7 +130,8 @@ TEST(ParseCommandLineTest, UnknownOrMisplacedWordsAreUsageErrors) {
 }
 
 TEST(ParseCommandLineTest, EffectsWithoutARoutineOrBatchPanelAreRefused) {
-  for (const EffectSpec& e : Effects()) {
+  for (const EffectSpec* eEntry : Effects()) {
+    const EffectSpec& e = *eEntry;
     const ParseResult apply = Parse({"apply", e.cliName, "-o", "o.png"});
     const ParseResult batch = Parse({"batch", e.cliName, "--input", "i", "--output", "o"});
     if (!e.routine) {

@@ -98,8 +98,7 @@ TEST_F(BatchWindow, BrowseListsThePicturesOfTheChosenFolder) {
 
 TEST_F(BatchWindow, ConvertWritesOnePencilSketchPerPicture) {
   // One step already in the history; the pencil's batch records none.
-  ASSERT_TRUE(
-      Main().ApplyEffect([](const EffectInput&) { return TestPicture(5, 5); }, {}, "Before", true));
+  ASSERT_TRUE(Main().ApplyEffect(Giving(TestPicture(5, 5), "Before"), {}, true));
   Main().SetLineArt(true);
   ToolChild<QSlider>(1, "TrackBar1")->setValue(70);
   BrowseInput(Path("in"));
@@ -219,7 +218,7 @@ TEST_F(BatchWindow, EachConvertedPictureGoesThroughTheWindowsOwnSteps) {
   recording.batchPushesHistory = true;
   recording.statusText = "Recorded";
   recording.routine = [](const EffectInput& in) { return Opaque(TBitmap32(in.source.Width(), 3)); };
-  ToolWindow window(recording, Main());
+  ToolWindow window(recording, Main(), &Main());
   window.show();
   window.findChild<QToolButton*>("SpeedButton1")->click();
   window.findChild<QLineEdit*>("Edit2")->setText(Path("out"));

@@ -34,6 +34,12 @@ inline TBitmap32 TestPicture(int width = 24, int height = 16) {
   return picture;
 }
 
+// An effect that gives picture and leaves status in the status line.
+inline EffectSpec Giving(TBitmap32 picture, std::string status) {
+  return EffectSpec{.statusText = std::move(status),
+                    .routine = [picture](const EffectInput&) { return picture; }};
+}
+
 class GuiTest : public ::testing::Test {
  protected:
   void SetUp() override {

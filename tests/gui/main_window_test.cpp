@@ -19,11 +19,6 @@ TBitmap32 Flat(int w, int h, std::uint8_t v) {
   return TBitmap32(w, h, Pixel{v, v, v, 255});
 }
 
-// A routine that ignores its input and gives a fixed picture.
-EffectRoutine Gives(TBitmap32 picture) {
-  return [picture](const EffectInput&) { return picture; };
-}
-
 QStringList Captions(const QList<QAction*>& actions) {
   QStringList captions;
   for (const QAction* a : actions)
@@ -161,8 +156,8 @@ TEST_F(MainWindow, UndoAndRedoFollowTheHistory) {
   expectEnabled(false, false);
   const TBitmap32 start = Main().Document().Working();
 
-  ASSERT_TRUE(Main().ApplyEffect(Gives(Flat(24, 16, 10)), {}, "First", true));
-  ASSERT_TRUE(Main().ApplyEffect(Gives(Flat(24, 16, 20)), {}, "Second", true));
+  ASSERT_TRUE(Main().ApplyEffect(Giving(Flat(24, 16, 10), "First"), {}, true));
+  ASSERT_TRUE(Main().ApplyEffect(Giving(Flat(24, 16, 20), "Second"), {}, true));
   EXPECT_EQ(Main().StatusText(), "Second");
   expectEnabled(true, false);
 
@@ -182,7 +177,7 @@ TEST_F(MainWindow, UndoAndRedoFollowTheHistory) {
   expectEnabled(true, true);
 
   // A new step discards what Redo could still reach.
-  ASSERT_TRUE(Main().ApplyEffect(Gives(Flat(24, 16, 30)), {}, "Third", true));
+  ASSERT_TRUE(Main().ApplyEffect(Giving(Flat(24, 16, 30), "Third"), {}, true));
   expectEnabled(true, false);
 
   // Undo with nothing to undo changes nothing, not even the status line.
@@ -198,7 +193,7 @@ TEST_F(MainWindow, UndoAndRedoFollowTheHistory) {
 TEST_F(MainWindow, UndoGivesThePictureItsFormerDisplaySize) {
   auto* image1 = Main().findChild<PictureView*>("Image1");
   EXPECT_EQ(image1->size(), QSize(24, 16));
-  ASSERT_TRUE(Main().ApplyEffect(Gives(Flat(60, 30, 1)), {}, "Bigger", true));
+  ASSERT_TRUE(Main().ApplyEffect(Giving(Flat(60, 30, 1), "Bigger"), {}, true));
   EXPECT_EQ(image1->size(), QSize(60, 30));
   Main().SpeedButton3Click();
   EXPECT_EQ(image1->size(), QSize(24, 16));
@@ -212,7 +207,7 @@ TEST_F(MainWindow, UndoSizesThePictureByTheZoomLabel) {
   const QLocale previous;
   QLocale::setDefault(QLocale(QLocale::German));
   auto* image1 = Main().findChild<PictureView*>("Image1");
-  ASSERT_TRUE(Main().ApplyEffect(Gives(Flat(30, 20, 1)), {}, "Changed", true));
+  ASSERT_TRUE(Main().ApplyEffect(Giving(Flat(30, 20, 1), "Changed"), {}, true));
   MainChild<QLabel>("Label5")->setText("41,0%");
   EXPECT_EQ(Main().ZoomFromLabel(), 41.0);
   Main().SpeedButton3Click();
@@ -226,7 +221,7 @@ TEST_F(MainWindow, UndoSizesThePictureByTheZoomLabel) {
 
 TEST_F(MainWindow, RenewReturnsToTheOpenedPictureAndResetsTheHistory) {
   const TBitmap32 opened = Main().Document().Opened();
-  ASSERT_TRUE(Main().ApplyEffect(Gives(Flat(30, 10, 5)), {}, "Changed", true));
+  ASSERT_TRUE(Main().ApplyEffect(Giving(Flat(30, 10, 5), "Changed"), {}, true));
   MainChild<QToolButton>("SpeedButton7")->click();
   EXPECT_EQ(Main().Document().Working(), opened);
   EXPECT_EQ(Main().Document().Source(), opened);
@@ -237,7 +232,7 @@ TEST_F(MainWindow, RenewReturnsToTheOpenedPictureAndResetsTheHistory) {
 }
 
 TEST_F(MainWindow, ANewPictureResetsTheHistoryButNotTheStatusLine) {
-  ASSERT_TRUE(Main().ApplyEffect(Gives(Flat(24, 16, 5)), {}, "Changed", true));
+  ASSERT_TRUE(Main().ApplyEffect(Giving(Flat(24, 16, 5), "Changed"), {}, true));
   Main().ShowNewPicture(TBitmap32(8, 6, Pixel{1, 2, 3, 0}), true);
   const TBitmap32 expected(8, 6, Pixel{1, 2, 3, 255});
   EXPECT_EQ(Main().Document().Working(), expected);
@@ -249,7 +244,7 @@ TEST_F(MainWindow, ANewPictureResetsTheHistoryButNotTheStatusLine) {
 }
 
 TEST_F(MainWindow, AFailingEffectChangesNothing) {
-  ASSERT_TRUE(Main().ApplyEffect(Gives(Flat(24, 16, 5)), {}, "Before", true));
+  ASSERT_TRUE(Main().ApplyEffect(Giving(Flat(24, 16, 5), "Before"), {}, true));
   const TBitmap32 working = Main().Document().Working();
   const int slot = Main().Document().CurrentSlot();
 
@@ -258,7 +253,7 @@ TEST_F(MainWindow, AFailingEffectChangesNothing) {
   failing.routine = [](const EffectInput&) -> TBitmap32 {
     throw std::runtime_error("Scan line index out of range");
   };
-  ToolWindow window(failing, Main());
+  ToolWindow window(failing, Main(), &Main());
   window.show();
   window.findChild<QPushButton*>("Button1")->click();
 

@@ -33,8 +33,7 @@ class PictureFiles : public FileGuiTest {
 
   // A history step and a status text of its own, to show what opening keeps.
   void ChangeTheDocument(int width = 40, int height = 30) {
-    ASSERT_TRUE(Main().ApplyEffect([=](const EffectInput&) { return TestPicture(width, height); },
-                                   {}, "Changed", true));
+    ASSERT_TRUE(Main().ApplyEffect(Giving(TestPicture(width, height), "Changed"), {}, true));
   }
 
   // Everything the document holds, to compare before and after a refused command.

@@ -20,14 +20,15 @@ QString EntryName(const EffectSpec& spec) {
 
 int VisibleToolWindows(TMyPicture& main) {
   int visible = 0;
-  for (const EffectSpec& spec : Effects())
-    if (main.ToolWindowAt(spec.toolNumber)->isVisible()) ++visible;
+  for (const EffectSpec* spec : Effects())
+    if (main.ToolWindowAt(spec->toolNumber)->isVisible()) ++visible;
   return visible;
 }
 
 TEST_F(ToolWindows, EveryMenuEntryOpensItsOwnWindowAlone) {
   ASSERT_EQ(Effects().size(), 17u);
-  for (const EffectSpec& spec : Effects()) {
+  for (const EffectSpec* specEntry : Effects()) {
+    const EffectSpec& spec = *specEntry;
     QAction* entry = MenuAction(EntryName(spec));
     ASSERT_NE(entry, nullptr) << spec.menuHandler;
     entry->trigger();
@@ -107,7 +108,8 @@ TEST_F(ToolWindows, WindowsOpenBesideTheMainWindow) {
 }
 
 TEST_F(ToolWindows, BatchPanelFoldsOutAndBackIn) {
-  for (const EffectSpec& spec : Effects()) {
+  for (const EffectSpec* specEntry : Effects()) {
+    const EffectSpec& spec = *specEntry;
     ToolWindow& window = Tool(spec.toolNumber);
     auto* toggle = window.findChild<QToolButton*>("SpeedButton1");
     auto* panel = window.findChild<QFrame*>("Panel2");
@@ -188,7 +190,8 @@ TEST_F(ToolWindows, FoldersAreSharedBetweenWindows) {
 }
 
 TEST_F(ToolWindows, AWindowWhoseEffectIsNotThereYetOnlyOpensAndCloses) {
-  for (const EffectSpec& spec : Effects()) {
+  for (const EffectSpec* specEntry : Effects()) {
+    const EffectSpec& spec = *specEntry;
     if (spec.routine) continue;
     MenuAction(EntryName(spec))->trigger();
     Tool(spec.toolNumber).findChild<QPushButton*>("Button1")->click();

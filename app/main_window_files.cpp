@@ -1,0 +1,66 @@
+// Opening a picture file and saving the working picture.
+#include <optional>
+
+#include "app/local_path.h"
+#include "app/main_window.h"
+#include "app/platform.h"
+#include "codecs/picture_file.h"
+
+namespace quillane {
+namespace {
+
+// Pairs of displayed name and mask. Icons load through "All files" though no filter lists them.
+const QString kOpenFilter =
+    "*.jpg|*.jpg|*.jpeg|*.jpeg|*.bmp|*.bmp|*.wmf|*.wmf|*.emf|*.emf|*.gif|*.gif|All files|*.*";
+const QString kSaveFilter = "*.jpg|*.jpg|*.bmp|*.bmp|*.wmf|*.wmf";
+
+}  // namespace
+
+void TMyPicture::SpeedButton1Click() {
+  closetool();
+  const std::optional<FileChoice> choice = platform_.OpenPictureDialog(kOpenFilter);
+  if (!choice) return;
+
+  // Decoded once into a bitmap of its own: a file that cannot be read leaves the document as
+  // it was.
+  std::optional<TBitmap32> picture;
+  try {
+    picture = LoadPictureFile(
+        LocalPath(choice->path), [this](const std::string& caption, const std::string& text) {
+          platform_.ShowMessage(QString::fromStdString(caption), QString::fromStdString(text));
+        });
+  } catch (const std::exception& e) {
+    platform_.ShowError(QString::fromStdString(e.what()));
+    return;
+  }
+  if (!picture || picture->Empty()) {
+    platform_.ShowMessage("Sorry", choice->path + " is not a valid format");
+    return;
+  }
+  ShowNewPicture(std::move(*picture), true);
+}
+
+void TMyPicture::SpeedButton2Click() {
+  const std::optional<FileChoice> choice = platform_.SavePictureDialog(kSaveFilter);
+  if (!choice) return;
+  const std::string name = LocalPath(choice->path);
+  // The writers replace an existing file only once the new one is complete, so a failed save
+  // keeps what was there.
+  try {
+    switch (choice->filterIndex) {
+      case 2:
+        SaveBitmap24(document_.Working(), ReplaceExtension(name, ".bmp"));
+        break;
+      case 3:
+        SaveMetafile(document_.Working(), ReplaceExtension(name, ".wmf"));
+        break;
+      default:  // 1, and whatever a dialog gives that is not one of the three types
+        SaveJpeg(document_.Working(), ReplaceExtension(name, ".jpg"), 90);
+        break;
+    }
+  } catch (const std::exception& e) {
+    platform_.ShowError(QString::fromStdString(e.what()));
+  }
+}
+
+}  // namespace quillane

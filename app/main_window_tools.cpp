@@ -1,0 +1,145 @@
+// The tool windows: opening and closing them, and what their batch panels ask of the main
+// window (the shared folders, the batch file list and the Convert loop).
+#include <QListWidget>
+#include <QStatusBar>
+#include <QToolButton>
+#include <exception>
+#include <string>
+
+#include "app/local_path.h"
+#include "app/main_window.h"
+#include "app/platform.h"
+#include "app/tool_window.h"
+#include "batch/batch_convert.h"
+#include "batch/batch_convert_ok.h"
+
+namespace quillane {
+
+void TMyPicture::RegisterToolWindow(ToolWindow* window) {
+  const int number = window->Number();
+  if (number < 1 || number >= static_cast<int>(toolWindows_.size())) return;
+  toolWindows_[static_cast<std::size_t>(number)] = window;
+}
+
+ToolWindow* TMyPicture::ToolWindowAt(int number) const {
+  if (number < 1 || number >= static_cast<int>(toolWindows_.size())) return nullptr;
+  return toolWindows_[static_cast<std::size_t>(number)];
+}
+
+void TMyPicture::closetool() {
+  if (ToolWindow* open = ToolWindowAt(activeTool_)) open->close();
+}
+
+void TMyPicture::OpenTool(int number) {
+  closetool();
+  ToolWindow* window = ToolWindowAt(number);
+  if (window == nullptr) return;
+  const QRect main = frameGeometry();
+  // A window that was never shown has no frame yet; its frame is taken to be as wide as ours.
+  const int toolFrameWidth = window->width() + (main.width() - width());
+  window->move(main.left() + main.width() - toolFrameWidth - 25, main.top() + 84);
+  window->show();
+  window->raise();
+  window->activateWindow();
+}
+
+QIcon TMyPicture::DownArrowIcon() const {
+  return downArrow_->icon();
+}
+QIcon TMyPicture::UpArrowIcon() const {
+  return upArrow_->icon();
+}
+
+void TMyPicture::OpenDir() {
+  const std::optional<QString> folder =
+      platform_.BrowseFolder("Open a directory to input pictures to convert.", inputFolder_);
+  if (!folder) return;
+  inputFolder_ = *folder;
+  listView1_->clear();
+  for (const std::string& name : ScanBatchFolder(LocalPath(inputFolder_)))
+    listView1_->addItem(FromLocalPath(name));
+}
+
+void TMyPicture::OpenDir2() {
+  // Opens at the input folder, as the batch panels always have.
+  const std::optional<QString> folder =
+      platform_.BrowseFolder("Open a directory to output pictures.", inputFolder_);
+  if (!folder) return;
+  outputFolder_ = *folder;
+}
+
+QStringList TMyPicture::BatchFiles() const {
+  QStringList names;
+  for (int i = 0; i < listView1_->count(); ++i) names << listView1_->item(i)->text();
+  return names;
+}
+
+BatchResult TMyPicture::ConvertBatchFolder(const EffectSpec& effect, const EffectParams& params,
+                                           const QString& inputField, const QString& outputField,
+                                           const std::function<void()>& afterEffect) {
+  BatchJob job;
+  job.inputFolder = TrimBlanks(LocalPath(inputField));
+  job.outputFolder = TrimBlanks(LocalPath(outputField));
+  for (const QString& name : BatchFiles()) job.files.push_back(LocalPath(name));
+  inputFolder_ = FromLocalPath(job.inputFolder);
+
+  BatchObserver observer;
+  observer.message = [this](const std::string& caption, const std::string& text) {
+    platform_.ShowMessage(QString::fromStdString(caption), QString::fromStdString(text));
+  };
+  // The loop blocks the event loop; repaint() draws the window at once, so the user sees each
+  // picture as it is loaded and converted without any input getting through meanwhile.
+  observer.progress = [this](const BatchProgress& progress) {
+    switch (progress.step) {
+      case BatchProgress::Step::Loading:
+        statusBar()->showMessage(QStringLiteral("Converting picture %1 of %2: %3")
+                                     .arg(progress.index)
+                                     .arg(progress.count)
+                                     .arg(FromLocalPath(progress.name)));
+        break;
+      case BatchProgress::Step::Loaded:
+        ShowLoadedPicture(false);
+        repaint();
+        break;
+      case BatchProgress::Step::Converted:
+        ShowWorkingChanged();
+        repaint();
+        break;
+      case BatchProgress::Step::Written:
+      case BatchProgress::Step::Skipped:
+        break;
+    }
+  };
+  observer.afterEffect = [&afterEffect](const BatchProgress&, const PictureDocument&) {
+    if (afterEffect) afterEffect();
+  };
+
+  BatchResult result;
+  try {
+    result = ConvertBatch(document_, effect, params, job, observer);
+  } catch (const std::exception& e) {
+    result.end = BatchResult::End::Stopped;
+    result.error = e.what();
+  }
+  statusBar()->clearMessage();
+  // A loop that stopped half-way may have loaded a picture it never showed converted.
+  ShowWorkingChanged();
+  // The output folder is taken from its field only once the input has been accepted.
+  if (result.end != BatchResult::End::Refused) outputFolder_ = FromLocalPath(job.outputFolder);
+
+  if (!result.skipped.empty()) {
+    QString text = "These pictures were skipped and have no output file:";
+    for (const BatchSkipped& skipped : result.skipped) text += "\n" + FromLocalPath(skipped.reason);
+    platform_.ShowMessage("Sorry", text);
+  }
+  if (result.end == BatchResult::End::Stopped) platform_.ShowError(FromLocalPath(result.error));
+  return result;
+}
+
+void TMyPicture::ShowBatchConvertOk() {
+  batchConvertOk_->show();
+  batchConvertOk_->raise();
+  batchConvertOk_->activateWindow();
+}
+
+}  // namespace quillane
