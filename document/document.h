@@ -4,6 +4,7 @@
 #pragma once
 
 #include <array>
+#include <cstdint>
 
 #include "imaging/bitmap32.h"
 
@@ -51,6 +52,10 @@ class PictureDocument {
   int CurrentSlot() const { return currentSlot_; }  // 1..21
   const TBitmap32& Slot(int slot) const { return slots_.at(static_cast<std::size_t>(slot - 1)); }
 
+  // The random generator state the effects that draw continue: 0 when the document is made,
+  // never reseeded by loading or history, so every run follows on from the one before.
+  std::uint32_t& RandomState() { return randomState_; }
+
  private:
   void RestoreCurrentSlot();
 
@@ -61,6 +66,7 @@ class PictureDocument {
   int currentSlot_ = 1;
   int undoCount_ = 0;
   int redoCount_ = 0;
+  std::uint32_t randomState_ = 0;
 };
 
 }  // namespace quillane

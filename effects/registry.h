@@ -4,6 +4,7 @@
 // or default is written exactly once; this file only collects them.
 #pragma once
 
+#include <cstdint>
 #include <functional>
 #include <optional>
 #include <string>
@@ -16,11 +17,13 @@ namespace quillane {
 
 // What a routine reads: the source picture (the picture as opened, after rotation or
 // resizing), the working picture (for the windows that can start from it) and the settings,
-// every parameter of the effect present.
+// every parameter of the effect present. random is the program's one random generator state,
+// which a routine that draws continues (null where nothing draws).
 struct EffectInput {
   const TBitmap32& source;
   const TBitmap32& working;
   const EffectParams& params;
+  std::uint32_t* random = nullptr;
 };
 
 using EffectRoutine = std::function<TBitmap32(const EffectInput&)>;

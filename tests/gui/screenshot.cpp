@@ -20,7 +20,7 @@ int main(int argc, char* argv[]) {
   window.OpenTool(1);
   if (argc > 2) {
     window.ToolWindowAt(1)->SpeedButton1Click();
-    window.ToolWindowAt(1)->Button1Click();
+    window.ToolWindowAt(1)->ApplyClick();
   }
   QTimer::singleShot(700, [&] {
     const QPixmap screen = QApplication::primaryScreen()->grabWindow(0);
