@@ -18,10 +18,10 @@
 #include <optional>
 #include <string>
 
-#include "app/glyphs.h"
-#include "app/picture_view.h"
-#include "app/platform.h"
-#include "app/tool_window.h"
+#include "ui/glyphs.h"
+#include "ui/picture_view.h"
+#include "ui/platform.h"
+#include "ui/tool_window.h"
 #include "batch/batch_convert.h"
 #include "batch/batch_convert_ok.h"
 #include "codecs/picture_file.h"

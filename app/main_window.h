@@ -12,7 +12,7 @@
 #include <functional>
 #include <vector>
 
-#include "app/tool_host.h"
+#include "ui/tool_host.h"
 #include "document/document.h"
 #include "effects/registry.h"
 

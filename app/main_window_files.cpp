@@ -3,7 +3,7 @@
 
 #include "app/local_path.h"
 #include "app/main_window.h"
-#include "app/platform.h"
+#include "ui/platform.h"
 #include "codecs/picture_file.h"
 
 namespace quillane {

@@ -8,7 +8,7 @@
 #include <exception>
 
 #include "app/main_window.h"
-#include "app/platform.h"
+#include "ui/platform.h"
 #include "document/run_effect.h"
 
 namespace quillane {

@@ -8,8 +8,8 @@
 
 #include "app/local_path.h"
 #include "app/main_window.h"
-#include "app/platform.h"
-#include "app/tool_window.h"
+#include "ui/platform.h"
+#include "ui/tool_window.h"
 #include "batch/batch_convert.h"
 #include "batch/batch_convert_ok.h"
 

@@ -4,7 +4,7 @@
 #include <QLocale>
 
 #include "app/main_window.h"
-#include "app/picture_view.h"
+#include "ui/picture_view.h"
 #include "imaging/numeric.h"
 
 namespace quillane {

@@ -4,7 +4,7 @@
 
 #include <QStringList>
 
-#include "app/platform.h"
+#include "ui/platform.h"
 
 namespace quillane {
 

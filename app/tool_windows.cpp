@@ -4,7 +4,7 @@
 #include <iterator>
 
 #include "app/main_window.h"
-#include "app/tool_window.h"
+#include "ui/tool_window.h"
 #include "effects/mono/bw_sketch_window.h"
 
 namespace quillane {

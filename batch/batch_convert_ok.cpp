@@ -6,7 +6,7 @@
 #include <QVBoxLayout>
 #include <utility>
 
-#include "app/platform.h"
+#include "ui/platform.h"
 
 namespace quillane {
 

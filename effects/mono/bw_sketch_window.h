@@ -2,7 +2,7 @@
 // adjustment; its labels are drawn in the window-text colour and the other slider's in gray.
 #pragma once
 
-#include "app/tool_window.h"
+#include "ui/tool_window.h"
 #include "effects/mono/bw_sketch.h"
 
 namespace quillane {

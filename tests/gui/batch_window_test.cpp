@@ -9,7 +9,7 @@
 #include <filesystem>
 #include <stdexcept>
 
-#include "app/picture_view.h"
+#include "ui/picture_view.h"
 #include "batch/batch_convert_ok.h"
 #include "codecs/picture_file.h"
 #include "effects/mono/bw_sketch.h"

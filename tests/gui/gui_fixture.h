@@ -10,7 +10,7 @@
 #include <memory>
 
 #include "app/main_window.h"
-#include "app/tool_window.h"
+#include "ui/tool_window.h"
 #include "app/tool_windows.h"
 #include "tests/gui/scripted_platform.h"
 

@@ -8,7 +8,7 @@
 #include <QToolButton>
 #include <stdexcept>
 
-#include "app/picture_view.h"
+#include "ui/picture_view.h"
 #include "data/startup_picture.h"
 #include "tests/gui/gui_fixture.h"
 

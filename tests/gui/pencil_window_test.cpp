@@ -3,7 +3,7 @@
 #include <QSlider>
 #include <QToolButton>
 
-#include "app/picture_view.h"
+#include "ui/picture_view.h"
 #include "effects/mono/bw_sketch.h"
 #include "effects/mono/bw_sketch_window.h"
 #include "tests/gui/gui_fixture.h"

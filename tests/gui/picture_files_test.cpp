@@ -3,7 +3,7 @@
 #include <QScrollBar>
 #include <QToolButton>
 
-#include "app/picture_view.h"
+#include "ui/picture_view.h"
 #include "codecs/picture_file.h"
 #include "tests/file_size_limit.h"
 #include "tests/gui/temp_folder.h"

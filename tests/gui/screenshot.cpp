@@ -7,7 +7,7 @@
 
 #include "app/main_window.h"
 #include "app/qt_platform.h"
-#include "app/tool_window.h"
+#include "ui/tool_window.h"
 #include "app/tool_windows.h"
 
 int main(int argc, char* argv[]) {

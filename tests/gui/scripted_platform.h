@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-#include "app/platform.h"
+#include "ui/platform.h"
 
 namespace quillane {
 

@@ -10,8 +10,8 @@
 #include <optional>
 #include <string>
 
-#include "app/param_widgets.h"
-#include "app/tool_host.h"
+#include "ui/param_widgets.h"
+#include "ui/tool_host.h"
 
 class QBoxLayout;
 class QFrame;

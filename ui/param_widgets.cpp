@@ -1,4 +1,4 @@
-#include "app/param_widgets.h"
+#include "ui/param_widgets.h"
 
 #include <QButtonGroup>
 #include <QCheckBox>
@@ -14,7 +14,7 @@
 #include <QSlider>
 #include <QVBoxLayout>
 
-#include "app/platform.h"
+#include "ui/platform.h"
 #include "imaging/bitmap32.h"
 
 namespace quillane {

@@ -1,4 +1,4 @@
-#include "app/tool_window.h"
+#include "ui/tool_window.h"
 
 #include <QCheckBox>
 #include <QCloseEvent>
@@ -12,8 +12,8 @@
 #include <QToolButton>
 #include <QVBoxLayout>
 
-#include "app/glyphs.h"
-#include "app/platform.h"
+#include "ui/glyphs.h"
+#include "ui/platform.h"
 #include "batch/batch_convert.h"
 
 namespace quillane {
