@@ -6,11 +6,11 @@ namespace quillane {
 
 // Each effect's entry is defined beside its routine. This list, in tool-number order, is the
 // only place that names them all.
-#define QUILLANE_EFFECTS(X)                                                                  \
-  X(PencilSketch)                                                                            \
-  X(PenSketch) X(Vuzorar) X(PenAndInk) X(ColorPencil) X(Realism) X(Abstract) X(PopArt)       \
-      X(WaterColor) X(Brume) X(HslAdjust) X(ColorVariety) X(ColorPanel) X(Texture) X(Emboss) \
-          X(ColorFilter) X(Stria)
+#define QUILLANE_EFFECTS(X)                                                                      \
+  X(PencilSketch)                                                                                \
+  X(PenSketch)                                                                                   \
+  X(Vuzorar) X(PenAndInk) X(ColorPencil) X(Realism) X(Abstract) X(PopArt) X(WaterColor) X(Brume) \
+      X(HslAdjust) X(ColorVariety) X(ColorPanel) X(Texture) X(Emboss) X(ColorFilter) X(Stria)
 
 #define QUILLANE_DECLARE_EFFECT(name) const EffectSpec& name##Effect();
 QUILLANE_EFFECTS(QUILLANE_DECLARE_EFFECT)
@@ -23,32 +23,24 @@ const std::vector<const EffectSpec*>& Effects() {
   return all;
 }
 
+namespace {
+
+struct MenuNames {
+  const char* caption;
+  const char* objectName;
+};
+// In the order of EffectMenu.
+constexpr MenuNames kMenuNames[] = {
+    {" B&&W", "BW1"}, {" Color", "Color1"}, {" ColorAdjust", "ColorAdjust1"}, {" Veins", "Veins1"}};
+
+}  // namespace
+
 const char* MenuCaption(EffectMenu menu) {
-  switch (menu) {
-    case EffectMenu::Mono:
-      return " B&&W";
-    case EffectMenu::Color:
-      return " Color";
-    case EffectMenu::Adjust:
-      return " ColorAdjust";
-    case EffectMenu::Veins:
-      return " Veins";
-  }
-  return "";
+  return kMenuNames[static_cast<int>(menu)].caption;
 }
 
 const char* MenuObjectName(EffectMenu menu) {
-  switch (menu) {
-    case EffectMenu::Mono:
-      return "BW1";
-    case EffectMenu::Color:
-      return "Color1";
-    case EffectMenu::Adjust:
-      return "ColorAdjust1";
-    case EffectMenu::Veins:
-      return "Veins1";
-  }
-  return "";
+  return kMenuNames[static_cast<int>(menu)].objectName;
 }
 
 const ParamSpec* EffectSpec::FindParam(const std::string& name) const {
