@@ -124,26 +124,23 @@ TEST_F(MainWindow, UndoSizesThePictureByTheZoomLabel) {
   QLocale::setDefault(previous);
 }
 
-TEST_F(MainWindow, RenewReturnsToTheOpenedPictureAndResetsTheHistory) {
-  const TBitmap32 opened = Main().Document().Opened();
-  Apply(Flat(30, 10, 5), "Changed");
-  MainChild<QToolButton>("SpeedButton7")->click();
-  EXPECT_EQ(Main().Document().Working(), opened);
-  EXPECT_EQ(Main().Document().Source(), opened);
-  EXPECT_EQ(Image1()->size(), QSize(24, 16));
-  ExpectUndoRedo(false, false);
-  EXPECT_EQ(Main().StatusText(), "Changed");
-}
-
-TEST_F(MainWindow, ANewPictureResetsTheHistoryButNotTheStatusLine) {
+TEST_F(MainWindow, ANewPictureAndRenewResetTheHistoryButNotTheStatusLine) {
   Apply(Flat(24, 16, 5), "Changed");
   Main().ShowNewPicture(TBitmap32(8, 6, Pixel{1, 2, 3, 0}), true);
-  const TBitmap32 expected(8, 6, Pixel{1, 2, 3, 255});
-  EXPECT_EQ(Main().Document().Working(), expected);
-  EXPECT_EQ(Main().Document().Opened(), expected);
+  const TBitmap32 opened(8, 6, Pixel{1, 2, 3, 255});
+  EXPECT_EQ(Main().Document().Working(), opened);
+  EXPECT_EQ(Main().Document().Opened(), opened);
   ExpectUndoRedo(false, false);
   EXPECT_EQ(Image1()->size(), QSize(8, 6));
   EXPECT_EQ(Main().StatusText(), "Changed");
+
+  Apply(Flat(30, 10, 5), "Changed again");
+  MainChild<QToolButton>("SpeedButton7")->click();
+  EXPECT_EQ(Main().Document().Working(), opened);
+  EXPECT_EQ(Main().Document().Source(), opened);
+  EXPECT_EQ(Image1()->size(), QSize(8, 6));
+  ExpectUndoRedo(false, false);
+  EXPECT_EQ(Main().StatusText(), "Changed again");
 }
 
 TEST_F(MainWindow, AFailingEffectChangesNothing) {
