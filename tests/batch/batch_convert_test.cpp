@@ -310,12 +310,10 @@ TEST(ConvertBatchTest, RefusesEffectsWithoutABatchRoutine) {
   PictureDocument document;
   EffectSpec none = Pencil();
   none.routine = nullptr;
-  EXPECT_THROW(ConvertBatch(document, none, EffectParams(), {"/", "/tmp", {"a.jpg"}}),
-               std::invalid_argument);
-  const EffectSpec* hsl = FindEffectByCliName("hsl-adjust");
-  ASSERT_NE(hsl, nullptr);
-  EXPECT_THROW(ConvertBatch(document, *hsl, EffectParams(), {"/", "/tmp", {"a.jpg"}}),
-               std::invalid_argument);
+  const EffectSpec* const effects[] = {&none, FindEffectByCliName("hsl-adjust")};
+  for (const EffectSpec* effect : effects)
+    EXPECT_THROW(ConvertBatch(document, *effect, EffectParams(), {"/", "/tmp", {"a.jpg"}}),
+                 std::invalid_argument);
 }
 
 }  // namespace
