@@ -79,14 +79,14 @@ TEST(DecodeBitmap24, RefusesDamagedAndForeignFiles) {
     for (int i = 0; i < n; ++i) b[at + i] = static_cast<std::uint8_t>(v >> (8 * i));
     return b;
   };
-  EXPECT_THROW(DecodeBitmap24(withField(0, 'X', 1)), std::runtime_error);
-  EXPECT_THROW(DecodeBitmap24(withField(28, 32, 2)), std::runtime_error);  // 32-bit
-  EXPECT_THROW(DecodeBitmap24(withField(30, 1, 4)), std::runtime_error);   // compressed
-  EXPECT_THROW(DecodeBitmap24(withField(18, 0, 4)), std::runtime_error);   // width 0
-  EXPECT_THROW(DecodeBitmap24(withField(22, 0x80000000u, 4)), std::runtime_error);
-  EXPECT_THROW(DecodeBitmap24(withField(18, 0x7fffffffu, 4)), std::runtime_error);
-  EXPECT_THROW(DecodeBitmap24(withField(10, 0xfffffff0u, 4)), std::runtime_error);  // offset
-  EXPECT_THROW(DecodeBitmap24(withField(14, 0xffffff00u, 4)), std::runtime_error);  // info size
+  // {offset, value, bytes}: not "BM", 32 bits, compressed, width 0, height and width out of
+  // range, pixel offset past the end, header size past the end.
+  const std::uint32_t fields[][3] = {
+      {0, 'X', 1},          {28, 32, 2},          {30, 1, 4},           {18, 0, 4},
+      {22, 0x80000000u, 4}, {18, 0x7fffffffu, 4}, {10, 0xfffffff0u, 4}, {14, 0xffffff00u, 4}};
+  for (const auto& f : fields)
+    EXPECT_THROW(DecodeBitmap24(withField(f[0], f[1], static_cast<int>(f[2]))), std::runtime_error)
+        << f[0];
 }
 
 }  // namespace

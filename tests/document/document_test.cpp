@@ -81,6 +81,21 @@ TEST(PictureDocument, UndoAfterResizeResamplesSourceOnlyWhenWidthDiffers) {
   EXPECT_EQ(tall.Source().Height(), 4);  // heights are not compared
 }
 
+// Factors that are exact in binary (1/2 across, 1/4 down, and back), so the sizes are exact and
+// a height factor applied to the width would show.
+TEST(PictureDocument, UndoAndRedoOnANonSquarePictureRestoreWidthAndHeightInOrder) {
+  PictureDocument doc(Flat(21, 13, 0));
+  doc.SetWorking(Flat(42, 52, 1));
+  doc.SetSource(Flat(42, 52, 2));
+  doc.Backup();
+  ASSERT_TRUE(doc.Undo());
+  EXPECT_EQ(doc.Working(), Flat(21, 13, 0));
+  EXPECT_EQ(doc.Source(), Flat(21, 13, 2));
+  ASSERT_TRUE(doc.Redo());
+  EXPECT_EQ(doc.Working(), Flat(42, 52, 1));
+  EXPECT_EQ(doc.Source(), Flat(42, 52, 2));
+}
+
 TEST(PictureDocument, RenewRestoresOpenedPictureAndResetsHistory) {
   PictureDocument doc(Flat(4, 3, 5));
   doc.SetWorking(Flat(3, 4, 6));

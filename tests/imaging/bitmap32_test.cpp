@@ -74,10 +74,7 @@ TEST(ColorRef, RedIsTheLowestByte) {
 TEST(SetAlphaChannel, SetsAlphaOnlyAndEmptyIsANoOp) {
   TBitmap32 b = Numbered(5, 3, 0);
   SetAlphaChannel(b, 200);
-  for (int y = 0; y < 3; ++y)
-    for (int x = 0; x < 5; ++x)
-      EXPECT_EQ(b.At(x, y),
-                (Pixel{static_cast<std::uint8_t>(x), static_cast<std::uint8_t>(y), 7, 200}));
+  EXPECT_EQ(b, Numbered(5, 3, 200));
   TBitmap32 empty;
   SetAlphaChannel(empty, 255);
   EXPECT_TRUE(empty.Empty());
@@ -125,57 +122,50 @@ void ExpectPlacement(int ow, int oh, int x, int y) {
 }
 
 TEST(DrawOver, ClipsAtEverySide) {
-  ExpectPlacement(3, 3, 1, 1);     // inside
-  ExpectPlacement(3, 3, -1, -2);   // over the top-left corner
-  ExpectPlacement(3, 3, 4, 3);     // over the bottom-right corner
-  ExpectPlacement(3, 3, -2, 3);    // bottom-left
-  ExpectPlacement(3, 3, 5, -1);    // top-right
-  ExpectPlacement(10, 9, -2, -3);  // larger than the target on every side
-  ExpectPlacement(3, 3, -3, 0);    // just off the left edge: nothing
-  ExpectPlacement(3, 3, 6, 0);     // just off the right edge
-  ExpectPlacement(3, 3, 0, -3);
-  ExpectPlacement(3, 3, 0, 5);
-  ExpectPlacement(3, 3, INT_MAX, INT_MAX);  // far away, no overflow
-  ExpectPlacement(3, 3, INT_MIN, INT_MIN);
-  ExpectPlacement(0, 0, 0, 0);  // empty overlay
-}
-
-TEST(DrawOver, EmptyTargetIsUnchanged) {
+  // {width, height, x, y}: inside, over each corner, larger than the target on every side, just
+  // off each edge, far away (no overflow), and an empty overlay.
+  const int cases[][4] = {{3, 3, 1, 1},
+                          {3, 3, -1, -2},
+                          {3, 3, 4, 3},
+                          {3, 3, -2, 3},
+                          {3, 3, 5, -1},
+                          {10, 9, -2, -3},
+                          {3, 3, -3, 0},
+                          {3, 3, 6, 0},
+                          {3, 3, 0, -3},
+                          {3, 3, 0, 5},
+                          {3, 3, INT_MAX, INT_MAX},
+                          {3, 3, INT_MIN, INT_MIN},
+                          {0, 0, 0, 0}};
+  for (const auto& c : cases) ExpectPlacement(c[0], c[1], c[2], c[3]);
+  // An empty target stays empty.
   TBitmap32 target;
   Numbered(3, 3).DrawOver(0, 0, target);
   Numbered(3, 3).DrawOver(-1, -1, target);
   EXPECT_TRUE(target.Empty());
 }
 
-TEST(ZoomInandOut, UnitFactorsKeepThePicture) {
+TEST(ZoomInandOut, UnitFactorsKeepThePictureAndNewSizesAreTruncated) {
   TBitmap32 b = Numbered(7, 4);
   ZoomInandOut(b, 1.0L, 1.0L);
   EXPECT_EQ(b, Numbered(7, 4));
-}
-
-TEST(ZoomInandOut, NewSizeIsTruncated) {
-  TBitmap32 b = Numbered(5, 3);
+  b = Numbered(5, 3);
   ZoomInandOut(b, 1.0L, 0.5L);
   EXPECT_EQ(b.Width(), 2);
   EXPECT_EQ(b.Height(), 3);
-  TBitmap32 c = Numbered(10, 10);
-  ZoomInandOut(c, 0.99L, 1.55L);
-  EXPECT_EQ(c.Width(), 15);
-  EXPECT_EQ(c.Height(), 9);
+  b = Numbered(10, 10);
+  ZoomInandOut(b, 0.99L, 1.55L);
+  EXPECT_EQ(b.Width(), 15);
+  EXPECT_EQ(b.Height(), 9);
 }
 
 TEST(ZoomInandOut, SizesOfZeroOrBelowOrNotANumberGiveEmpty) {
   const long double nan = std::numeric_limits<long double>::quiet_NaN();
   const long double inf = std::numeric_limits<long double>::infinity();
-  for (auto [hf, wf] : {std::pair{0.0L, 1.0L},
-                        {1.0L, 0.0L},
-                        {-1.0L, 1.0L},
-                        {1.0L, -2.0L},
-                        {nan, 1.0L},
-                        {1.0L, nan},
-                        {inf, 1.0L},
-                        {1.0L, -inf},
-                        {0.1L, 1.0L}}) {
+  const long double factors[][2] = {{0.0L, 1.0L},  {1.0L, 0.0L}, {-1.0L, 1.0L},
+                                    {1.0L, -2.0L}, {nan, 1.0L},  {1.0L, nan},
+                                    {inf, 1.0L},   {1.0L, -inf}, {0.1L, 1.0L}};
+  for (auto [hf, wf] : factors) {
     TBitmap32 b = Numbered(6, 4);
     ZoomInandOut(b, hf, wf);
     EXPECT_TRUE(b.Empty()) << hf << " " << wf;
@@ -215,12 +205,8 @@ void ExpectNearestPixelResample(long double hf, long double wf) {
       // One source column per target column, one source row per target row.
       ASSERT_EQ(p.b, b.At(x, 0).b);
       ASSERT_EQ(p.g, b.At(0, y).g);
-      if (x > 0) {
-        ASSERT_GE(p.b, b.At(x - 1, y).b);
-      }
-      if (y > 0) {
-        ASSERT_GE(p.g, b.At(x, y - 1).g);
-      }
+      if (x > 0) ASSERT_GE(p.b, b.At(x - 1, y).b);
+      if (y > 0) ASSERT_GE(p.g, b.At(x, y - 1).g);
       columns.insert(p.b);
       rows.insert(p.g);
     }
@@ -240,11 +226,10 @@ void ExpectNearestPixelResample(long double hf, long double wf) {
 }
 
 TEST(ZoomInandOut, NearestPixelCoversTheSource) {
-  ExpectNearestPixelResample(2.0L, 2.0L);
-  ExpectNearestPixelResample(0.5L, 0.5L);
-  ExpectNearestPixelResample(1.37L, 0.73L);
-  ExpectNearestPixelResample(0.3L, 2.49L);
-  ExpectNearestPixelResample(1.0L, 0.02L);  // two columns of 101
+  // The last: two columns of 101.
+  const long double factors[][2] = {
+      {2.0L, 2.0L}, {0.5L, 0.5L}, {1.37L, 0.73L}, {0.3L, 2.49L}, {1.0L, 0.02L}};
+  for (auto [hf, wf] : factors) ExpectNearestPixelResample(hf, wf);
 }
 
 }  // namespace

@@ -3,7 +3,8 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <random>
+
+#include "tests/imaging/random_picture.h"
 
 namespace quillane {
 namespace {
@@ -121,18 +122,6 @@ TEST(Picsobel, BrightHorizontalLineBecomesADarkLine) {
   TBitmap32 out(9, 7, Rgb(255, 255, 255));
   for (int x = 0; x < 9; ++x) out.At(x, 3) = Rgb(0, 0, 0);
   EXPECT_TRUE(SameColours(Sobel(in), out));
-}
-
-TBitmap32 RandomPicture(int w, int h, unsigned seed) {
-  std::mt19937 rng(seed);
-  TBitmap32 b(w, h);
-  for (int y = 0; y < h; ++y)
-    for (int x = 0; x < w; ++x) {
-      const std::uint32_t v = rng();
-      b.At(x, y) = Pixel{static_cast<std::uint8_t>(v), static_cast<std::uint8_t>(v >> 8),
-                         static_cast<std::uint8_t>(v >> 16), static_cast<std::uint8_t>(v >> 24)};
-    }
-  return b;
 }
 
 TEST(Picsobel, TwoHighOrTwoWideRepeatsTheSecondLineInverted) {

@@ -5,10 +5,10 @@
 
 #include <cmath>
 #include <cstdlib>
-#include <random>
 
 #include "imaging/numeric.h"
 #include "imaging/tone.h"
+#include "tests/imaging/random_picture.h"
 
 namespace quillane {
 namespace {
@@ -158,26 +158,12 @@ TEST_P(EveryHsl, HslToRgbMatchesThePlainConversion) {
         ASSERT_EQ(HslToRgb(h, s, l), PlainHslToRgb(h, s, l)) << h << "," << s << "," << l;
 }
 
-TBitmap32 RandomPicture(int w, int h, unsigned seed, bool grayish) {
-  std::mt19937 rng(seed);
-  TBitmap32 b(w, h);
-  for (int y = 0; y < h; ++y)
-    for (int x = 0; x < w; ++x) {
-      const std::uint32_t v = rng();
-      Pixel p{static_cast<std::uint8_t>(v), static_cast<std::uint8_t>(v >> 8),
-              static_cast<std::uint8_t>(v >> 16), static_cast<std::uint8_t>(v >> 24)};
-      if (grayish && (v >> 30) != 0) p.g = p.r = p.b;  // mostly gray, some colour
-      b.At(x, y) = p;
-    }
-  return b;
-}
-
 TEST(PencilContrastPass, MatchesThePlainChainOnColourAndGrayPictures) {
   unsigned seed = 0;
   for (auto [w, h] : {std::pair{1, 1}, {7, 3}, {320, 240}})
     for (bool grayish : {false, true}) {
       const TBitmap32 in = RandomPicture(w, h, ++seed, grayish);
-      for (int c : {0, 10, 44, 45, 46, 89}) {
+      for (int c : {0, 10, 44, 45, 46, 60, 89}) {
         const TBitmap32 out = PencilContrastPass(in, c);
         ASSERT_EQ(out.Width(), w);
         ASSERT_EQ(out.Height(), h);
