@@ -18,15 +18,15 @@
 #include <optional>
 #include <string>
 
-#include "ui/glyphs.h"
-#include "ui/picture_view.h"
-#include "ui/platform.h"
-#include "ui/tool_window.h"
 #include "batch/batch_convert.h"
 #include "batch/batch_convert_ok.h"
 #include "codecs/picture_file.h"
 #include "data/startup_picture.h"
 #include "imaging/numeric.h"
+#include "ui/glyphs.h"
+#include "ui/picture_view.h"
+#include "ui/platform.h"
+#include "ui/tool_window.h"
 
 namespace quillane {
 namespace {

@@ -12,9 +12,9 @@
 #include <functional>
 #include <vector>
 
-#include "ui/tool_host.h"
 #include "document/document.h"
 #include "effects/registry.h"
+#include "ui/tool_host.h"
 
 class QAction;
 class QLabel;

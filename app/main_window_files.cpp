@@ -3,8 +3,8 @@
 
 #include "app/local_path.h"
 #include "app/main_window.h"
-#include "ui/platform.h"
 #include "codecs/picture_file.h"
+#include "ui/platform.h"
 
 namespace quillane {
 namespace {

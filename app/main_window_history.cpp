@@ -8,8 +8,8 @@
 #include <exception>
 
 #include "app/main_window.h"
-#include "ui/platform.h"
 #include "document/run_effect.h"
+#include "ui/platform.h"
 
 namespace quillane {
 

@@ -8,10 +8,10 @@
 
 #include "app/local_path.h"
 #include "app/main_window.h"
-#include "ui/platform.h"
-#include "ui/tool_window.h"
 #include "batch/batch_convert.h"
 #include "batch/batch_convert_ok.h"
+#include "ui/platform.h"
+#include "ui/tool_window.h"
 
 namespace quillane {
 

@@ -4,8 +4,8 @@
 #include <QLocale>
 
 #include "app/main_window.h"
-#include "ui/picture_view.h"
 #include "imaging/numeric.h"
+#include "ui/picture_view.h"
 
 namespace quillane {
 

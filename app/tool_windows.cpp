@@ -4,8 +4,8 @@
 #include <iterator>
 
 #include "app/main_window.h"
-#include "ui/tool_window.h"
 #include "effects/mono/bw_sketch_window.h"
+#include "ui/tool_window.h"
 
 namespace quillane {
 namespace {

@@ -14,8 +14,8 @@
 #include <QSlider>
 #include <QVBoxLayout>
 
-#include "ui/platform.h"
 #include "imaging/bitmap32.h"
+#include "ui/platform.h"
 
 namespace quillane {
 namespace {

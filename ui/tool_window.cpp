@@ -1,6 +1,5 @@
 #include "ui/tool_window.h"
 
-#include <QCheckBox>
 #include <QCloseEvent>
 #include <QGridLayout>
 #include <QHBoxLayout>
@@ -8,13 +7,12 @@
 #include <QLineEdit>
 #include <QPushButton>
 #include <QShowEvent>
-#include <QSlider>
 #include <QToolButton>
 #include <QVBoxLayout>
 
+#include "batch/batch_convert.h"
 #include "ui/glyphs.h"
 #include "ui/platform.h"
-#include "batch/batch_convert.h"
 
 namespace quillane {
 namespace {

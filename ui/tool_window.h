@@ -17,8 +17,6 @@ class QBoxLayout;
 class QFrame;
 class QLabel;
 class QLineEdit;
-class QPushButton;
-class QSlider;
 class QToolButton;
 class QVBoxLayout;
 
