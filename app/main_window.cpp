@@ -2,31 +2,21 @@
 
 #include <QAction>
 #include <QCloseEvent>
-#include <QFile>
 #include <QLabel>
 #include <QListWidget>
-#include <QLocale>
 #include <QMenu>
 #include <QMenuBar>
 #include <QPainter>
 #include <QScrollArea>
-#include <QScrollBar>
 #include <QStatusBar>
 #include <QToolButton>
-#include <exception>
 #include <iterator>
-#include <optional>
-#include <string>
 
-#include "batch/batch_convert.h"
 #include "batch/batch_convert_ok.h"
-#include "codecs/picture_file.h"
 #include "data/startup_picture.h"
-#include "imaging/numeric.h"
 #include "ui/glyphs.h"
 #include "ui/picture_view.h"
 #include "ui/platform.h"
-#include "ui/tool_window.h"
 
 namespace quillane {
 namespace {
