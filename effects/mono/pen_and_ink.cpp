@@ -72,42 +72,42 @@ TBitmap32 Pen_and_Ink(const TBitmap32& source, int threshold, bool colorInk) {
   const int w = source.Width(), h = source.Height();
   TBitmap32 result(w, h);
   if (result.Empty()) return result;
-  // Paper and ink of the whole picture, one byte per pixel, then each output row from three
-  // rows of it: a pixel is cleared when the AND over its neighbourhood is still ink.
-  std::vector<std::uint8_t> paper(source.PixelCount());
-  const auto row = [&](int y) {
-    return paper.data() + static_cast<std::size_t>(y) * static_cast<std::size_t>(w);
-  };
-  ParallelRows(0, h, static_cast<std::size_t>(w) * 2, [&](int y0, int y1) {
-    for (int y = y0; y < y1; ++y) {
-      std::uint8_t* cells = row(y);
-      InkGrayLevels(source.ScanLine(y), cells, w);
-      for (int x = 0; x < w; ++x) cells[x] = cells[x] > threshold ? 0xFF : 0;
-    }
-  });
+  const auto width = static_cast<std::size_t>(w);
   const auto write = [&](Pixel& out, const Pixel& in, bool isPaper) {
     out = isPaper ? kPaper : (colorInk ? Pixel{in.b, in.g, in.r, 255} : kInk);
   };
-  ParallelRows(0, h, static_cast<std::size_t>(w) * 3, [&](int y0, int y1) {
-    std::vector<std::uint8_t> column(static_cast<std::size_t>(w));
+  ParallelRows(0, h, width * 4, [&](int y0, int y1) {
+    // Paper (0xFF) or ink (0) of the rows around the one being written, three at a time, so no
+    // row is thresholded more than once within the band.
+    std::vector<std::uint8_t> rings(3 * width), column(width);
+    const auto paper = [&](int y) {
+      return rings.data() + static_cast<std::size_t>(y % 3) * width;
+    };
+    const auto thresholdRow = [&](int y) {
+      std::uint8_t* cells = paper(y);
+      InkGrayLevels(source.ScanLine(y), cells, w);
+      for (int x = 0; x < w; ++x) cells[x] = cells[x] > threshold ? 0xFF : 0;
+    };
+    if (y0 > 0) thresholdRow(y0 - 1);
+    thresholdRow(y0);
     for (int y = y0; y < y1; ++y) {
+      if (y + 1 < h) thresholdRow(y + 1);
       const Pixel* in = source.ScanLine(y);
       Pixel* out = result.ScanLine(y);
-      const std::uint8_t* self = row(y);
+      const std::uint8_t* self = paper(y);
       if (y == 0 || y == h - 1 || w < 3) {
         for (int x = 0; x < w; ++x) write(out[x], in[x], self[x] != 0);
         continue;
       }
-      const std::uint8_t* above = row(y - 1);
-      const std::uint8_t* below = row(y + 1);
-      // Any paper in the column of three rows, then across three columns.
+      // A pixel is cleared when no paper lies in its three columns of three rows.
+      const std::uint8_t* above = paper(y - 1);
+      const std::uint8_t* below = paper(y + 1);
       for (int x = 0; x < w; ++x)
         column[static_cast<std::size_t>(x)] = above[x] | self[x] | below[x];
       write(out[0], in[0], self[0] != 0);
       for (int x = 1; x < w - 1; ++x) {
-        const bool inside =
-            (column[static_cast<std::size_t>(x - 1)] | column[static_cast<std::size_t>(x)] |
-             column[static_cast<std::size_t>(x + 1)]) == 0;
+        const auto i = static_cast<std::size_t>(x);
+        const bool inside = (column[i - 1] | column[i] | column[i + 1]) == 0;
         write(out[x], in[x], inside || self[x] != 0);
       }
       write(out[w - 1], in[w - 1], self[w - 1] != 0);

@@ -1,7 +1,9 @@
 // Vuzorar: the pen drawing with every ink pixel drawn out into a short hatching stroke.
 #include "effects/mono/vuzorar.h"
 
+#include <algorithm>
 #include <stdexcept>
+#include <thread>
 #include <utility>
 #include <vector>
 
@@ -36,25 +38,66 @@ bool IsInk(const Pixel& p) {
   return p.b == 0 && p.g == 0 && p.r == 0;
 }
 
-// A thresholded picture as one byte per pixel, 0 for ink and 0xFF for paper, so that a pass
-// is an AND of three shifted rows and moves a quarter of the bytes a pixel pass would.
-using InkMask = std::vector<std::uint8_t>;
+// Rows of a thresholded picture are kept as one byte per pixel, 0 for ink and 0xFF for paper,
+// so that a pass over a row is an AND of three shifted rows.
+void ThresholdRow(const Pixel* in, std::uint8_t* out, int w, int pressure) {
+  GrayLevels(in, out, w);
+  for (int x = 0; x < w; ++x) out[x] = out[x] > pressure ? 0xFF : 0;
+}
 
-// One dilation pass from mask `from` into `to`; only interior cells are written, the border
-// cells of both masks being equal and never changing.
-void DilateMask(const InkMask& from, InkMask& to, int w, int h, const Offsets& n) {
-  const auto at = [w](int x, int y) {
-    return static_cast<std::size_t>(y) * static_cast<std::size_t>(w) + static_cast<std::size_t>(x);
+// One dilation pass over interior row y from the rows above, at and below it before the pass.
+void DilateRow(const std::uint8_t* const rows[3], std::uint8_t* __restrict out, int w,
+               const Offsets& n) {
+  const std::uint8_t* __restrict self = rows[1];
+  const std::uint8_t* __restrict first = rows[1 + n.dy1] + n.dx1;
+  const std::uint8_t* __restrict second = rows[1 + n.dy2] + n.dx2;
+  out[0] = self[0];
+  for (int x = 1; x < w - 1; ++x) out[x] = self[x] & first[x] & second[x];
+  out[w - 1] = self[w - 1];
+}
+
+// All passes at once, row by row: pass k of row y needs only pass k - 1 of rows y - 1 to y + 1,
+// so each pass keeps its last three rows and the picture is read and written once, whatever
+// the scope. Output rows y0 to y1 - 1 replace the edge map in drawing; the thresholded rows
+// beyond them that the passes reach come from halo (rows lo to y0 - 1, then y1 to hi).
+void HatchBand(TBitmap32& drawing, int y0, int y1, int pressure, int scope, const Offsets& n,
+               const std::vector<std::uint8_t>& halo) {
+  const int w = drawing.Width(), h = drawing.Height();
+  const auto lo = [&](int k) { return std::max(0, y0 - (scope - k)); };
+  const auto hi = [&](int k) { return std::min(h - 1, y1 - 1 + (scope - k)); };
+  const auto width = static_cast<std::size_t>(w);
+  std::vector<std::uint8_t> rings(static_cast<std::size_t>(scope + 1) * 3 * width);
+  const auto slot = [&](int k, int y) {
+    return rings.data() +
+           (static_cast<std::size_t>(k) * 3 + static_cast<std::size_t>(y % 3)) * width;
   };
-  ParallelRows(1, h - 1, static_cast<std::size_t>(w) / 4, [&](int y0, int y1) {
-    for (int y = y0; y < y1; ++y) {
-      const std::uint8_t* __restrict self = &from[at(1, y)];
-      const std::uint8_t* __restrict first = &from[at(1 + n.dx1, y + n.dy1)];
-      const std::uint8_t* __restrict second = &from[at(1 + n.dx2, y + n.dy2)];
-      std::uint8_t* __restrict out = &to[at(1, y)];
-      for (int x = 0; x < w - 2; ++x) out[x] = self[x] & first[x] & second[x];
+  for (int t = lo(0); t <= hi(0) + scope; ++t) {
+    if (t <= hi(0)) {
+      if (t >= y0 && t < y1) {
+        ThresholdRow(drawing.ScanLine(t), slot(0, t), w, pressure);
+      } else {
+        const int index = t < y0 ? t - lo(0) : y0 - lo(0) + t - y1;
+        std::copy_n(halo.data() + static_cast<std::size_t>(index) * width, width, slot(0, t));
+      }
     }
-  });
+    for (int k = 1; k <= scope; ++k) {
+      const int r = t - k;
+      if (r < lo(k) || r > hi(k)) continue;
+      if (r == 0 || r == h - 1) {
+        std::copy_n(slot(k - 1, r), width, slot(k, r));
+      } else {
+        const std::uint8_t* const rows[3] = {slot(k - 1, r - 1), slot(k - 1, r),
+                                             slot(k - 1, r + 1)};
+        DilateRow(rows, slot(k, r), w, n);
+      }
+    }
+    const int r = t - scope;
+    if (r >= y0 && r < y1) {
+      Pixel* out = drawing.ScanLine(r);
+      const std::uint8_t* cells = slot(scope, r);
+      for (int x = 0; x < w; ++x) out[x] = cells[x] != 0 ? kPaper : kInk;
+    }
+  }
 }
 
 }  // namespace
@@ -83,27 +126,29 @@ TBitmap32 Vuzorar(const TBitmap32& source, int pressure, int scope, HatchDirecti
     two_Value1Click(drawing, pressure);
     return drawing;
   }
-  const std::size_t count = drawing.PixelCount();
-  InkMask mask(count);
-  ParallelRows(0, h, static_cast<std::size_t>(w), [&](int y0, int y1) {
-    for (int y = y0; y < y1; ++y) {
-      std::uint8_t* row = &mask[static_cast<std::size_t>(y) * static_cast<std::size_t>(w)];
-      GrayLevels(drawing.ScanLine(y), row, w);
-      for (int x = 0; x < w; ++x) row[x] = row[x] > pressure ? 0xFF : 0;
-    }
-  });
-  // Two masks for the whole run, the passes taking turns at reading and writing.
-  InkMask other = mask;
-  for (int pass = 0; pass < scope; ++pass) {
-    DilateMask(mask, other, w, h, n);
-    std::swap(mask, other);
+  // Bands rewrite their rows in place, so the thresholded rows each band reads beyond its own
+  // are taken before any band starts.
+  const int bands =
+      std::min(h, static_cast<int>(std::max(1u, std::thread::hardware_concurrency())));
+  const auto bandStart = [&](int i) {
+    return static_cast<int>(static_cast<long long>(h) * i / bands);
+  };
+  const auto width = static_cast<std::size_t>(w);
+  std::vector<std::vector<std::uint8_t>> halos(static_cast<std::size_t>(bands));
+  for (int i = 0; i < bands; ++i) {
+    const int y0 = bandStart(i), y1 = bandStart(i + 1);
+    std::vector<std::uint8_t>& halo = halos[static_cast<std::size_t>(i)];
+    const auto keep = [&](int y) {
+      halo.resize(halo.size() + width);
+      ThresholdRow(drawing.ScanLine(y), halo.data() + halo.size() - width, w, pressure);
+    };
+    for (int y = std::max(0, y0 - scope); y < y0; ++y) keep(y);
+    for (int y = y1; y < std::min(h, y1 + scope); ++y) keep(y);
   }
-  ParallelRows(0, h, static_cast<std::size_t>(w), [&](int y0, int y1) {
-    for (int y = y0; y < y1; ++y) {
-      Pixel* row = drawing.ScanLine(y);
-      const std::uint8_t* cells = &mask[static_cast<std::size_t>(y) * static_cast<std::size_t>(w)];
-      for (int x = 0; x < w; ++x) row[x] = cells[x] != 0 ? kPaper : kInk;
-    }
+  ParallelRows(0, bands, width * static_cast<std::size_t>(h / bands + 1) * 4, [&](int b0, int b1) {
+    for (int i = b0; i < b1; ++i)
+      HatchBand(drawing, bandStart(i), bandStart(i + 1), pressure, scope, n,
+                halos[static_cast<std::size_t>(i)]);
   });
   return drawing;
 }
@@ -157,7 +202,7 @@ const EffectSpec& VuzorarEffect() {
                            {"falling", "\\\\\\", "RadioButton2", ""},
                            {"vertical", "| | |", "RadioButton3", ""},
                            {"horizontal", "==", "RadioButton4", ""}},
-               .help = "the strokes' direction; every showing of the window resets it",
+               .help = "the direction of the hatching strokes",
                .resetOnShow = true},
           },
       .routine =
