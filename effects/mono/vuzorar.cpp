@@ -49,10 +49,10 @@ void ThresholdRow(const Pixel* in, std::uint8_t* out, int w, int pressure) {
 void DilateRow(const std::uint8_t* const rows[3], std::uint8_t* __restrict out, int w,
                const Offsets& n) {
   const std::uint8_t* __restrict self = rows[1];
-  const std::uint8_t* __restrict first = rows[1 + n.dy1] + n.dx1;
-  const std::uint8_t* __restrict second = rows[1 + n.dy2] + n.dx2;
+  const std::uint8_t* __restrict first = rows[1 + n.dy1];
+  const std::uint8_t* __restrict second = rows[1 + n.dy2];
   out[0] = self[0];
-  for (int x = 1; x < w - 1; ++x) out[x] = self[x] & first[x] & second[x];
+  for (int x = 1; x < w - 1; ++x) out[x] = self[x] & first[x + n.dx1] & second[x + n.dx2];
   out[w - 1] = self[w - 1];
 }
 
