@@ -181,39 +181,44 @@ inline std::uint8_t FastGrayValue(int r, int g, int b) {
   return static_cast<std::uint8_t>(RoundBetween(0.3L * r + 0.59L * g + 0.11L * b, k));
 }
 
-// Gray rows: each pixel's gray value plus shift, limited to 0..255, in B, G and R, alpha 255.
-// Pixels are taken as little-endian words 0xAARRGGBB in chunks, in 16-bit arithmetic, so that
-// the compiler can work on several at once; exact halves, which need the extended-precision
-// sum, are marked and redone one by one afterwards. in and out may be the same row.
-void GrayRow(const Pixel* in, Pixel* out, int w, int shift) {
+// Gray values of n <= kGrayChunk pixels taken as little-endian words 0xAARRGGBB, in 16-bit
+// arithmetic so that the compiler can work on several at once; exact halves, which need the
+// extended-precision sum, are marked and redone one by one afterwards.
+constexpr int kGrayChunk = 128;
+void GrayChunk(const std::uint32_t* src, int n, std::uint8_t* level) {
   static_assert(std::endian::native == std::endian::little, "pixels are read as 0xAARRGGBB");
-  constexpr int kChunk = 128;
-  std::uint32_t src[kChunk];
-  std::uint32_t dst[kChunk];
-  std::uint8_t half[kChunk];
-  for (int x0 = 0; x0 < w; x0 += kChunk) {
-    const int n = std::min(kChunk, w - x0);
+  std::uint8_t half[kGrayChunk];
+  std::uint8_t anyHalf = 0;
+  for (int i = 0; i < n; ++i) {
+    const std::uint32_t p = src[i];
+    const auto sum = static_cast<std::uint16_t>(30 * ((p >> 16) & 0xFF) + 59 * ((p >> 8) & 0xFF) +
+                                                11 * (p & 0xFF));
+    // sum / 100 for every sum up to 25500.
+    const auto k = static_cast<std::uint16_t>((static_cast<std::uint32_t>(sum) * 5243u) >> 19);
+    const auto rest = static_cast<std::uint16_t>(sum - 100 * k);
+    half[i] = rest == 50;
+    anyHalf |= half[i];
+    level[i] = static_cast<std::uint8_t>(k + (rest > 50));
+  }
+  if (!anyHalf) return;
+  for (int i = 0; i < n; ++i)
+    if (half[i])
+      level[i] = FastGrayValue((src[i] >> 16) & 0xFF, (src[i] >> 8) & 0xFF, src[i] & 0xFF);
+}
+
+// Gray rows: each pixel's gray value plus shift, limited to 0..255, in B, G and R, alpha 255.
+// in and out may be the same row.
+void GrayRow(const Pixel* in, Pixel* out, int w, int shift) {
+  std::uint32_t src[kGrayChunk];
+  std::uint32_t dst[kGrayChunk];
+  std::uint8_t level[kGrayChunk];
+  for (int x0 = 0; x0 < w; x0 += kGrayChunk) {
+    const int n = std::min(kGrayChunk, w - x0);
     std::memcpy(src, in + x0, static_cast<std::size_t>(n) * sizeof(Pixel));
-    std::uint8_t anyHalf = 0;
+    GrayChunk(src, n, level);
     for (int i = 0; i < n; ++i) {
-      const std::uint32_t p = src[i];
-      const auto sum = static_cast<std::uint16_t>(30 * ((p >> 16) & 0xFF) + 59 * ((p >> 8) & 0xFF) +
-                                                  11 * (p & 0xFF));
-      // sum / 100 for every sum up to 25500.
-      const auto k = static_cast<std::uint16_t>((static_cast<std::uint32_t>(sum) * 5243u) >> 19);
-      const auto rest = static_cast<std::uint16_t>(sum - 100 * k);
-      half[i] = rest == 50;
-      anyHalf |= half[i];
-      const int level = std::clamp(k + (rest > 50) + shift, 0, 255);
-      dst[i] = static_cast<std::uint32_t>(level) * 0x010101u | 0xFF000000u;
-    }
-    if (anyHalf) {
-      for (int i = 0; i < n; ++i) {
-        if (!half[i]) continue;
-        const int r = (src[i] >> 16) & 0xFF, g = (src[i] >> 8) & 0xFF, b = src[i] & 0xFF;
-        const int level = std::clamp(FastGrayValue(r, g, b) + shift, 0, 255);
-        dst[i] = static_cast<std::uint32_t>(level) * 0x010101u | 0xFF000000u;
-      }
+      const int v = std::clamp(level[i] + shift, 0, 255);
+      dst[i] = static_cast<std::uint32_t>(v) * 0x010101u | 0xFF000000u;
     }
     std::memcpy(out + x0, dst, static_cast<std::size_t>(n) * sizeof(Pixel));
   }
@@ -305,6 +310,15 @@ void ConvertToGray(TBitmap32& bitmap) {
   ParallelRows(0, bitmap.Height(), static_cast<std::size_t>(w), [&](int y0, int y1) {
     for (int y = y0; y < y1; ++y) GrayRow(bitmap.ScanLine(y), bitmap.ScanLine(y), w, 0);
   });
+}
+
+void GrayLevels(const Pixel* in, std::uint8_t* out, int count) {
+  std::uint32_t src[kGrayChunk];
+  for (int x0 = 0; x0 < count; x0 += kGrayChunk) {
+    const int n = std::min(kGrayChunk, count - x0);
+    std::memcpy(src, in + x0, static_cast<std::size_t>(n) * sizeof(Pixel));
+    GrayChunk(src, n, out + x0);
+  }
 }
 
 }  // namespace quillane

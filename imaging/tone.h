@@ -56,4 +56,7 @@ TBitmap32 PencilLightingPass(const TBitmap32& input, int v);
 // Writes each pixel's gray value into B, G and R and 255 into alpha.
 void ConvertToGray(TBitmap32& bitmap);
 
+// The gray values (GrayValue) of count pixels, one byte each.
+void GrayLevels(const Pixel* in, std::uint8_t* out, int count);
+
 }  // namespace quillane

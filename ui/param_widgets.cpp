@@ -13,6 +13,7 @@
 #include <QRadioButton>
 #include <QSlider>
 #include <QVBoxLayout>
+#include <algorithm>
 
 #include "imaging/bitmap32.h"
 #include "ui/platform.h"
@@ -40,7 +41,8 @@ class SliderParam : public ParamWidget {
     auto* row = new QHBoxLayout;
     row->setSpacing(6);
     QLabel* caption = CaptionLabel(p, window);
-    caption->setFixedWidth(kCaptionWidth);
+    // Short captions line their sliders up; a longer one is shown whole rather than cut off.
+    caption->setFixedWidth(std::max(kCaptionWidth, caption->sizeHint().width()));
     row->addWidget(caption);
     slider_ = new QSlider(Qt::Horizontal, &window);
     slider_->setObjectName(Text(p.objectName));

@@ -1,8 +1,35 @@
 // Pen sketch: the edge map thresholded to black ink on white paper.
-// Its window opens from the menu; the effect itself is still to come.
+#include "effects/mono/pen_sketch.h"
+
+#include <vector>
+
 #include "effects/registry.h"
+#include "imaging/edge_map.h"
+#include "imaging/parallel.h"
+#include "imaging/tone.h"
 
 namespace quillane {
+
+void two_Value1Click(TBitmap32& bitmap, int level) {
+  const int w = bitmap.Width();
+  ParallelRows(0, bitmap.Height(), static_cast<std::size_t>(w), [&](int y0, int y1) {
+    // One row of gray values at a time, so the picture is read and written in a single pass.
+    std::vector<std::uint8_t> gray(static_cast<std::size_t>(w));
+    for (int y = y0; y < y1; ++y) {
+      Pixel* row = bitmap.ScanLine(y);
+      GrayLevels(row, gray.data(), w);
+      for (int x = 0; x < w; ++x)
+        row[x] = gray[static_cast<std::size_t>(x)] > level ? kPaper : kInk;
+    }
+  });
+}
+
+TBitmap32 PenSketch(const TBitmap32& source, int pressure) {
+  TBitmap32 drawing = source;
+  picsobel(drawing);
+  two_Value1Click(drawing, pressure);
+  return drawing;
+}
 
 const EffectSpec& PenSketchEffect() {
   static const EffectSpec entry{
@@ -19,6 +46,24 @@ const EffectSpec& PenSketchEffect() {
       .collapsedHeight = 108,
       .expandedHeight = 184,
       .colorUp = true,
+      .batchPushesHistory = true,
+      .lineArtAfterApply = true,
+      .params =
+          {
+              {.name = "pen-pressure",
+               .objectName = "TrackBar1",
+               .captionLabel = "Label8",
+               .caption = "Pen Pressure:",
+               .maximum = 255,
+               .defaultValue = 128,
+               .numberLabel = "Label9",
+               .initialNumber = "128",
+               .help = "gray edge level at or below which a pixel is inked"},
+          },
+      .routine =
+          [](const EffectInput& in) {
+            return PenSketch(in.source, in.params.GetInt("pen-pressure"));
+          },
   };
   return entry;
 }

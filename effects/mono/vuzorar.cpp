@@ -1,8 +1,157 @@
 // Vuzorar: the pen drawing with every ink pixel drawn out into a short hatching stroke.
-// Its window opens from the menu; the effect itself is still to come.
+#include "effects/mono/vuzorar.h"
+
+#include <algorithm>
+#include <stdexcept>
+#include <thread>
+#include <utility>
+#include <vector>
+
+#include "effects/mono/pen_sketch.h"
 #include "effects/registry.h"
+#include "imaging/edge_map.h"
+#include "imaging/parallel.h"
+#include "imaging/tone.h"
 
 namespace quillane {
+namespace {
+
+struct Offsets {
+  int dx1, dy1, dx2, dy2;
+};
+
+Offsets NeighboursOf(HatchDirection direction) {
+  switch (direction) {
+    case HatchDirection::Rising:
+      return {-1, 1, 1, -1};
+    case HatchDirection::Falling:
+      return {-1, -1, 1, 1};
+    case HatchDirection::Vertical:
+      return {0, -1, 0, 1};
+    case HatchDirection::Horizontal:
+      return {-1, 0, 1, 0};
+  }
+  throw std::invalid_argument("no such hatching direction");
+}
+
+bool IsInk(const Pixel& p) {
+  return p.b == 0 && p.g == 0 && p.r == 0;
+}
+
+// Rows of a thresholded picture are kept as one byte per pixel, 0 for ink and 0xFF for paper,
+// so that a pass over a row is an AND of three shifted rows.
+void ThresholdRow(const Pixel* in, std::uint8_t* out, int w, int pressure) {
+  GrayLevels(in, out, w);
+  for (int x = 0; x < w; ++x) out[x] = out[x] > pressure ? 0xFF : 0;
+}
+
+// One dilation pass over interior row y from the rows above, at and below it before the pass.
+void DilateRow(const std::uint8_t* const rows[3], std::uint8_t* __restrict out, int w,
+               const Offsets& n) {
+  const std::uint8_t* __restrict self = rows[1];
+  const std::uint8_t* __restrict first = rows[1 + n.dy1];
+  const std::uint8_t* __restrict second = rows[1 + n.dy2];
+  out[0] = self[0];
+  for (int x = 1; x < w - 1; ++x) out[x] = self[x] & first[x + n.dx1] & second[x + n.dx2];
+  out[w - 1] = self[w - 1];
+}
+
+// All passes at once, row by row: pass k of row y needs only pass k - 1 of rows y - 1 to y + 1,
+// so each pass keeps its last three rows and the picture is read and written once, whatever
+// the scope. Output rows y0 to y1 - 1 replace the edge map in drawing; the thresholded rows
+// beyond them that the passes reach come from halo (rows lo to y0 - 1, then y1 to hi).
+void HatchBand(TBitmap32& drawing, int y0, int y1, int pressure, int scope, const Offsets& n,
+               const std::vector<std::uint8_t>& halo) {
+  const int w = drawing.Width(), h = drawing.Height();
+  const auto lo = [&](int k) { return std::max(0, y0 - (scope - k)); };
+  const auto hi = [&](int k) { return std::min(h - 1, y1 - 1 + (scope - k)); };
+  const auto width = static_cast<std::size_t>(w);
+  std::vector<std::uint8_t> rings(static_cast<std::size_t>(scope + 1) * 3 * width);
+  const auto slot = [&](int k, int y) {
+    return rings.data() +
+           (static_cast<std::size_t>(k) * 3 + static_cast<std::size_t>(y % 3)) * width;
+  };
+  for (int t = lo(0); t <= hi(0) + scope; ++t) {
+    if (t <= hi(0)) {
+      if (t >= y0 && t < y1) {
+        ThresholdRow(drawing.ScanLine(t), slot(0, t), w, pressure);
+      } else {
+        const int index = t < y0 ? t - lo(0) : y0 - lo(0) + t - y1;
+        std::copy_n(halo.data() + static_cast<std::size_t>(index) * width, width, slot(0, t));
+      }
+    }
+    for (int k = 1; k <= scope; ++k) {
+      const int r = t - k;
+      if (r < lo(k) || r > hi(k)) continue;
+      if (r == 0 || r == h - 1) {
+        std::copy_n(slot(k - 1, r), width, slot(k, r));
+      } else {
+        const std::uint8_t* const rows[3] = {slot(k - 1, r - 1), slot(k - 1, r),
+                                             slot(k - 1, r + 1)};
+        DilateRow(rows, slot(k, r), w, n);
+      }
+    }
+    const int r = t - scope;
+    if (r >= y0 && r < y1) {
+      Pixel* out = drawing.ScanLine(r);
+      const std::uint8_t* cells = slot(scope, r);
+      for (int x = 0; x < w; ++x) out[x] = cells[x] != 0 ? kPaper : kInk;
+    }
+  }
+}
+
+}  // namespace
+
+void BitmapDilate(TBitmap32& bitmap, HatchDirection direction) {
+  const Offsets n = NeighboursOf(direction);
+  const int w = bitmap.Width(), h = bitmap.Height();
+  if (h - 2 < 1) return;
+  const TBitmap32 snapshot = bitmap;
+  for (int y = 1; y <= h - 2; ++y)
+    for (int x = 1; x <= w - 2; ++x) {
+      Pixel& p = bitmap.At(x, y);
+      if (IsInk(p)) continue;
+      if (IsInk(snapshot.At(x + n.dx1, y + n.dy1)) || IsInk(snapshot.At(x + n.dx2, y + n.dy2))) {
+        p.b = p.g = p.r = 0;
+      }
+    }
+}
+
+TBitmap32 Vuzorar(const TBitmap32& source, int pressure, int scope, HatchDirection direction) {
+  const Offsets n = NeighboursOf(direction);
+  TBitmap32 drawing = source;
+  picsobel(drawing);
+  const int w = drawing.Width(), h = drawing.Height();
+  if (h < 3 || w < 3 || scope < 1) {
+    two_Value1Click(drawing, pressure);
+    return drawing;
+  }
+  // Bands rewrite their rows in place, so the thresholded rows each band reads beyond its own
+  // are taken before any band starts.
+  const int bands =
+      std::min(h, static_cast<int>(std::max(1u, std::thread::hardware_concurrency())));
+  const auto bandStart = [&](int i) {
+    return static_cast<int>(static_cast<long long>(h) * i / bands);
+  };
+  const auto width = static_cast<std::size_t>(w);
+  std::vector<std::vector<std::uint8_t>> halos(static_cast<std::size_t>(bands));
+  for (int i = 0; i < bands; ++i) {
+    const int y0 = bandStart(i), y1 = bandStart(i + 1);
+    std::vector<std::uint8_t>& halo = halos[static_cast<std::size_t>(i)];
+    const auto keep = [&](int y) {
+      halo.resize(halo.size() + width);
+      ThresholdRow(drawing.ScanLine(y), halo.data() + halo.size() - width, w, pressure);
+    };
+    for (int y = std::max(0, y0 - scope); y < y0; ++y) keep(y);
+    for (int y = y1; y < std::min(h, y1 + scope); ++y) keep(y);
+  }
+  ParallelRows(0, bands, width * static_cast<std::size_t>(h / bands + 1) * 4, [&](int b0, int b1) {
+    for (int i = b0; i < b1; ++i)
+      HatchBand(drawing, bandStart(i), bandStart(i + 1), pressure, scope, n,
+                halos[static_cast<std::size_t>(i)]);
+  });
+  return drawing;
+}
 
 const EffectSpec& VuzorarEffect() {
   static const EffectSpec entry{
@@ -19,6 +168,49 @@ const EffectSpec& VuzorarEffect() {
       .collapsedHeight = 127,
       .expandedHeight = 205,
       .colorUp = true,
+      .batchPushesHistory = true,
+      .lineArtAfterApply = true,
+      .params =
+          {
+              {.name = "vuzorar-pressure",
+               .objectName = "TrackBar1",
+               .captionLabel = "Label8",
+               .caption = "Vuzorar Pressure:",
+               .maximum = 255,
+               .defaultValue = 128,
+               .pageStep = 10,
+               .numberLabel = "Label9",
+               .initialNumber = "128",
+               .help = "gray edge level at or below which a pixel is inked"},
+              {.name = "scope",
+               .objectName = "TrackBar2",
+               .captionLabel = "Label2",
+               .caption = "Scope:",
+               .minimum = 1,
+               .maximum = 10,
+               .defaultValue = 3,
+               .pageStep = 1,
+               .numberLabel = "Label3",
+               .initialNumber = "3",
+               .help = "dilation passes: each ink pixel becomes a stroke of 2 * scope + 1"},
+              {.kind = ParamKind::Choice,
+               .name = "direction",
+               .captionLabel = "Label1",
+               .caption = "Direction:",
+               .defaultValue = static_cast<int>(HatchDirection::Rising),
+               .options = {{"rising", "///", "RadioButton1", ""},
+                           {"falling", "\\\\\\", "RadioButton2", ""},
+                           {"vertical", "| | |", "RadioButton3", ""},
+                           {"horizontal", "==", "RadioButton4", ""}},
+               .help = "the direction of the hatching strokes",
+               .resetOnShow = true},
+          },
+      .routine =
+          [](const EffectInput& in) {
+            return Vuzorar(in.source, in.params.GetInt("vuzorar-pressure"),
+                           in.params.GetInt("scope"),
+                           static_cast<HatchDirection>(in.params.GetInt("direction")));
+          },
   };
   return entry;
 }

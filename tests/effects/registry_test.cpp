@@ -96,6 +96,17 @@ const Reference kReferences[] = {
      {252, 252, 252, 255},
      {230, 230, 230, 255},
      {255, 255, 255, 255}},
+    {"pen-sketch",
+     0xedfda84988e366d5,
+     {255, 255, 255, 255},
+     {255, 255, 255, 255},
+     {255, 255, 255, 255}},
+    {"vuzorar",
+     0x5b8ebaf6b6b5a3a4,
+     {255, 255, 255, 255},
+     {255, 255, 255, 255},
+     {255, 255, 255, 255}},
+    {"pen-and-ink", 0xf80d1c482dce032c, {0, 0, 0, 255}, {255, 255, 255, 255}, {0, 0, 0, 255}},
 };
 
 TEST(EffectTable, EveryEffectGivesItsReferenceResultOnTheBuiltInPicture) {

@@ -1,0 +1,33 @@
+// Pen and ink: the outlines of the dark areas of the photograph.
+#pragma once
+
+#include <cstdint>
+
+#include "imaging/bitmap32.h"
+
+namespace quillane {
+
+// This effect's own gray value: Round(0.299 R + 0.587 G + 0.11 B) in extended precision. The
+// weights sum to 0.996, so white is 254.
+std::uint8_t InkGrayValue(int r, int g, int b);
+// InkGrayValue of count pixels, one byte each, the fast way.
+void InkGrayLevels(const Pixel* in, std::uint8_t* out, int count);
+
+// Every pixel whose InkGrayValue is above threshold becomes paper (255, 255, 255, 255), every
+// other pixel ink (0, 0, 0, 255).
+void PictureTwoValue(TBitmap32& bitmap, int threshold);
+
+// The outline of a thresholded picture: every interior pixel whose whole 3 by 3 neighbourhood
+// is ink (B, G, R all 0) becomes paper (255, 255, 255, 255); every other pixel, the border rows
+// and columns included, is kept. Pictures under 3 rows or columns are returned unchanged.
+TBitmap32 penandink(const TBitmap32& thresholded);
+
+// Every ink pixel (red 0) of outline takes the B, G, R of the same pixel of source, alpha 255;
+// paper is kept. Both pictures have the same size.
+void ColorValue(TBitmap32& outline, const TBitmap32& source);
+
+// The whole effect: source thresholded at threshold (0..255), its outline, then with colorInk
+// the outline's ink in the source's colours. Identical to the three steps above in turn.
+TBitmap32 Pen_and_Ink(const TBitmap32& source, int threshold, bool colorInk);
+
+}  // namespace quillane

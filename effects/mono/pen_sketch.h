@@ -1,0 +1,18 @@
+// Pen sketch: the edge map thresholded to black ink on white paper.
+#pragma once
+
+#include "imaging/bitmap32.h"
+
+namespace quillane {
+
+inline constexpr Pixel kInk{0, 0, 0, 255};
+inline constexpr Pixel kPaper{255, 255, 255, 255};
+
+// Every pixel whose gray value (GrayValue) is above level becomes paper, every other pixel
+// ink; alpha 255 either way. A gray value equal to level is ink.
+void two_Value1Click(TBitmap32& bitmap, int level);
+
+// The edge map of a copy of source (picsobel), thresholded at pressure (0..255).
+TBitmap32 PenSketch(const TBitmap32& source, int pressure);
+
+}  // namespace quillane
