@@ -6,6 +6,7 @@
 #include <QImage>
 #include <QImageReader>
 #include <QString>
+#include <algorithm>
 #include <cstdlib>
 #include <exception>
 #include <filesystem>
@@ -462,7 +463,7 @@ std::string EffectListText() {
         const std::string description = DescribeParam(p);
         const std::size_t gap = description.find("  ");
         std::string option = "--" + p.name + " " + description.substr(0, gap);
-        if (option.size() < 18) option.resize(18, ' ');
+        option.resize(std::max<std::size_t>(option.size() + 1, 23), ' ');
         text << "      " << option << " "
              << (gap == std::string::npos ? "" : description.substr(gap + 2));
         if (!p.help.empty()) text << "; " << p.help;
