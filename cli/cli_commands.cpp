@@ -1,58 +1,21 @@
 #include "cli/cli_commands.h"
 
-#include <QFile>
-#include <QImage>
-#include <QImageReader>
-#include <QString>
 #include <exception>
 #include <filesystem>
 #include <fstream>
 #include <sstream>
 #include <vector>
 
-#include "document/document.h"
 #include "batch/batch_convert.h"
 #include "codecs/picture_file.h"
 #include "data/startup_picture.h"
+#include "document/document.h"
+#include "imaging/memory_budget.h"
 
 namespace quillane::cli {
 namespace fs = std::filesystem;
 
 namespace {
-
-bool EndsWithPng(const std::string& path) {
-  if (path.size() < 4) return false;
-  std::string tail = path.substr(path.size() - 4);
-  for (char& c : tail)
-    if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
-  return tail == ".png";
-}
-
-// PNG is not one of the program's own input types, so it is read here through Qt.
-std::optional<TBitmap32> LoadPng(const std::string& path, std::string& error) {
-  QImageReader reader(QFile::decodeName(path.c_str()), "png");
-  const QSize size = reader.size();
-  if (size.isValid() &&
-      static_cast<std::int64_t>(size.width()) * size.height() > TBitmap32::kMaxPixels) {
-    error = path + ": the picture is too large";
-    return std::nullopt;
-  }
-  // Qt's own cap is below ours; the size was checked above.
-  QImageReader::setAllocationLimit(
-      static_cast<int>(TBitmap32::kMaxPixels * 4 / (1024 * 1024) + 64));
-  QImage image = reader.read();
-  if (image.isNull()) {
-    error = path + ": " + reader.errorString().toStdString();
-    return std::nullopt;
-  }
-  image = image.convertToFormat(QImage::Format_ARGB32);  // B, G, R, A in memory, like Pixel
-  TBitmap32 picture(image.width(), image.height());
-  for (int y = 0; y < image.height(); ++y) {
-    const auto* from = reinterpret_cast<const Pixel*>(image.constScanLine(y));
-    std::copy(from, from + image.width(), picture.ScanLine(y));
-  }
-  return picture;
-}
 
 // The picture named by --input or INPUT, or the built-in one when none is named; nothing (with
 // the reason told on err) when it cannot be read.
@@ -67,18 +30,28 @@ std::optional<TBitmap32> InputOrBuiltInPicture(const Options& o, std::ostream& e
 int ApplyCommand(const Options& o, std::ostream& out, std::ostream& err) {
   std::optional<TBitmap32> picture = InputOrBuiltInPicture(o, err);
   if (!picture) return kExitFailed;
-  // Through a document, as the program does it: alpha 255, source in, working out.
-  PictureDocument document(std::move(*picture));
+  const std::string name = o.input.empty() ? "the built-in picture" : o.input;
+  const int width = picture->Width(), height = picture->Height();
   try {
-    document.SetWorking(o.effect->routine({document.Source(), document.Working(), o.params}));
-  } catch (const std::exception& e) {
-    err << "quillane-cli: " << o.effect->cliName << ": " << e.what() << "\n";
-    return kExitFailed;
-  }
-  try {
-    SaveOutputPicture(document.Working(), o.output);
-  } catch (const std::exception& e) {
-    err << "quillane-cli: cannot write " << o.output << ": " << e.what() << "\n";
+    // Through a document, as the program does it: alpha 255, source in, working out.
+    PictureDocument document(std::move(*picture));
+    try {
+      document.SetWorking(o.effect->routine({document.Source(), document.Working(), o.params}));
+    } catch (const std::bad_alloc&) {
+      throw;
+    } catch (const std::exception& e) {
+      err << "quillane-cli: " << o.effect->cliName << ": " << e.what() << "\n";
+      return kExitFailed;
+    }
+    try {
+      SaveOutputPicture(document.Working(), o.output);
+    } catch (const std::exception& e) {
+      err << "quillane-cli: cannot write " << o.output << ": " << e.what() << "\n";
+      return kExitFailed;
+    }
+  } catch (const std::bad_alloc&) {
+    err << "quillane-cli: " << o.effect->cliName << ": " << name << " "
+        << MemoryNeedText(OperationBytes(width, height)) << "\n";
     return kExitFailed;
   }
   out << o.output << "\n";
@@ -280,17 +253,13 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
 
 std::optional<TBitmap32> LoadInputPicture(const std::string& path, std::string& error,
                                           std::ostream& notices) {
-  std::error_code ec;
-  if (!fs::is_regular_file(path, ec)) {
-    error = fs::exists(path, ec) ? path + " is not a file" : path + ": no such file";
-    return std::nullopt;
-  }
   try {
-    if (EndsWithPng(path)) return LoadPng(path, error);
     std::optional<TBitmap32> picture =
-        LoadPictureFile(path, [&](const std::string& caption, const std::string& text) {
-          notices << caption << ": " << text << "\n";
-        });
+        AsciiLower(fs::path(path).extension().string()) == ".png"
+            ? LoadPng(path)
+            : LoadPictureFile(path, [&](const std::string& caption, const std::string& text) {
+                notices << caption << ": " << text << "\n";
+              });
     if (!picture) {
       error = path + ": no such file";
       return std::nullopt;

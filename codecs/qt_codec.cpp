@@ -23,6 +23,8 @@ const char* FormatName(QtFormat format) {
       return "ico";
     case QtFormat::kGif:
       return "gif";
+    case QtFormat::kPng:
+      return "png";
   }
   return "";
 }
@@ -35,6 +37,8 @@ const char* FamilyName(QtFormat format) {
       return "icon";
     case QtFormat::kGif:
       return "GIF";
+    case QtFormat::kPng:
+      return "PNG";
   }
   return "";
 }
@@ -93,6 +97,28 @@ int ChooseIconEntry(QImageReader& reader) {
   }
   return best;
 }
+
+// Qt's readers report some damage only as warnings ("libpng error: IDAT: CRC error"); while a
+// picture is read they are kept for its error message instead of going to the terminal.
+class WarningsCaught {
+ public:
+  WarningsCaught() : previous_(qInstallMessageHandler(Catch)) { Text().clear(); }
+  ~WarningsCaught() { qInstallMessageHandler(previous_); }
+  WarningsCaught(const WarningsCaught&) = delete;
+  WarningsCaught& operator=(const WarningsCaught&) = delete;
+  static std::string& Text() {
+    static thread_local std::string text;
+    return text;
+  }
+
+ private:
+  static void Catch(QtMsgType, const QMessageLogContext&, const QString& message) {
+    std::string& text = Text();
+    if (!text.empty()) text += "; ";
+    text += message.toStdString();
+  }
+  QtMessageHandler previous_;
+};
 
 std::uint8_t OverWhite(unsigned channel, unsigned alpha) {
   // 255 is odd, so adding 127 before dividing rounds to nearest without ties.
@@ -154,11 +180,48 @@ void CheckBitmapHeaders(Bytes data, std::int64_t maxPixels) {
   }
 }
 
-// A GIF is rendered on its logical screen, whatever the size of its first frame.
-void CheckGifScreen(Bytes data, std::int64_t maxPixels) {
-  if (data.size() < 10) throw PictureFileError("The file is not a valid GIF picture");
-  const std::int64_t width = Little(data, 6, 2), height = Little(data, 8, 2);
-  if (width > 0 && height > 0) CheckPictureSize(width, height, maxPixels, "GIF");
+// Qt renders a GIF's first frame on the whole logical screen that the header declares, so a
+// 27 KB file claiming a 16000 by 16000 screen would take gigabytes. The screen is cut back to
+// the right and bottom edges of the first frame (what lies beyond them is only background), in
+// a copy handed to the reader. Headers that no encoder writes are refused on the way: another
+// signature, or an LZW code size above 8 bits, which Qt would quietly render as white.
+std::vector<std::uint8_t> GifWithFittedScreen(Bytes data, std::int64_t maxPixels) {
+  const auto bad = [](const char* why) {
+    return PictureFileError(std::string("The file is not a valid GIF picture (") + why + ")");
+  };
+  if (data.size() < 13) throw bad("it ends inside its header");
+  if (!std::equal(data.begin(), data.begin() + 6, "GIF87a") &&
+      !std::equal(data.begin(), data.begin() + 6, "GIF89a"))
+    throw bad("its signature is neither GIF87a nor GIF89a");
+  const auto table = [](std::uint8_t flags) {
+    return flags & 0x80 ? std::size_t{3} << ((flags & 7) + 1) : 0;
+  };
+  std::size_t at = 13 + table(data[10]);
+  while (true) {
+    if (at >= data.size()) throw bad("it holds no picture");
+    if (data[at] == 0x21) {  // extension: label, then sub-blocks up to an empty one
+      at += 2;
+      while (at < data.size() && data[at] != 0) at += std::size_t{data[at]} + 1;
+      ++at;
+      continue;
+    }
+    if (data[at] != 0x2C) throw bad("it holds no picture");
+    if (data.size() < at + 11) throw bad("it ends inside a frame header");
+    const std::size_t codeSizeAt = at + 10 + table(data[at + 9]);
+    if (codeSizeAt >= data.size()) throw bad("it ends inside a frame header");
+    if (data[codeSizeAt] > 8) throw bad("its LZW code size is above 8 bits");
+    const std::int64_t right = std::int64_t{Little(data, at + 1, 2)} + Little(data, at + 5, 2);
+    const std::int64_t bottom = std::int64_t{Little(data, at + 3, 2)} + Little(data, at + 7, 2);
+    const std::int64_t width = std::min<std::int64_t>(Little(data, 6, 2), right);
+    const std::int64_t height = std::min<std::int64_t>(Little(data, 8, 2), bottom);
+    constexpr int kReaderBytesPerPixel = 8;
+    CheckPictureSize(width, height, maxPixels, "GIF", kReaderBytesPerPixel);
+    std::vector<std::uint8_t> fitted(data.begin(), data.end());
+    std::uint8_t* size = fitted.data() + 6;
+    Put16(size, static_cast<std::uint16_t>(width));
+    Put16(size, static_cast<std::uint16_t>(height));
+    return fitted;
+  }
 }
 
 }  // namespace
@@ -169,6 +232,11 @@ TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
   if (data.empty()) throw PictureFileError(std::string("The ") + family + " file is empty");
   if (data.size() > static_cast<std::size_t>(std::numeric_limits<int>::max())) {
     throw PictureFileError(std::string("The ") + family + " file is too large");
+  }
+  std::vector<std::uint8_t> fittedGif;
+  if (format == QtFormat::kGif) {
+    fittedGif = GifWithFittedScreen(data, maxPixels);
+    data = fittedGif;
   }
   // The reader only looks at the bytes; no copy is made.
   const QByteArray bytes = QByteArray::fromRawData(reinterpret_cast<const char*>(data.data()),
@@ -181,7 +249,6 @@ TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
   reader.setDecideFormatFromContent(false);
   reader.setAutoTransform(false);
   if (format == QtFormat::kBitmap) CheckBitmapHeaders(data, maxPixels);
-  if (format == QtFormat::kGif) CheckGifScreen(data, maxPixels);
   if (!reader.canRead()) {
     throw PictureFileError(std::string("The file is not a valid ") + family + " picture");
   }
@@ -192,15 +259,17 @@ TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
     }
   }
   const QSize size = reader.size();
-  if (size.width() <= 0 || size.height() == 0) {
-    throw PictureFileError(std::string("The ") + family + " picture has no valid size");
-  }
-  CheckPictureSize(size.width(), std::abs(std::int64_t{size.height()}), maxPixels, family);
+  // The reader's QImage and, for the formats it does not give in 32 bits, a converted copy.
+  constexpr int kReaderBytesPerPixel = 8;
+  CheckPictureSize(size.width(), std::abs(std::int64_t{size.height()}), maxPixels, family,
+                   kReaderBytesPerPixel);
 
   QImage image;
+  WarningsCaught warnings;
   if (!reader.read(&image) || image.isNull()) {
-    throw PictureFileError(std::string("Cannot read the ") + family +
-                           " picture: " + reader.errorString().toStdString());
+    std::string reason = reader.errorString().toStdString();
+    if (!WarningsCaught::Text().empty()) reason += " (" + WarningsCaught::Text() + ")";
+    throw PictureFileError(std::string("Cannot read the ") + family + " picture: " + reason);
   }
   CheckPictureSize(image.width(), image.height(), maxPixels, family);
   if (image.format() != QImage::Format_ARGB32) {
@@ -212,8 +281,12 @@ TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
   for (int y = 0; y < image.height(); ++y) {
     std::memcpy(result.ScanLine(y), image.constScanLine(y), rowBytes);
   }
-  if (format != QtFormat::kBitmap) CompositeOverWhite(result);
+  if (format == QtFormat::kIcon || format == QtFormat::kGif) CompositeOverWhite(result);
   return result;
+}
+
+TBitmap32 DecodePng(Bytes data, std::int64_t maxPixels) {
+  return DecodeWithQt(data, QtFormat::kPng, maxPixels);
 }
 
 std::vector<std::uint8_t> EncodePng(const TBitmap32& picture) {

@@ -37,8 +37,8 @@ class CliRun : public ::testing::Test {
 
   // Runs quillane-cli with arguments (already quoted as the shell needs); its exit code, with
   // out_ and err_ holding what it printed.
-  int Run(const std::string& arguments) {
-    const std::string command = std::string("'") + QUILLANE_CLI_PATH + "' " + arguments + " >'" +
+  int Run(const std::string& arguments, const std::string& shellPrefix = "") {
+    const std::string command = shellPrefix + "'" + QUILLANE_CLI_PATH + "' " + arguments + " >'" +
                                 Path("stdout.txt") + "' 2>'" + Path("stderr.txt") + "'";
     const int status = std::system(command.c_str());
     out_ = ReadText(Path("stdout.txt"));
@@ -149,6 +149,31 @@ TEST_F(CliRun, UnreadableInputExitsWithOneAndWritesNothing) {
     EXPECT_NE(err_.find(Path(name)), std::string::npos) << err_;
   }
   EXPECT_FALSE(fs::exists(Path("o.png")));
+}
+
+// Running out of memory ended in std::terminate, and a batch died without its summary.
+TEST_F(CliRun, PictureTooLargeForTheMemoryLimitIsAMessageAndTheBatchGoesOn) {
+#if defined(__SANITIZE_ADDRESS__)
+  GTEST_SKIP() << "no address-space limit under ASan";
+#endif
+  fs::create_directory(Path("in"));
+  SaveJpeg(Picture(20, 15), Path("in/a.jpg"));
+  // 7000 x 7000 pixels announced by a small file's header.
+  std::string big = ReadText(Path("in/a.jpg"));
+  const std::size_t frame = big.find("\xFF\xC0");
+  ASSERT_NE(frame, std::string::npos);
+  big.replace(frame + 5, 4, "\x1B\x58\x1B\x58");
+  std::ofstream(Path("in/big.jpg"), std::ios::binary) << big;
+  const std::string limit = "ulimit -v 600000; ";
+  EXPECT_EQ(
+      Run("apply pencil-sketch '" + Path("in/big.jpg") + "' -o '" + Path("o.png") + "'", limit), 1);
+  EXPECT_NE(err_.find(Path("in/big.jpg")), std::string::npos) << err_;
+  EXPECT_NE(err_.find("7000 by 7000 pixels needs 748 MB; "), std::string::npos) << err_;
+  EXPECT_EQ(
+      Run("batch pencil-sketch --input '" + Path("in") + "' --output '" + Path("out") + "'", limit),
+      1);
+  EXPECT_NE(out_.find("Converted 1 of 2 pictures"), std::string::npos) << out_;
+  EXPECT_NE(err_.find("big.jpg: "), std::string::npos) << err_;
 }
 
 TEST_F(CliRun, ListShowsEveryEffectWithRangesAndDefaults) {

@@ -208,6 +208,46 @@ TEST(JpegDecoder, RefusesHeadersBeyondTheLimitOrEmpty) {
   EXPECT_EQ(DecodeJpeg(file, 256).Width(), 16);
 }
 
+// A 38 KB file announcing 16000 x 16000 pixels once took gigabytes and half a minute, and a
+// scan broken off by a marker was filled with gray.
+TEST(JpegDecoder, ShortOrBrokenEntropyDataIsRefusedAsDamaged) {
+  const auto rgb = [](int x, int y, int c) { return (x * 7 + y * 3 + c * 50) & 255; };
+  const std::vector<std::uint8_t> file = WriteJpeg(64, 64, {}, rgb);
+  std::vector<std::uint8_t> broken(file.begin(), file.begin() + file.size() / 2);
+  broken.insert(broken.end(), {0xFF, 0xD9});
+  const std::pair<std::vector<std::uint8_t>, const char*> cases[] = {
+      {WithFrameSize(file, 6000, 6000), "cannot hold a picture of 6000 by 6000"},
+      {WithFrameSize(WriteJpeg(64, 64, {.progressive = true}, rgb), 6000, 6000), "cannot hold"},
+      {broken, "damaged (corrupt data)"}};
+  for (const auto& [bytes, reason] : cases) {
+    try {
+      DecodeJpeg(bytes);
+      ADD_FAILURE() << reason;
+    } catch (const PictureFileError& error) {
+      EXPECT_NE(std::string(error.what()).find(reason), std::string::npos) << error.what();
+    }
+  }
+}
+
+// Running out of memory ended the program; now the header is checked against what is left.
+TEST(JpegDecoder, PictureBeyondTheAvailableMemorySaysWhatItNeeds) {
+  QUILLANE_SKIP_UNDER_ADDRESS_LIMIT();
+  const auto big =
+      WithFrameSize(WriteJpeg(16, 16, {}, [](int, int, int) { return 9; }), 7000, 7000);
+  EXPECT_EXIT(
+      {
+        LimitAddressSpaceGrowth(std::uint64_t{300} << 20);
+        try {
+          DecodeJpeg(big);
+        } catch (const PictureFileError& error) {
+          std::fputs(error.what(), stderr);
+          std::_Exit(1);
+        }
+        std::_Exit(0);
+      },
+      ::testing::ExitedWithCode(1), "7000 by 7000 pixels needs 748 MB; [0-9]+ MB are available");
+}
+
 TEST(JpegDecoder, BitFlippedFilesNeverCrash) {
   const auto rgb = [](int x, int y, int c) { return (x * 5 + y * 11 + c * 70) & 255; };
   for (const JpegOptions& options : {JpegOptions{}, JpegOptions{.progressive = true}}) {

@@ -1,6 +1,8 @@
 // The loader's choice by name, the writers' round trips and their behaviour on failure.
 #include "codecs/picture_file.h"
 
+#include <sys/stat.h>
+
 #include <QImage>
 #include <filesystem>
 
@@ -30,10 +32,21 @@ TEST_F(PictureFiles, ChoosesTheDecoderByTheLastFourCharacters) {
   SavePng(picture, Path("picture.png"));
   ASSERT_TRUE(LoadPictureFile(Path("picture.png")).has_value());
   EXPECT_TRUE(LoadPictureFile(Path("picture.png"))->Empty());
-  // No file (or a folder) gives nothing at all.
   EXPECT_FALSE(LoadPictureFile(Path("missing.jpg")).has_value());
+}
+
+// A FIFO put where a picture was expected once blocked the loader for good.
+TEST_F(PictureFiles, FoldersAndFifosAreNotPictureFilesAndNeverBlock) {
   std::filesystem::create_directory(Path("folder.bmp"));
-  EXPECT_FALSE(LoadPictureFile(Path("folder.bmp")).has_value());
+  ASSERT_EQ(::mkfifo(Path("fifo.jpg").c_str(), 0600), 0);
+  for (const char* name : {"folder.bmp", "fifo.jpg"}) {
+    try {
+      LoadPictureFile(Path(name));
+      ADD_FAILURE() << name;
+    } catch (const PictureFileError& error) {
+      EXPECT_EQ(error.what(), Path(name) + " is not a picture file");
+    }
+  }
 }
 
 TEST_F(PictureFiles, ContentUnderAWrongNameIsAnErrorNamingTheFile) {
@@ -47,6 +60,7 @@ TEST_F(PictureFiles, ContentUnderAWrongNameIsAnErrorNamingTheFile) {
       ADD_FAILURE() << name;
     } catch (const PictureFileError& error) {
       EXPECT_NE(std::string(error.what()).find(Path(name)), std::string::npos) << error.what();
+      EXPECT_NE(std::string(error.what()).find("holds a PNG picture"), std::string::npos);
     }
   }
 }

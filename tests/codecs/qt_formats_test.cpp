@@ -212,10 +212,11 @@ TEST(GifDecoder, ReadsPlainAndInterlacedFirstFrames) {
 }
 
 TEST(GifDecoder, TransparentPixelsAndUncoveredScreenBecomeWhite) {
-  // A 4 x 3 screen; a 2 x 2 frame at (1, 1) whose index 3 is transparent.
+  // A 4 x 3 screen, cut to the frame's right and bottom edges; a 2 x 2 frame at (1, 1) whose
+  // index 3 is transparent.
   const TBitmap32 p =
       DecodeWithQt(GifFile(4, 3, 1, 1, 2, 2, kGifPalette, {0, 3, 1, 2}, 3, false), QtFormat::kGif);
-  ASSERT_EQ(p.Width(), 4);
+  ASSERT_EQ(p.Width(), 3);
   ASSERT_EQ(p.Height(), 3);
   EXPECT_EQ(p.At(1, 1), kRed);
   EXPECT_EQ(p.At(1, 2), kGreen);
@@ -225,30 +226,43 @@ TEST(GifDecoder, TransparentPixelsAndUncoveredScreenBecomeWhite) {
 }
 
 // Qt's reader refuses images above its own process-wide allocation limit (128 MB by default);
-// a 50-megapixel GIF screen needs 203 MB in 32 bits and must open like any photo.
-TEST(GifDecoder, FiftyMegapixelScreenOpens) {
-  const TBitmap32 p =
-      DecodeWithQt(GifFile(8200, 6200, 0, 0, 1, 1, kGifPalette, {1}, -1, false), QtFormat::kGif);
+// a 50-megapixel GIF needs 203 MB in 32 bits and must open like any photo.
+TEST(GifDecoder, FiftyMegapixelPictureOpens) {
+  const TBitmap32 p = DecodeWithQt(
+      GifFile(8200, 6200, 8199, 6199, 1, 1, kGifPalette, {1}, -1, false), QtFormat::kGif);
   EXPECT_EQ(p.Width(), 8200);
   EXPECT_EQ(p.Height(), 6200);
-  EXPECT_EQ(p.At(0, 0), kGreen);
+  EXPECT_EQ(p.At(8199, 6199), kGreen);
 }
 
-TEST(GifDecoder, RefusesHugeScreensAndDamage) {
-  try {
-    DecodeWithQt(GifFile(65535, 65535, 0, 0, 1, 1, kGifPalette, {1}, -1, false), QtFormat::kGif);
-    FAIL();
-  } catch (const PictureFileError& error) {
-    EXPECT_NE(std::string(error.what()).find("65535 by 65535"), std::string::npos) << error.what();
-  }
-  const std::vector<std::uint8_t> file =
+// A 27 KB file whose screen is 16000 x 16000 once took gigabytes.
+TEST(GifDecoder, ScreenLargerThanTheFrameIsNotAllocated) {
+  const TBitmap32 p =
+      DecodeWithQt(GifFile(16000, 16000, 0, 0, 1, 1, kGifPalette, {1}, -1, false), QtFormat::kGif);
+  EXPECT_EQ(p.Width(), 1);
+  EXPECT_EQ(p.Height(), 1);
+}
+
+// Another signature and LZW codes above 8 bits once loaded (one as an all-white picture).
+TEST(GifDecoder, RefusesHugeFramesForeignSignaturesWideCodesAndDamage) {
+  const std::vector<std::uint8_t> good =
       GifFile(3, 3, 0, 0, 3, 3, kGifPalette, std::vector<std::uint8_t>(9, 1), -1, false);
-  EXPECT_THROW(
-      DecodeWithQt(std::vector<std::uint8_t>(file.begin(), file.begin() + 10), QtFormat::kGif),
-      PictureFileError);
-  EXPECT_THROW(DecodeWithQt(std::vector<std::uint8_t>{'G', 'I', 'F', '8', '9', 'a', 0, 0, 0, 0},
-                            QtFormat::kGif),
-               PictureFileError);
+  std::vector<std::uint8_t> foreign = good, wide = good;
+  foreign[4] = '8';  // GIF88a
+  wide[35] = 9;      // the code size byte after the 4-colour table and the frame header
+  const std::pair<std::vector<std::uint8_t>, const char*> cases[] = {
+      {GifFile(65535, 65535, 65534, 65534, 1, 1, kGifPalette, {1}, -1, false), "65535 by 65535"},
+      {foreign, "neither GIF87a nor GIF89a"},
+      {wide, "above 8 bits"},
+      {std::vector<std::uint8_t>(good.begin(), good.begin() + 10), "inside its header"}};
+  for (const auto& [bytes, reason] : cases) {
+    try {
+      DecodeWithQt(bytes, QtFormat::kGif);
+      ADD_FAILURE() << reason;
+    } catch (const PictureFileError& error) {
+      EXPECT_NE(std::string(error.what()).find(reason), std::string::npos) << error.what();
+    }
+  }
 }
 
 }  // namespace
