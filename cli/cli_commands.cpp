@@ -17,13 +17,40 @@ namespace fs = std::filesystem;
 
 namespace {
 
+// text as it may go to a terminal: control characters and bytes that are not UTF-8 (a file name
+// is any bytes) written as \xHH, so a name can neither move the cursor nor garble the line.
+std::string Shown(const std::string& text) {
+  std::string shown;
+  for (std::size_t i = 0; i < text.size();) {
+    const auto c = static_cast<unsigned char>(text[i]);
+    // The length of a well-formed UTF-8 sequence starting here, or 0.
+    std::size_t length = c < 0x80                ? 1
+                         : c >= 0xC2 && c < 0xE0 ? 2
+                         : c >= 0xE0 && c < 0xF0 ? 3
+                         : c >= 0xF0 && c < 0xF5 ? 4
+                                                 : 0;
+    for (std::size_t k = 1; k < length; ++k)
+      if (i + k >= text.size() || (static_cast<unsigned char>(text[i + k]) & 0xC0) != 0x80)
+        length = 0;
+    if (length == 0 || c < 0x20 || c == 0x7F) {
+      static const char kHex[] = "0123456789abcdef";
+      shown += {'\\', 'x', kHex[c >> 4], kHex[c & 15]};
+      ++i;
+    } else {
+      shown.append(text, i, length);
+      i += length;
+    }
+  }
+  return shown;
+}
+
 // The picture named by --input or INPUT, or the built-in one when none is named; nothing (with
 // the reason told on err) when it cannot be read.
 std::optional<TBitmap32> InputOrBuiltInPicture(const Options& o, std::ostream& err) {
   if (o.input.empty()) return StartupPicture();
   std::string error;
   std::optional<TBitmap32> loaded = LoadInputPicture(o.input, error, err);
-  if (!loaded) err << "quillane-cli: " << error << "\n";
+  if (!loaded) err << "quillane-cli: " << Shown(error) << "\n";
   return loaded;
 }
 
@@ -40,21 +67,21 @@ int ApplyCommand(const Options& o, std::ostream& out, std::ostream& err) {
     } catch (const std::bad_alloc&) {
       throw;
     } catch (const std::exception& e) {
-      err << "quillane-cli: " << o.effect->cliName << ": " << e.what() << "\n";
+      err << "quillane-cli: " << o.effect->cliName << ": " << Shown(e.what()) << "\n";
       return kExitFailed;
     }
     try {
       SaveOutputPicture(document.Working(), o.output);
     } catch (const std::exception& e) {
-      err << "quillane-cli: cannot write " << o.output << ": " << e.what() << "\n";
+      err << "quillane-cli: cannot write " << Shown(o.output) << ": " << Shown(e.what()) << "\n";
       return kExitFailed;
     }
   } catch (const std::bad_alloc&) {
-    err << "quillane-cli: " << o.effect->cliName << ": " << name << " "
+    err << "quillane-cli: " << o.effect->cliName << ": " << Shown(name) << " "
         << MemoryNeedText(OperationBytes(width, height)) << "\n";
     return kExitFailed;
   }
-  out << o.output << "\n";
+  out << Shown(o.output) << "\n";
   return kExitOk;
 }
 
@@ -69,13 +96,13 @@ class ProgressBar {
     const int filled = count > 0 ? (index - 1) * kWidth / count : 0;
     err_ << "\r[" << std::string(static_cast<std::size_t>(filled), '#')
          << std::string(static_cast<std::size_t>(kWidth - filled), '.') << "] " << index << "/"
-         << count << " " << name << "\x1b[K" << std::flush;
+         << count << " " << Shown(name) << "\x1b[K" << std::flush;
     drawn_ = true;
   }
   // A line of its own above the bar.
   void Print(const std::string& line) {
     if (drawn_) err_ << "\r\x1b[K";
-    err_ << line << "\n" << std::flush;
+    err_ << Shown(line) << "\n" << std::flush;
     drawn_ = false;
   }
   void Finish() {
@@ -120,17 +147,21 @@ int BatchCommand(const Options& o, std::ostream& out, std::ostream& err, bool te
 
   if (result.end == BatchResult::End::Refused) return kExitFailed;
   const std::size_t listed = job.files.size();
-  if (result.end == BatchResult::End::Stopped) err << "quillane-cli: " << result.error << "\n";
+  if (result.end == BatchResult::End::Stopped)
+    err << "quillane-cli: " << Shown(result.error) << "\n";
   out << "Converted " << result.outputs.size() << " of " << listed
-      << (listed == 1 ? " picture" : " pictures") << " into " << TrimBlanks(o.output) << "\n";
+      << (listed == 1 ? " picture" : " pictures") << " into " << Shown(TrimBlanks(o.output))
+      << "\n";
   if (!result.skipped.empty()) {
     err << "Skipped " << result.skipped.size()
         << (result.skipped.size() == 1 ? " picture:\n" : " pictures:\n");
-    for (const BatchSkipped& s : result.skipped) err << "  " << s.name << ": " << s.reason << "\n";
+    for (const BatchSkipped& s : result.skipped)
+      err << "  " << Shown(s.name) << ": " << Shown(s.reason) << "\n";
   }
   if (result.end == BatchResult::End::Stopped) {
-    err << "Stopped before the end; " << (listed - result.outputs.size() - result.skipped.size())
-        << " pictures were not converted.\n";
+    const std::size_t left = listed - result.outputs.size() - result.skipped.size();
+    err << "Stopped before the end; " << left
+        << (left == 1 ? " picture was not converted.\n" : " pictures were not converted.\n");
     return kExitFailed;
   }
   if (!result.AllConverted()) return kExitFailed;

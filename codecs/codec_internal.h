@@ -48,7 +48,6 @@ enum class QtFormat {
   kBitmap,  // every BMP depth, RLE4/RLE8, bit fields, top-down and bottom-up, v3 to v5 headers
   kIcon,    // the entry with the most pixels, and of those the deepest, is taken
   kGif,     // the first frame, on a screen no larger than the frames need (see qt_codec.cpp)
-  kPng,     // alpha kept as stored, not composited
 };
 // For icons and GIFs, transparent and partly transparent pixels are composited over white (the
 // background a freshly made bitmap shows); the alpha bytes are returned as the decoder gives
@@ -101,7 +100,8 @@ std::vector<std::uint8_t> ReadWholeFile(const std::string& path);
 void CheckPictureSize(std::int64_t width, std::int64_t height, std::int64_t maxPixels,
                       const char* what, int extraBytesPerPixel = 0);
 
-// PNG through Qt's reader, alpha kept as stored.
+// PNG through libpng's simplified reader, alpha kept as stored (not premultiplied). libpng's
+// complaints become the error message; none goes to the terminal.
 TBitmap32 DecodePng(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels);
 
 // The family a file's first bytes belong to ("JPEG", "PNG", "GIF", "bitmap", "icon",

@@ -23,8 +23,6 @@ const char* FormatName(QtFormat format) {
       return "ico";
     case QtFormat::kGif:
       return "gif";
-    case QtFormat::kPng:
-      return "png";
   }
   return "";
 }
@@ -37,8 +35,6 @@ const char* FamilyName(QtFormat format) {
       return "icon";
     case QtFormat::kGif:
       return "GIF";
-    case QtFormat::kPng:
-      return "PNG";
   }
   return "";
 }
@@ -97,28 +93,6 @@ int ChooseIconEntry(QImageReader& reader) {
   }
   return best;
 }
-
-// Qt's readers report some damage only as warnings ("libpng error: IDAT: CRC error"); while a
-// picture is read they are kept for its error message instead of going to the terminal.
-class WarningsCaught {
- public:
-  WarningsCaught() : previous_(qInstallMessageHandler(Catch)) { Text().clear(); }
-  ~WarningsCaught() { qInstallMessageHandler(previous_); }
-  WarningsCaught(const WarningsCaught&) = delete;
-  WarningsCaught& operator=(const WarningsCaught&) = delete;
-  static std::string& Text() {
-    static thread_local std::string text;
-    return text;
-  }
-
- private:
-  static void Catch(QtMsgType, const QMessageLogContext&, const QString& message) {
-    std::string& text = Text();
-    if (!text.empty()) text += "; ";
-    text += message.toStdString();
-  }
-  QtMessageHandler previous_;
-};
 
 std::uint8_t OverWhite(unsigned channel, unsigned alpha) {
   // 255 is odd, so adding 127 before dividing rounds to nearest without ties.
@@ -265,11 +239,9 @@ TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
                    kReaderBytesPerPixel);
 
   QImage image;
-  WarningsCaught warnings;
   if (!reader.read(&image) || image.isNull()) {
-    std::string reason = reader.errorString().toStdString();
-    if (!WarningsCaught::Text().empty()) reason += " (" + WarningsCaught::Text() + ")";
-    throw PictureFileError(std::string("Cannot read the ") + family + " picture: " + reason);
+    throw PictureFileError(std::string("Cannot read the ") + family +
+                           " picture: " + reader.errorString().toStdString());
   }
   CheckPictureSize(image.width(), image.height(), maxPixels, family);
   if (image.format() != QImage::Format_ARGB32) {
@@ -281,12 +253,8 @@ TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
   for (int y = 0; y < image.height(); ++y) {
     std::memcpy(result.ScanLine(y), image.constScanLine(y), rowBytes);
   }
-  if (format == QtFormat::kIcon || format == QtFormat::kGif) CompositeOverWhite(result);
+  if (format != QtFormat::kBitmap) CompositeOverWhite(result);
   return result;
-}
-
-TBitmap32 DecodePng(Bytes data, std::int64_t maxPixels) {
-  return DecodeWithQt(data, QtFormat::kPng, maxPixels);
 }
 
 std::vector<std::uint8_t> EncodePng(const TBitmap32& picture) {

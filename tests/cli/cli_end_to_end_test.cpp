@@ -141,12 +141,17 @@ TEST_F(CliRun, BadParametersExitWithTwoAndNameTheRange) {
 
 TEST_F(CliRun, UnreadableInputExitsWithOneAndWritesNothing) {
   std::ofstream(Path("broken.jpg"), std::ios::binary) << "\xFF\xD8\xFF not really";
-  std::ofstream(Path("broken.png"), std::ios::binary) << "\x89PNG nothing";
+  // A true header, then image data that does not inflate: libpng printed its own line for it.
+  std::ofstream(Path("broken.png"), std::ios::binary) << std::string(
+      "\x89PNG\r\n\x1a\n\0\0\0\rIHDR\0\0\0\x10\0\0\0\x10\x08\x02\0\0\0\x90\x91h6"
+      "\0\0\0\x05IDATxxxxx\0\0\0\0",
+      46);
   std::ofstream(Path("picture.tga"), std::ios::binary) << "whatever";
   for (const char* name : {"broken.jpg", "broken.png", "picture.tga", "missing.bmp"}) {
     EXPECT_EQ(Run("apply pencil-sketch '" + Path(name) + "' -o '" + Path("o.png") + "'"), 1)
         << name;
     EXPECT_NE(err_.find(Path(name)), std::string::npos) << err_;
+    EXPECT_EQ(err_.find("libpng"), std::string::npos) << err_;
   }
   EXPECT_FALSE(fs::exists(Path("o.png")));
 }
@@ -242,10 +247,16 @@ TEST_F(CliRun, BatchConvertsTheFolderAndListsSkippedFiles) {
   EXPECT_EQ(ReadText(out + "/b-PencilSketch.jpg"), ReadText(Path("expected.jpg")));
   EXPECT_TRUE(fs::is_regular_file(out + "/a-PencilSketch.jpg"));
 
-  std::ofstream(Path("in/x.jpg"), std::ios::binary) << "not a picture";
+  // A name that is not UTF-8 and holds an escape sequence is shown escaped, never raw.
+  std::ofstream(Path("in/x\x1b[2J\xff.jpg"), std::ios::binary) << "not a picture";
   EXPECT_EQ(Run("batch pencil-sketch --input '" + Path("in") + "' --output '" + out + "'"), 1);
-  EXPECT_NE(err_.find("Skipped 1 picture:\n  x.jpg: "), std::string::npos) << err_;
-  EXPECT_FALSE(fs::exists(out + "/x-PencilSketch.jpg"));
+  EXPECT_NE(err_.find("Skipped 1 picture:\n  x\\x1b[2J\\xff.jpg: "), std::string::npos) << err_;
+  EXPECT_EQ(err_.find('\x1b'), std::string::npos);
+  fs::remove(out + "/b-PencilSketch.jpg");
+  fs::create_directory(out + "/b-PencilSketch.jpg");
+  EXPECT_EQ(Run("batch pencil-sketch --input '" + Path("in") + "' --output '" + out + "'"), 1);
+  EXPECT_NE(err_.find("Stopped before the end; 1 picture was not converted."), std::string::npos)
+      << err_;
 
   EXPECT_EQ(Run("batch pencil-sketch --input '" + Path("nowhere") + "' --output '" + out + "'"), 1);
   EXPECT_NE(err_.find("Sorry: Input Director in not exist."), std::string::npos) << err_;
