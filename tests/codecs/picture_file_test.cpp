@@ -1,7 +1,10 @@
 // The loader's choice by name, the writers' round trips and their behaviour on failure.
 #include "codecs/picture_file.h"
 
+#include <sys/resource.h>
 #include <sys/stat.h>
+#include <sys/wait.h>
+#include <unistd.h>
 
 #include <QImage>
 #include <filesystem>
@@ -167,6 +170,46 @@ TEST_F(PictureFiles, SaveIntoAMissingFolderFailsClearly) {
     EXPECT_NE(text.find("does not exist"), std::string::npos) << text;
   }
   EXPECT_TRUE(Entries().empty());
+}
+
+// Saving replaced the file by a new one at mode 0644, a link by a file, overwrote a read-only
+// file, and a save cut short by a crash left its ".name.tmp" behind.
+TEST_F(PictureFiles, SaveKeepsModeLinksAndReadOnlyFilesAndLeavesNoTemporaryFile) {
+  WriteBytes(Path("private.jpg"), {1});
+  ::chmod(Path("private.jpg").c_str(), 0640);
+  SaveJpeg(PatternPicture(8, 8), Path("private.jpg"));
+  struct stat info {};
+  ASSERT_EQ(::stat(Path("private.jpg").c_str(), &info), 0);
+  EXPECT_EQ(info.st_mode & 07777, 0640u);
+
+  std::filesystem::create_symlink("private.jpg", Path("link.jpg"));
+  SaveJpeg(PatternPicture(5, 5), Path("link.jpg"));
+  EXPECT_TRUE(std::filesystem::is_symlink(Path("link.jpg")));
+  EXPECT_EQ(LoadPictureFile(Path("private.jpg"))->Width(), 5);
+
+  WriteBytes(Path("locked.jpg"), {1});
+  ::chmod(Path("locked.jpg").c_str(), 0444);
+  try {
+    SaveJpeg(PatternPicture(8, 8), Path("locked.jpg"));
+    ADD_FAILURE();
+  } catch (const PictureFileError& error) {
+    EXPECT_NE(std::string(error.what()).find("read-only"), std::string::npos) << error.what();
+  }
+  EXPECT_EQ(ReadBytes(Path("locked.jpg")), std::vector<std::uint8_t>{1});
+
+  const pid_t child = ::fork();
+  if (child == 0) {  // killed by the file-size signal part way through writing
+    rlimit small{};
+    ::getrlimit(RLIMIT_FSIZE, &small);
+    small.rlim_cur = 4096;
+    ::setrlimit(RLIMIT_FSIZE, &small);
+    SaveBitmap24(PatternPicture(300, 300), Path("killed.bmp"));
+    ::_exit(0);
+  }
+  int status = 0;
+  ASSERT_EQ(::waitpid(child, &status, 0), child);
+  EXPECT_TRUE(WIFSIGNALED(status));
+  EXPECT_EQ(Entries(), (std::vector<std::string>{"link.jpg", "locked.jpg", "private.jpg"}));
 }
 
 TEST_F(PictureFiles, EmptyPictureIsNotSaved) {
