@@ -21,6 +21,17 @@ TEST(PictureDocument, StartsWithOnePictureEverywhere) {
   EXPECT_EQ(doc.CurrentSlot(), 1);
 }
 
+// A 24-megapixel picture was held four times over once opened; unchanged pictures now share.
+TEST(PictureDocument, UnchangedPicturesShareOneBuffer) {
+  PictureDocument d(TBitmap32(3, 2));
+  EXPECT_EQ(d.Working().Data(), d.Source().Data());
+  EXPECT_EQ(d.Opened().Data(), d.Slot(1).Data());
+  d.SetWorking(TBitmap32(3, 2, Pixel{1, 2, 3, 255}));
+  d.Backup();
+  EXPECT_EQ(d.Slot(d.CurrentSlot()).Data(), d.Working().Data());
+  EXPECT_NE(d.Working().Data(), d.Source().Data());
+}
+
 TEST(PictureDocument, TwentyFiveStepsKeepTwentyUndos) {
   PictureDocument doc(Flat(2, 2, 0));
   for (int i = 1; i <= 25; ++i) {
