@@ -220,7 +220,7 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
   std::error_code ec;
   fs::create_directories(o.output, ec);
   if (!fs::is_directory(o.output)) {
-    err << "quillane-cli: cannot create the folder " << o.output
+    err << "quillane-cli: cannot create the folder " << Shown(o.output)
         << (ec ? ": " + ec.message() : std::string()) << "\n";
     return kExitFailed;
   }
@@ -233,7 +233,8 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
       SavePng(p, (folder / file).string());
       return true;
     } catch (const std::exception& e) {
-      err << "quillane-cli: cannot write " << (folder / file).string() << ": " << e.what() << "\n";
+      err << "quillane-cli: cannot write " << Shown((folder / file).string()) << ": "
+          << Shown(e.what()) << "\n";
       status = kExitFailed;
       return false;
     }
@@ -257,8 +258,14 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
         const TBitmap32 result =
             effect.routine({document.Source(), document.Working(), effect.Defaults()});
         if (!write(result, file)) continue;
+      } catch (const std::bad_alloc&) {
+        err << "quillane-cli: " << effect.cliName << ": " << Shown(sourceName) << " "
+            << MemoryNeedText(OperationBytes(document.Source().Width(), document.Source().Height()))
+            << "\n";
+        status = kExitFailed;
+        continue;
       } catch (const std::exception& e) {
-        err << "quillane-cli: " << effect.cliName << ": " << e.what() << "\n";
+        err << "quillane-cli: " << effect.cliName << ": " << Shown(e.what()) << "\n";
         status = kExitFailed;
         continue;
       }
@@ -272,7 +279,7 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
   html << GalleryHtml(sourceName, {"Original", "original.png"}, menus, unavailable);
   html.close();
   if (!html) {
-    err << "quillane-cli: cannot write " << index << "\n";
+    err << "quillane-cli: cannot write " << Shown(index) << "\n";
     return kExitFailed;
   }
   out << "Wrote " << written << (written == 1 ? " effect" : " effects") << " and the original into "

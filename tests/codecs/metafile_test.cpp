@@ -57,6 +57,45 @@ TEST(WindowsMetafile, PlaysShapesOnWhite) {
   EXPECT_EQ(p.At(36, 27), kWhite);
 }
 
+// A metafile that only draws picture as one 24-bit bitmap at its own size, the window in units
+// of 1/unitsPerInch inch (1440: twips), with or without the placeable header.
+std::vector<std::uint8_t> WmfWithBitmap(const TBitmap32& picture, int unitsPerInch,
+                                        bool placeable) {
+  const int w = picture.Width() * unitsPerInch / 96, h = picture.Height() * unitsPerInch / 96;
+  codecs::MemorySink dib;
+  codecs::WriteDib24(picture, dib);
+  ByteWriter records;
+  records.U32(5).U16(0x020B).I16(0).I16(0);  // SetWindowOrg
+  records.U32(5).U16(0x020C).I16(h).I16(w);  // SetWindowExt
+  const auto words = static_cast<std::uint32_t>(14 + dib.bytes().size() / 2);
+  records.U32(words).U16(0x0F43).U32(0x00CC0020).U16(0);  // StretchDIB, SRCCOPY, RGB colours
+  for (int v : {picture.Height(), picture.Width(), 0, 0, h, w, 0, 0}) records.I16(v);
+  records.Append(dib.bytes()).U32(3).U16(0);  // EOF
+  ByteWriter file;
+  if (placeable) {
+    file.U32(0x9AC6CDD7).U16(0).I16(0).I16(0).I16(w).I16(h).U16(unitsPerInch).U32(0);
+    std::uint16_t checksum = 0;
+    for (std::size_t i = 0; i < 20; i += 2) checksum ^= file.bytes[i] | file.bytes[i + 1] << 8;
+    file.U16(checksum);
+  }
+  file.U16(1).U16(9).U16(0x0300).U32(static_cast<std::uint32_t>(9 + records.Size() / 2));
+  file.U16(0).U32(words).U16(0);
+  return file.Append(records.bytes).bytes;
+}
+
+// Such a file loaded as a blown-up top-left corner (placeable) or at 68 x 68 (not placeable).
+TEST(WindowsMetafile, BitmapDrawnAtItsOwnSizeGivesExactlyItsPixels) {
+  const TBitmap32 picture = PatternPicture(237, 158);
+  for (const int unitsPerInch : {96, 1440}) {
+    for (const bool placeable : {true, false}) {
+      const TBitmap32 p = DecodeMetafile(WmfWithBitmap(picture, unitsPerInch, placeable));
+      ASSERT_EQ(p.Width(), 237) << unitsPerInch << placeable;
+      ASSERT_EQ(p.Height(), 158) << unitsPerInch << placeable;
+      EXPECT_TRUE(SameColours(p, picture)) << unitsPerInch << placeable;
+    }
+  }
+}
+
 TEST(WindowsMetafile, RefusesDamagedAndHugeFiles) {
   const std::vector<std::uint8_t> file = WmfWithRectangle();
   // Cut inside the records: the record walk finds a record running past the end.
