@@ -3,7 +3,6 @@
 #include <stdlib.h>
 #include <sys/wait.h>
 
-#include <QImage>
 #include <filesystem>
 #include <fstream>
 #include <iterator>
@@ -62,16 +61,7 @@ TBitmap32 Picture(int width, int height) {
 }
 
 TBitmap32 FromPng(const std::string& path) {
-  QImage image(QString::fromStdString(path), "png");
-  image = image.convertToFormat(QImage::Format_ARGB32);
-  TBitmap32 p(image.width(), image.height());
-  for (int y = 0; y < image.height(); ++y)
-    for (int x = 0; x < image.width(); ++x) {
-      const QRgb c = image.pixel(x, y);
-      p.At(x, y) = Pixel{static_cast<std::uint8_t>(qBlue(c)), static_cast<std::uint8_t>(qGreen(c)),
-                         static_cast<std::uint8_t>(qRed(c)), static_cast<std::uint8_t>(qAlpha(c))};
-    }
-  return p;
+  return LoadPng(path).value_or(TBitmap32());
 }
 
 TBitmap32 Pencil(TBitmap32 picture, PencilToneMode mode, int contrast, int lighting) {
