@@ -8,7 +8,6 @@
 #include <cstdlib>
 #include <cstring>
 #include <limits>
-#include <mutex>
 
 #include "codecs/codec_internal.h"
 
@@ -40,14 +39,12 @@ const char* FamilyName(QtFormat format) {
 }
 
 // Qt refuses decoded images above a process-wide limit (128 MB by default, less than a
-// 50-megapixel photo in 32 bits). Our own limit is checked from the header before reading, so
-// Qt's is raised to exactly what the largest accepted picture needs in 32 bits.
-void RaiseQtAllocationLimit() {
-  static std::once_flag once;
-  std::call_once(once, [] {
-    constexpr std::int64_t kMegabyte = 1024 * 1024;
-    QImageReader::setAllocationLimit(static_cast<int>(TBitmap32::kMaxPixels * 4 / kMegabyte + 1));
-  });
+// 50-megapixel photo in 32 bits). It is set for each picture to what the size checked from its
+// header needs in 32 bits, so that content asking Qt for more than the header said is refused
+// rather than allowed up to the largest picture the program accepts.
+void LimitQtAllocation(std::int64_t pixels) {
+  constexpr std::int64_t kMegabyte = 1024 * 1024;
+  QImageReader::setAllocationLimit(static_cast<int>(pixels * 4 / kMegabyte + 1));
 }
 
 int BitDepth(QImage::Format format) {
@@ -70,6 +67,15 @@ int BitDepth(QImage::Format format) {
       return 0;
     default:
       return 32;
+  }
+}
+
+// A directory of more entries than the file holds would have Qt look at (and warn about) each of
+// up to 65535 made-up entries, tens of milliseconds a file (found by fuzzing).
+void CheckIconDirectory(Bytes data) {
+  if (data.size() < 6 ||
+      6 + 16 * (std::size_t{data[4]} | std::size_t{data[5]} << 8) > data.size()) {
+    throw PictureFileError("The file is not a valid icon picture (its directory is cut short)");
   }
 }
 
@@ -201,7 +207,6 @@ std::vector<std::uint8_t> GifWithFittedScreen(Bytes data, std::int64_t maxPixels
 }  // namespace
 
 TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
-  RaiseQtAllocationLimit();
   const char* family = FamilyName(format);
   if (data.empty()) throw PictureFileError(std::string("The ") + family + " file is empty");
   if (data.size() > static_cast<std::size_t>(std::numeric_limits<int>::max())) {
@@ -227,6 +232,7 @@ TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
     throw PictureFileError(std::string("The file is not a valid ") + family + " picture");
   }
   if (format == QtFormat::kIcon) {
+    CheckIconDirectory(data);
     const int entry = ChooseIconEntry(reader);
     if (entry < 0 || !reader.jumpToImage(entry)) {
       throw PictureFileError("The icon file holds no readable picture");
@@ -235,8 +241,9 @@ TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
   const QSize size = reader.size();
   // The reader's QImage and, for the formats it does not give in 32 bits, a converted copy.
   constexpr int kReaderBytesPerPixel = 8;
-  CheckPictureSize(size.width(), std::abs(std::int64_t{size.height()}), maxPixels, family,
-                   kReaderBytesPerPixel);
+  const std::int64_t height = std::abs(std::int64_t{size.height()});
+  CheckPictureSize(size.width(), height, maxPixels, family, kReaderBytesPerPixel);
+  LimitQtAllocation(size.width() * height);
 
   QImage image;
   if (!reader.read(&image) || image.isNull()) {

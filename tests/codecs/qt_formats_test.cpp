@@ -175,6 +175,11 @@ TEST(IconDecoder, RefusesDamagedFiles) {
   EXPECT_THROW(DecodeWithQt(cut, QtFormat::kIcon), PictureFileError);
   EXPECT_THROW(DecodeWithQt(std::vector<std::uint8_t>{0, 0, 1, 0, 0, 0}, QtFormat::kIcon),
                PictureFileError);
+  // Found by fuzzing: a directory of 65535 entries in a file of one; Qt looked at (and warned
+  // about) each, some tens of milliseconds an icon.
+  std::vector<std::uint8_t> many = file;
+  many[4] = many[5] = 0xFF;
+  EXPECT_THROW(DecodeWithQt(many, QtFormat::kIcon), PictureFileError);
 }
 
 const std::vector<std::uint8_t> kGifPalette = {255, 0, 0, 0, 255, 0, 0, 0, 255, 0, 0, 0};
