@@ -12,9 +12,10 @@ namespace {
 
 using codecs::DecodeMetafile;
 
-// A placeable metafile of 40 x 30 units at 96 units an inch, white, with a red rectangle
-// from (10, 5) to (30, 25) drawn with a null pen.
-std::vector<std::uint8_t> WmfWithRectangle() {
+// A placeable metafile of 40 x 30 pixels, in units of 1/96 inch or (k = 15) twips: white, a red
+// rectangle from (10, 5) to (30, 25) drawn with a null pen, and a blue line along row 2 from
+// column 2 to 37.
+std::vector<std::uint8_t> WmfWithRectangle(int k = 1) {
   ByteWriter records;
   std::uint32_t largest = 0;
   const auto record = [&](unsigned function, std::vector<int> params) {
@@ -23,38 +24,39 @@ std::vector<std::uint8_t> WmfWithRectangle() {
     records.U32(words).U16(function);
     for (int p : params) records.I16(p);
   };
-  record(0x020B, {0, 0});             // SetWindowOrg (y, x)
-  record(0x020C, {30, 40});           // SetWindowExt (y, x)
-  record(0x02FC, {0, 0x00FF, 0, 0});  // CreateBrushIndirect: solid, red
-  record(0x012D, {0});                // SelectObject
-  record(0x02FA, {5, 0, 0, 0, 0});    // CreatePenIndirect: null pen
-  record(0x012D, {1});
-  record(0x041B, {25, 30, 5, 10});  // Rectangle (bottom, right, top, left)
-  record(0x0000, {});               // EOF
+  record(0x020B, {0, 0});                           // SetWindowOrg (y, x)
+  record(0x020C, {30 * k, 40 * k});                 // SetWindowExt (y, x)
+  record(0x02FC, {0, 0x00FF, 0, 0});                // CreateBrushIndirect: solid, red
+  record(0x012D, {0});                              // SelectObject
+  record(0x02FA, {5, 0, 0, 0, 0});                  // CreatePenIndirect: null pen
+  record(0x012D, {1});                              //
+  record(0x041B, {25 * k, 30 * k, 5 * k, 10 * k});  // Rectangle (bottom, right, top, left)
+  record(0x02FA, {0, k, 0, 0, 0x00FF});             // CreatePenIndirect: solid, blue
+  record(0x012D, {2});                              //
+  record(0x0214, {2 * k, 2 * k});                   // MoveTo (y, x)
+  record(0x0213, {2 * k, 37 * k});                  // LineTo (y, x)
+  record(0x0000, {});                               // EOF
   ByteWriter file;
-  const std::vector<int> placeable = {0, 0, 40, 30, 96};
-  ByteWriter head;
-  head.U32(0x9AC6CDD7).U16(0);
-  for (int v : placeable) head.I16(v);
-  head.U32(0);
+  file.U32(0x9AC6CDD7).U16(0).I16(0).I16(0).I16(40 * k).I16(30 * k).I16(96 * k).U32(0);
   std::uint16_t checksum = 0;
-  for (std::size_t i = 0; i < 20; i += 2) checksum ^= head.bytes[i] | head.bytes[i + 1] << 8;
-  head.U16(checksum);
-  file.Append(head.bytes);
+  for (std::size_t i = 0; i < 20; i += 2) checksum ^= file.bytes[i] | file.bytes[i + 1] << 8;
+  file.U16(checksum);
   file.U16(1).U16(9).U16(0x0300).U32(static_cast<std::uint32_t>(9 + records.Size() / 2));
-  file.U16(2).U32(largest).U16(0);
-  file.Append(records.bytes);
-  return file.bytes;
+  file.U16(3).U32(largest).U16(0);
+  return file.Append(records.bytes).bytes;
 }
 
-TEST(WindowsMetafile, PlaysShapesOnWhite) {
-  const TBitmap32 p = DecodeMetafile(WmfWithRectangle());
-  ASSERT_EQ(p.Width(), 40);
-  ASSERT_EQ(p.Height(), 30);
-  EXPECT_EQ(p.At(20, 15), kRed);
-  EXPECT_EQ(p.At(12, 7), kRed);
-  EXPECT_EQ(p.At(2, 2), kWhite);
-  EXPECT_EQ(p.At(36, 27), kWhite);
+TEST(WindowsMetafile, PlaysShapesAndLinesOnWhite) {
+  for (const int k : {1, 15}) {
+    const TBitmap32 p = DecodeMetafile(WmfWithRectangle(k));
+    ASSERT_EQ(p.Width(), 40);
+    ASSERT_EQ(p.Height(), 30);
+    EXPECT_EQ(p.At(20, 15), kRed) << k;
+    EXPECT_EQ(p.At(12, 7), kRed) << k;
+    EXPECT_EQ(p.At(20, 2), kBlue) << k;
+    EXPECT_EQ(p.At(2, 12), kWhite) << k;
+    EXPECT_EQ(p.At(36, 27), kWhite) << k;
+  }
 }
 
 // A metafile that only draws picture as one 24-bit bitmap at its own size, the window in units
@@ -118,7 +120,7 @@ TEST(WindowsMetafile, MadeUpLargestRecordFieldIsCorrected) {
     for (int i = 0; i < 4; ++i) file[22 + 12 + i] = static_cast<std::uint8_t>(claimed >> (8 * i));
     const TBitmap32 p = DecodeMetafile(file);
     EXPECT_EQ(p.At(20, 15), kRed) << claimed;
-    EXPECT_EQ(p.At(2, 2), kWhite) << claimed;
+    EXPECT_EQ(p.At(2, 12), kWhite) << claimed;
   }
 }
 
