@@ -44,10 +44,6 @@ struct ByteWriter {
     bytes.insert(bytes.end(), text.begin(), text.end());
     return *this;
   }
-  ByteWriter& PadTo4() {
-    while (bytes.size() % 4 != 0) U8(0);
-    return *this;
-  }
   std::size_t Size() const { return bytes.size(); }
   void PatchU32(std::size_t at, std::uint32_t v) {
     for (int i = 0; i < 4; ++i) bytes[at + i] = static_cast<std::uint8_t>(v >> (8 * i));
