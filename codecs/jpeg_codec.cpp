@@ -63,8 +63,11 @@ void EmitMessage(j_common_ptr cinfo, int level) {
     case JWRN_HIT_MARKER:
       Fail(cinfo, err->dataEnded ? "The JPEG file is truncated (premature end of data)"
                                  : "The JPEG file is damaged (corrupt data)");
-    case JWRN_MUST_RESYNC:
     case JWRN_EXTRANEOUS_DATA:
+      // Stray bytes before the end marker, which some cameras write, follow complete data.
+      if (cinfo->err->msg_parm.i[1] == 0xD9) break;
+      [[fallthrough]];
+    case JWRN_MUST_RESYNC:
       if (!err->allRowsRead) Fail(cinfo, "The JPEG file is damaged (corrupt data)");
       break;
     default:

@@ -198,8 +198,11 @@ TEST(JpegDecoder, RefusesHugeEmptyShortAndBrokenFiles) {
       EXPECT_NE(std::string(error.what()).find(reason), std::string::npos) << error.what();
     }
   }
-  // A file missing only its end marker still holds the whole picture.
+  // A file missing only its end marker, or with stray bytes before it, holds the whole picture.
   EXPECT_EQ(DecodeJpeg({file.begin(), file.end() - 2}).Width(), 64);
+  std::vector<std::uint8_t> stray(file.begin(), file.end() - 2);
+  stray.insert(stray.end(), {0, 0, 0, 0xFF, 0xD9});
+  EXPECT_EQ(DecodeJpeg(stray).Width(), 64);
   // The limit is the one given: 64 x 64 is refused at 4095 pixels, read at 4096.
   EXPECT_THROW(DecodeJpeg(file, 4095), PictureFileError);
   EXPECT_EQ(DecodeJpeg(file, 4096).Width(), 64);
