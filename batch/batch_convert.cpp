@@ -1,34 +1,31 @@
 #include "batch/batch_convert.h"
 
+#include <sys/stat.h>
+
 #include <algorithm>
 #include <exception>
 #include <filesystem>
+#include <map>
 #include <optional>
+#include <set>
 #include <stdexcept>
 #include <system_error>
 #include <utility>
 
 #include "codecs/picture_file.h"
 #include "document/run_effect.h"
+#include "imaging/memory_budget.h"
 
 namespace quillane {
 namespace fs = std::filesystem;
 
 namespace {
 
-char LowerAscii(char c) {
-  return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c;
-}
-
 // "*.jpg" matches every name that ends with ".jpg" in any case; only the extension is compared,
 // so "*.jpg" does not also catch "x.jpeg".
 bool MatchesMask(const std::string& name, std::string_view mask) {
   const std::string_view tail = mask.substr(1);  // ".jpg"
-  if (name.size() < tail.size()) return false;
-  const std::size_t start = name.size() - tail.size();
-  for (std::size_t i = 0; i < tail.size(); ++i)
-    if (LowerAscii(name[start + i]) != tail[i]) return false;
-  return true;
+  return name.size() >= tail.size() && AsciiLower(name.substr(name.size() - tail.size())) == tail;
 }
 
 std::string JoinPath(const std::string& folder, const std::string& name) {
@@ -38,6 +35,15 @@ std::string JoinPath(const std::string& folder, const std::string& name) {
 
 std::string NotValidFormat(const std::string& path) {
   return path + " is not a valid format";
+}
+
+// Files are told apart by device and inode, so another spelling of a folder, or a link to it,
+// still names the same file.
+using FileId = std::pair<dev_t, ino_t>;
+std::optional<FileId> IdOf(const std::string& path) {
+  struct stat info {};
+  if (::stat(path.c_str(), &info) != 0) return std::nullopt;
+  return FileId{info.st_dev, info.st_ino};
 }
 
 }  // namespace
@@ -119,6 +125,13 @@ BatchResult ConvertBatch(PictureDocument& document, const EffectSpec& effect,
 
   const int count = static_cast<int>(job.files.size());
   const LoaderNotice notice = observer.message;
+  // Names of different inputs can lead to one output ("a.jpg", "a.JPG" and "a.bmp"), and with
+  // the output folder the input folder an output can be an input ("x-Tag.jpg" beside "x.jpg"):
+  // neither is ever overwritten.
+  std::set<FileId> inputs;
+  for (const std::string& name : job.files)
+    if (const auto id = IdOf(JoinPath(inputFolder, name))) inputs.insert(*id);
+  std::map<std::string, std::string> writtenFor;  // output path -> the entry that wrote it
   for (int i = 1; i <= count; ++i) {
     BatchProgress progress;
     progress.index = i;
@@ -131,9 +144,25 @@ BatchResult ConvertBatch(PictureDocument& document, const EffectSpec& effect,
     };
     report(BatchProgress::Step::Loading);
 
+    auto skip = [&](std::string reason) {
+      result.skipped.push_back({progress.name, reason});
+      progress.reason = std::move(reason);
+      report(BatchProgress::Step::Skipped);
+    };
+    const std::string path = JoinPath(inputFolder, progress.name);
+    if (const auto taken = writtenFor.find(progress.outputPath); taken != writtenFor.end()) {
+      skip(path + " was not converted: its output " + progress.outputPath +
+           " was already written for " + taken->second);
+      continue;
+    }
+    if (const auto id = IdOf(progress.outputPath); id && inputs.count(*id)) {
+      skip(path + " was not converted: its output " + progress.outputPath +
+           " is one of the pictures being converted");
+      continue;
+    }
+
     // Loaded into a bitmap of its own first: an entry that cannot be read must leave the
     // document, and with it the previous result, untouched and write no file.
-    const std::string path = JoinPath(inputFolder, progress.name);
     std::optional<TBitmap32> picture;
     std::string reason;
     try {
@@ -143,17 +172,26 @@ BatchResult ConvertBatch(PictureDocument& document, const EffectSpec& effect,
       reason = NamingTheFile(path, e.what());
     }
     if (!reason.empty()) {
-      result.skipped.push_back({progress.name, reason});
-      progress.reason = std::move(reason);
-      report(BatchProgress::Step::Skipped);
+      skip(std::move(reason));
       continue;
     }
-    document.Load(std::move(*picture));
+    const int width = picture->Width(), height = picture->Height();
+    try {
+      document.Load(std::move(*picture));
+    } catch (const std::bad_alloc&) {
+      skip(path + " " + MemoryNeedText(OperationBytes(width, height)));
+      continue;
+    }
     picture.reset();
     report(BatchProgress::Step::Loaded);
 
     try {
       RunEffect(document, effect, params, effect.batchPushesHistory);
+    } catch (const std::bad_alloc&) {
+      // Too large for what is left of memory: this picture only; the next may well fit.
+      skip(path + " " +
+           MemoryNeedText(OperationBytes(document.Source().Width(), document.Source().Height())));
+      continue;
     } catch (const std::exception& e) {
       return stop(NamingTheFile(path, e.what()));
     }
@@ -166,6 +204,7 @@ BatchResult ConvertBatch(PictureDocument& document, const EffectSpec& effect,
       return stop("Cannot write " + progress.outputPath + ": " + e.what());
     }
     result.outputs.push_back(progress.outputPath);
+    writtenFor.emplace(progress.outputPath, progress.name);
     report(BatchProgress::Step::Written);
   }
   return result;

@@ -47,7 +47,7 @@ struct BatchProgress {
     Loaded,     // the entry is the document's picture now (repaint)
     Converted,  // the effect has written the working picture (repaint)
     Written,    // outputPath has been written
-    Skipped,    // the entry could not be loaded; reason says why; nothing was written
+    Skipped,    // the entry was not converted; reason says why; nothing was written
   };
   Step step = Step::Loading;
   int index = 0;           // 1-based position in the list
@@ -89,7 +89,7 @@ struct BatchResult {
   };
   End end = End::Completed;
   std::vector<std::string> outputs;   // the files written, in list order
-  std::vector<BatchSkipped> skipped;  // the entries that could not be loaded, in list order
+  std::vector<BatchSkipped> skipped;  // the entries not converted, in list order
   std::string error;                  // Stopped only
 
   bool AllConverted() const { return end == End::Completed && skipped.empty(); }
@@ -108,7 +108,10 @@ struct BatchResult {
 //     replacing any file of that name.
 // An entry that is missing, of an unrecognised type, empty or undecodable is skipped and
 // recorded in skipped; the document keeps the previous picture and no output file is written
-// for it. An effect error or a failed write stops the loop (End::Stopped, error names the file).
+// for it. So is an entry whose output name was already written in this run (the reason names
+// the entry that wrote it) or is one of the listed input files, and one too large for the
+// memory left (the reason says what it needs). Any other effect error or a failed write stops
+// the loop (End::Stopped, error names the file).
 // Throws std::invalid_argument when effect has no routine or no batch output tag.
 BatchResult ConvertBatch(PictureDocument& document, const EffectSpec& effect,
                          const EffectParams& params, const BatchJob& job,

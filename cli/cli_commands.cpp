@@ -2,10 +2,6 @@
 
 #include <unistd.h>
 
-#include <QFile>
-#include <QImage>
-#include <QImageReader>
-#include <QString>
 #include <algorithm>
 #include <cstdlib>
 #include <exception>
@@ -20,44 +16,38 @@
 #include "codecs/picture_file.h"
 #include "data/startup_picture.h"
 #include "document/run_effect.h"
+#include "imaging/memory_budget.h"
 
 namespace quillane::cli {
 namespace fs = std::filesystem;
 
 namespace {
 
-bool EndsWithPng(const std::string& path) {
-  if (path.size() < 4) return false;
-  std::string tail = path.substr(path.size() - 4);
-  for (char& c : tail)
-    if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
-  return tail == ".png";
-}
-
-// PNG is not one of the program's own input types, so it is read here through Qt.
-std::optional<TBitmap32> LoadPng(const std::string& path, std::string& error) {
-  QImageReader reader(QFile::decodeName(path.c_str()), "png");
-  const QSize size = reader.size();
-  if (size.isValid() &&
-      static_cast<std::int64_t>(size.width()) * size.height() > TBitmap32::kMaxPixels) {
-    error = path + ": the picture is too large";
-    return std::nullopt;
+// text as it may go to a terminal: control characters and bytes that are not UTF-8 (a file name
+// is any bytes) written as \xHH, so a name can neither move the cursor nor garble the line.
+std::string Shown(const std::string& text) {
+  std::string shown;
+  for (std::size_t i = 0; i < text.size();) {
+    const auto c = static_cast<unsigned char>(text[i]);
+    // The length of a well-formed UTF-8 sequence starting here, or 0.
+    std::size_t length = c < 0x80                ? 1
+                         : c >= 0xC2 && c < 0xE0 ? 2
+                         : c >= 0xE0 && c < 0xF0 ? 3
+                         : c >= 0xF0 && c < 0xF5 ? 4
+                                                 : 0;
+    for (std::size_t k = 1; k < length; ++k)
+      if (i + k >= text.size() || (static_cast<unsigned char>(text[i + k]) & 0xC0) != 0x80)
+        length = 0;
+    if (length == 0 || c < 0x20 || c == 0x7F) {
+      static const char kHex[] = "0123456789abcdef";
+      shown += {'\\', 'x', kHex[c >> 4], kHex[c & 15]};
+      ++i;
+    } else {
+      shown.append(text, i, length);
+      i += length;
+    }
   }
-  // Qt's own cap is below ours; the size was checked above.
-  QImageReader::setAllocationLimit(
-      static_cast<int>(TBitmap32::kMaxPixels * 4 / (1024 * 1024) + 64));
-  QImage image = reader.read();
-  if (image.isNull()) {
-    error = path + ": " + reader.errorString().toStdString();
-    return std::nullopt;
-  }
-  image = image.convertToFormat(QImage::Format_ARGB32);  // B, G, R, A in memory, like Pixel
-  TBitmap32 picture(image.width(), image.height());
-  for (int y = 0; y < image.height(); ++y) {
-    const auto* from = reinterpret_cast<const Pixel*>(image.constScanLine(y));
-    std::copy(from, from + image.width(), picture.ScanLine(y));
-  }
-  return picture;
+  return shown;
 }
 
 // A file of our own in the temporary folder, removed when done with.
@@ -112,7 +102,7 @@ std::optional<TBitmap32> InputOrBuiltInPicture(const Options& o, std::ostream& e
   } else {
     loaded = LoadInputPicture(o.input, error, err);
   }
-  if (!loaded) err << "quillane-cli: " << error << "\n";
+  if (!loaded) err << "quillane-cli: " << Shown(error) << "\n";
   return loaded;
 }
 
@@ -133,22 +123,33 @@ void WriteOutput(const TBitmap32& picture, const Options& o, std::ostream& out) 
 int ApplyCommand(const Options& o, std::ostream& out, std::ostream& err) {
   std::optional<TBitmap32> picture = InputOrBuiltInPicture(o, err);
   if (!picture) return kExitFailed;
-  // Through a document, as the program does it: alpha 255, source in, working out.
-  PictureDocument document(std::move(*picture));
+  const std::string name = o.input.empty() ? "the built-in picture" : o.input;
+  const int width = picture->Width(), height = picture->Height();
   try {
-    RunEffect(document, *o.effect, o.params, false);
-  } catch (const std::exception& e) {
-    err << "quillane-cli: " << o.effect->cliName << ": " << e.what() << "\n";
+    // Through a document, as the program does it: alpha 255, source in, working out.
+    PictureDocument document(std::move(*picture));
+    try {
+      RunEffect(document, *o.effect, o.params, false);
+    } catch (const std::bad_alloc&) {
+      throw;
+    } catch (const std::exception& e) {
+      err << "quillane-cli: " << o.effect->cliName << ": " << Shown(e.what()) << "\n";
+      return kExitFailed;
+    }
+    try {
+      WriteOutput(document.Working(), o, out);
+    } catch (const std::exception& e) {
+      err << "quillane-cli: cannot write "
+          << (o.output == "-" ? std::string("to standard output") : Shown(o.output)) << ": "
+          << Shown(e.what()) << "\n";
+      return kExitFailed;
+    }
+  } catch (const std::bad_alloc&) {
+    err << "quillane-cli: " << o.effect->cliName << ": " << Shown(name) << " "
+        << MemoryNeedText(OperationBytes(width, height)) << "\n";
     return kExitFailed;
   }
-  try {
-    WriteOutput(document.Working(), o, out);
-  } catch (const std::exception& e) {
-    err << "quillane-cli: cannot write " << (o.output == "-" ? "to standard output" : o.output)
-        << ": " << e.what() << "\n";
-    return kExitFailed;
-  }
-  if (o.output != "-") out << o.output << "\n";
+  if (o.output != "-") out << Shown(o.output) << "\n";
   return kExitOk;
 }
 
@@ -163,13 +164,13 @@ class ProgressBar {
     const int filled = count > 0 ? (index - 1) * kWidth / count : 0;
     err_ << "\r[" << std::string(static_cast<std::size_t>(filled), '#')
          << std::string(static_cast<std::size_t>(kWidth - filled), '.') << "] " << index << "/"
-         << count << " " << name << "\x1b[K" << std::flush;
+         << count << " " << Shown(name) << "\x1b[K" << std::flush;
     drawn_ = true;
   }
   // A line of its own above the bar.
   void Print(const std::string& line) {
     if (drawn_) err_ << "\r\x1b[K";
-    err_ << line << "\n" << std::flush;
+    err_ << Shown(line) << "\n" << std::flush;
     drawn_ = false;
   }
   void Finish() {
@@ -214,17 +215,21 @@ int BatchCommand(const Options& o, std::ostream& out, std::ostream& err, bool te
 
   if (result.end == BatchResult::End::Refused) return kExitFailed;
   const std::size_t listed = job.files.size();
-  if (result.end == BatchResult::End::Stopped) err << "quillane-cli: " << result.error << "\n";
+  if (result.end == BatchResult::End::Stopped)
+    err << "quillane-cli: " << Shown(result.error) << "\n";
   out << "Converted " << result.outputs.size() << " of " << listed
-      << (listed == 1 ? " picture" : " pictures") << " into " << TrimBlanks(o.output) << "\n";
+      << (listed == 1 ? " picture" : " pictures") << " into " << Shown(TrimBlanks(o.output))
+      << "\n";
   if (!result.skipped.empty()) {
     err << "Skipped " << result.skipped.size()
         << (result.skipped.size() == 1 ? " picture:\n" : " pictures:\n");
-    for (const BatchSkipped& s : result.skipped) err << "  " << s.name << ": " << s.reason << "\n";
+    for (const BatchSkipped& s : result.skipped)
+      err << "  " << Shown(s.name) << ": " << Shown(s.reason) << "\n";
   }
   if (result.end == BatchResult::End::Stopped) {
-    err << "Stopped before the end; " << (listed - result.outputs.size() - result.skipped.size())
-        << " pictures were not converted.\n";
+    const std::size_t left = listed - result.outputs.size() - result.skipped.size();
+    err << "Stopped before the end; " << left
+        << (left == 1 ? " picture was not converted.\n" : " pictures were not converted.\n");
     return kExitFailed;
   }
   if (!result.AllConverted()) return kExitFailed;
@@ -283,7 +288,7 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
   std::error_code ec;
   fs::create_directories(o.output, ec);
   if (!fs::is_directory(o.output)) {
-    err << "quillane-cli: cannot create the folder " << o.output
+    err << "quillane-cli: cannot create the folder " << Shown(o.output)
         << (ec ? ": " + ec.message() : std::string()) << "\n";
     return kExitFailed;
   }
@@ -296,7 +301,8 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
       SavePng(p, (folder / file).string());
       return true;
     } catch (const std::exception& e) {
-      err << "quillane-cli: cannot write " << (folder / file).string() << ": " << e.what() << "\n";
+      err << "quillane-cli: cannot write " << Shown((folder / file).string()) << ": "
+          << Shown(e.what()) << "\n";
       status = kExitFailed;
       return false;
     }
@@ -320,8 +326,14 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
         PictureDocument trial = document;
         RunEffect(trial, *effect, {}, false);
         if (!write(trial.Working(), file)) continue;
+      } catch (const std::bad_alloc&) {
+        err << "quillane-cli: " << effect->cliName << ": " << Shown(sourceName) << " "
+            << MemoryNeedText(OperationBytes(document.Source().Width(), document.Source().Height()))
+            << "\n";
+        status = kExitFailed;
+        continue;
       } catch (const std::exception& e) {
-        err << "quillane-cli: " << effect->cliName << ": " << e.what() << "\n";
+        err << "quillane-cli: " << effect->cliName << ": " << Shown(e.what()) << "\n";
         status = kExitFailed;
         continue;
       }
@@ -335,7 +347,7 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
   html << GalleryHtml(sourceName, {"Original", "original.png"}, menus, unavailable);
   html.close();
   if (!html) {
-    err << "quillane-cli: cannot write " << index << "\n";
+    err << "quillane-cli: cannot write " << Shown(index) << "\n";
     return kExitFailed;
   }
   out << "Wrote " << written << (written == 1 ? " effect" : " effects") << " and the original into "
@@ -347,17 +359,13 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
 
 std::optional<TBitmap32> LoadInputPicture(const std::string& path, std::string& error,
                                           std::ostream& notices) {
-  std::error_code ec;
-  if (!fs::is_regular_file(path, ec)) {
-    error = fs::exists(path, ec) ? path + " is not a file" : path + ": no such file";
-    return std::nullopt;
-  }
   try {
-    if (EndsWithPng(path)) return LoadPng(path, error);
     std::optional<TBitmap32> picture =
-        LoadPictureFile(path, [&](const std::string& caption, const std::string& text) {
-          notices << caption << ": " << text << "\n";
-        });
+        AsciiLower(fs::path(path).extension().string()) == ".png"
+            ? LoadPng(path)
+            : LoadPictureFile(path, [&](const std::string& caption, const std::string& text) {
+                notices << caption << ": " << text << "\n";
+              });
     if (!picture) {
       error = path + ": no such file";
       return std::nullopt;

@@ -5,9 +5,9 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <climits>
 #include <cstdio>
 #include <cstring>
-#include <filesystem>
 #include <random>
 
 namespace quillane::codecs {
@@ -34,35 +34,69 @@ std::string Reason(int error, const std::string& target) {
   return std::strerror(error);
 }
 
+// The file a chain of symbolic links ends at (which need not exist yet).
+std::string FollowLinks(std::string path) {
+  for (int hops = 0; hops < 40; ++hops) {
+    struct stat info {};
+    if (::lstat(path.c_str(), &info) != 0 || !S_ISLNK(info.st_mode)) return path;
+    char link[PATH_MAX];
+    const ssize_t length = ::readlink(path.c_str(), link, sizeof link - 1);
+    if (length < 0) return path;
+    const std::string to(link, static_cast<std::size_t>(length));
+    path = to.front() == '/' ? to : FolderOf(path) + "/" + to;
+  }
+  throw PictureFileError(std::strerror(ELOOP));
+}
+
 }  // namespace
 
-AtomicFile::AtomicFile(std::string target) : target_(std::move(target)) {
-  if (target_.empty() || target_.back() == '/') {
-    throw PictureFileError("no file name given");
+AtomicFile::AtomicFile(std::string target) {
+  if (target.empty() || target.back() == '/') throw PictureFileError("no file name given");
+  target_ = FollowLinks(std::move(target));
+  struct stat old {};
+  if (::stat(target_.c_str(), &old) == 0) {
+    if (!S_ISREG(old.st_mode)) throw PictureFileError("it is not a file");
+    // The permission bits, not access(): a read-only file stays read-only for root too.
+    if ((old.st_mode & S_IWUSR) == 0 || ::access(target_.c_str(), W_OK) != 0) {
+      throw PictureFileError("the file is read-only");
+    }
+    replacing_ = true;
+    mode_ = old.st_mode & 07777;
+    group_ = old.st_gid;
   }
-  // Hidden, randomly named and created exclusively, so that two saves never share a file and
-  // an existing file is never opened by mistake.
-  std::random_device seed;
-  std::mt19937_64 random(seed());
-  const std::string prefix = FolderOf(target_) + "/." + NameOf(target_) + ".";
-  for (int attempt = 0; attempt < 100; ++attempt) {
-    char suffix[24];
-    std::snprintf(suffix, sizeof suffix, "%012llx.tmp",
-                  static_cast<unsigned long long>(random() & 0xFFFFFFFFFFFFull));
-    temp_ = prefix + suffix;
-    fd_ = ::open(temp_.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0666);
-    if (fd_ >= 0) break;
-    if (errno != EEXIST) {
-      const int error = errno;
+  const std::string folder = FolderOf(target_);
+  fd_ = ::open(folder.c_str(), O_TMPFILE | O_WRONLY | O_CLOEXEC, 0666);
+  if (fd_ >= 0) {
+    unnamed_ = true;
+  } else if (errno == ENOENT || errno == ENOTDIR || errno == EACCES || errno == EROFS) {
+    throw PictureFileError(Reason(errno, target_));
+  } else {
+    // No unnamed files here: hidden, randomly named and created exclusively, so that two saves
+    // never share a file and an existing file is never opened by mistake.
+    for (int attempt = 0; attempt < 100 && fd_ < 0; ++attempt) {
+      temp_ = HiddenName();
+      fd_ = ::open(temp_.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0666);
+      if (fd_ < 0 && errno != EEXIST) {
+        const int error = errno;
+        temp_.clear();
+        throw PictureFileError(Reason(error, target_));
+      }
+    }
+    if (fd_ < 0) {
       temp_.clear();
-      throw PictureFileError(Reason(error, target_));
+      throw PictureFileError("no temporary file could be made");
     }
   }
-  if (fd_ < 0) {
-    temp_.clear();
-    throw PictureFileError("no temporary file could be made");
-  }
   buffer_.reserve(kBufferSize);
+}
+
+std::string AtomicFile::HiddenName() const {
+  std::random_device seed;
+  std::mt19937_64 random(seed());
+  char suffix[24];
+  std::snprintf(suffix, sizeof suffix, "%012llx.tmp",
+                static_cast<unsigned long long>(random() & 0xFFFFFFFFFFFFull));
+  return FolderOf(target_) + "/." + NameOf(target_) + "." + suffix;
 }
 
 AtomicFile::~AtomicFile() {
@@ -110,7 +144,28 @@ void AtomicFile::Write(const void* data, std::size_t size) {
 void AtomicFile::Commit() {
   if (fd_ < 0) throw PictureFileError("the file is closed");
   Flush();
+  if (replacing_) {
+    // The group first: changing it may clear the set-group-ID bit that fchmod then restores.
+    if (::fchown(fd_, static_cast<uid_t>(-1), group_) != 0) {
+      // Not a member of that group: the file keeps ours, as any new file would.
+    }
+    if (::fchmod(fd_, mode_) != 0) Fail(errno);
+  }
   if (::fsync(fd_) != 0 && errno != EINVAL) Fail(errno);
+  if (unnamed_) {
+    // The complete file gets a name of its own beside the target, then takes the target's.
+    // Only a crash in the instant between the two can leave that name behind.
+    const std::string self = "/proc/self/fd/" + std::to_string(fd_);
+    for (int attempt = 0; attempt < 100 && temp_.empty(); ++attempt) {
+      temp_ = HiddenName();
+      if (::linkat(AT_FDCWD, self.c_str(), AT_FDCWD, temp_.c_str(), AT_SYMLINK_FOLLOW) != 0) {
+        const int error = errno;
+        temp_.clear();
+        if (error != EEXIST) Fail(error);
+      }
+    }
+    if (temp_.empty()) Fail(EEXIST);
+  }
   const int fd = fd_;
   fd_ = -1;
   if (::close(fd) != 0) {

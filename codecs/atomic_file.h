@@ -1,5 +1,7 @@
-// A file written beside its target and moved over it only once complete.
+// A file written out of sight and put in place of its target only once complete.
 #pragma once
+
+#include <sys/types.h>
 
 #include <cstddef>
 #include <string>
@@ -9,10 +11,16 @@
 
 namespace quillane::codecs {
 
-// Creates a temporary file in the target's folder. Write buffers and reports any error as
-// PictureFileError giving the reason (the caller names the file); Commit flushes, syncs and renames
-// the temporary file over the target. A file that was never committed is removed by the destructor,
-// so the target is either the old file or the complete new one.
+// Writes the new content of target, which is either the old file or the complete new one,
+// whatever happens meanwhile:
+// - a symbolic link is followed, and the file it names is the one replaced (the link stays);
+// - a target without write permission is refused ("the file is read-only");
+// - the new file takes the old one's permission bits and, where allowed, its group;
+// - the content goes into an unnamed file in the target's folder (O_TMPFILE), given a name only
+//   when complete, so an interrupted save (a signal, a crash) leaves nothing behind. On file
+//   systems without unnamed files a hidden, randomly named one is used and removed on failure.
+// Write buffers and reports any error as PictureFileError giving the reason (the caller names
+// the file); Commit flushes, syncs and moves the file into place.
 class AtomicFile : public ByteSink {
  public:
   explicit AtomicFile(std::string target);
@@ -26,11 +34,16 @@ class AtomicFile : public ByteSink {
  private:
   void Flush();
   [[noreturn]] void Fail(int error);
+  std::string HiddenName() const;
 
-  std::string target_;
-  std::string temp_;
+  std::string target_;  // the file itself, links followed
+  std::string temp_;    // the named temporary file, when there is one
   int fd_ = -1;
+  bool unnamed_ = false;
   bool committed_ = false;
+  bool replacing_ = false;  // a file exists at target_; its mode and group are kept
+  mode_t mode_ = 0;
+  gid_t group_ = 0;
   std::vector<char> buffer_;
 };
 

@@ -47,7 +47,7 @@ TBitmap32 DecodeJpeg(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels)
 enum class QtFormat {
   kBitmap,  // every BMP depth, RLE4/RLE8, bit fields, top-down and bottom-up, v3 to v5 headers
   kIcon,    // the entry with the most pixels, and of those the deepest, is taken
-  kGif,     // the first frame as rendered on the logical screen
+  kGif,     // the first frame, on a screen no larger than the frames need (see qt_codec.cpp)
 };
 // For icons and GIFs, transparent and partly transparent pixels are composited over white (the
 // background a freshly made bitmap shows); the alpha bytes are returned as the decoder gives
@@ -88,11 +88,24 @@ void WriteDib24(const TBitmap32& picture, ByteSink& sink);
 // The pixel size a Windows playing device at 96 dots per inch gives an enhanced metafile.
 inline constexpr int kMetafileDotsPerInch = 96;
 
-// Reads a whole file; throws PictureFileError when it cannot.
+// Reads a whole regular file. The file is opened without waiting (a FIFO or a device put in the
+// file's place would otherwise block for good) and only then checked, so what is read is what
+// was checked. Throws PictureFileError: "<path> is not a picture file" for anything but a
+// regular file, and a reason naming the file when it cannot be read.
 std::vector<std::uint8_t> ReadWholeFile(const std::string& path);
 
-// Throws PictureFileError when a width by height picture cannot be held.
+// Throws PictureFileError when a width by height picture cannot be held: a side of 0 or below,
+// more than maxPixels, or more memory than is available for opening it and running an effect
+// on it (the decoder's own buffers being extraBytesPerPixel).
 void CheckPictureSize(std::int64_t width, std::int64_t height, std::int64_t maxPixels,
-                      const char* what);
+                      const char* what, int extraBytesPerPixel = 0);
+
+// PNG through libpng's simplified reader, alpha kept as stored (not premultiplied). libpng's
+// complaints become the error message; none goes to the terminal.
+TBitmap32 DecodePng(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels);
+
+// The family a file's first bytes belong to ("JPEG", "PNG", "GIF", "bitmap", "icon",
+// "metafile"), or "" when none is recognised.
+std::string SniffFamily(Bytes data);
 
 }  // namespace quillane::codecs

@@ -32,6 +32,7 @@ struct ErrorManager {
   char message[JMSG_LENGTH_MAX + 64];
   bool headerRead;  // past jpeg_read_header
   bool dataEnded;   // the source ran dry and libjpeg went on with a made-up end marker
+  bool allRowsRead;
 };
 
 [[noreturn]] void Fail(j_common_ptr cinfo, const char* text) {
@@ -46,19 +47,31 @@ struct ErrorManager {
   std::longjmp(err->jump, 1);
 }
 
-// Warnings about damaged entropy data are tolerated (the damaged blocks decode as gray, as
-// every viewer shows them), but a picture whose data runs out is not all there. The end of the
-// data alone is not enough to tell: libjpeg also reaches it looking for the end marker after
-// the last scan, which some writers leave out. It is the entropy decoder then finding no more
-// bits that shows real loss.
+// Damaged entropy data is refused rather than shown with gray blocks: the decoder's warnings
+// that data is corrupt or ended early mean the picture is not all there. The end of the data
+// alone is not enough to tell: libjpeg also reaches it looking for the end marker after the
+// last scan, which some writers leave out. It is the entropy decoder then finding no more bits
+// (a marker where data should be) that shows real loss.
 void EmitMessage(j_common_ptr cinfo, int level) {
   if (level >= 0) return;
   auto* err = reinterpret_cast<ErrorManager*>(cinfo->err);
-  if (cinfo->err->msg_code == JWRN_JPEG_EOF) {
-    if (!err->headerRead) Fail(cinfo, "The JPEG file is truncated (it ends inside its header)");
-    err->dataEnded = true;
-  } else if (cinfo->err->msg_code == JWRN_HIT_MARKER && err->dataEnded) {
-    Fail(cinfo, "The JPEG file is truncated (premature end of data)");
+  switch (cinfo->err->msg_code) {
+    case JWRN_JPEG_EOF:
+      if (!err->headerRead) Fail(cinfo, "The JPEG file is truncated (it ends inside its header)");
+      err->dataEnded = true;
+      break;
+    case JWRN_HIT_MARKER:
+      Fail(cinfo, err->dataEnded ? "The JPEG file is truncated (premature end of data)"
+                                 : "The JPEG file is damaged (corrupt data)");
+    case JWRN_EXTRANEOUS_DATA:
+      // Stray bytes before the end marker, which some cameras write, follow complete data.
+      if (cinfo->err->msg_parm.i[1] == 0xD9) break;
+      [[fallthrough]];
+    case JWRN_MUST_RESYNC:
+      if (!err->allRowsRead) Fail(cinfo, "The JPEG file is damaged (corrupt data)");
+      break;
+    default:
+      break;
   }
   cinfo->err->num_warnings++;
 }
@@ -81,6 +94,7 @@ void InstallErrorManager(ErrorManager& err) {
   err.message[0] = '\0';
   err.headerRead = false;
   err.dataEnded = false;
+  err.allRowsRead = false;
 }
 
 std::uint8_t MulDiv255(unsigned a, unsigned b) {
@@ -111,8 +125,23 @@ bool RunDecoder(Decompressor& d, Bytes data, std::int64_t maxPixels, TBitmap32& 
 
   const std::int64_t width = d.cinfo.image_width;
   const std::int64_t height = d.cinfo.image_height;
-  if (width <= 0 || height <= 0 || width * height > maxPixels) {
-    sizeProblem = "JPEG";
+  // A progressive file is decoded into a coefficient buffer of two bytes per sample first.
+  const int extraBytesPerPixel = d.cinfo.progressive_mode ? 2 * d.cinfo.num_components : 0;
+  try {
+    CheckPictureSize(width, height, maxPixels, "JPEG", extraBytesPerPixel);
+  } catch (const PictureFileError& e) {
+    sizeProblem = e.what();
+    return true;
+  }
+  // Huffman coding spends at least one bit on every block of the first component, so a file
+  // shorter than that cannot hold the picture its header announces; refusing it here spares
+  // allocating and decoding a huge picture from a few kilobytes.
+  const std::uint64_t blocks =
+      std::uint64_t{d.cinfo.comp_info[0].width_in_blocks} * d.cinfo.comp_info[0].height_in_blocks;
+  if (!d.cinfo.arith_code && data.size() < blocks / 8) {
+    sizeProblem = "The JPEG file is truncated (" + std::to_string(data.size()) +
+                  " bytes cannot hold a picture of " + std::to_string(width) + " by " +
+                  std::to_string(height) + " pixels)";
     return true;
   }
   const bool inks = d.cinfo.jpeg_color_space == JCS_CMYK || d.cinfo.jpeg_color_space == JCS_YCCK;
@@ -156,6 +185,7 @@ bool RunDecoder(Decompressor& d, Bytes data, std::int64_t maxPixels, TBitmap32& 
     }
   }
   // Every row is in; whatever follows the last scan (or a missing end marker) does not matter.
+  d.err.allRowsRead = true;
   return true;
 }
 
@@ -253,9 +283,7 @@ TBitmap32 DecodeJpeg(Bytes data, std::int64_t maxPixels) {
   if (!RunDecoder(d, data, maxPixels, result, inkRows, sizeProblem)) {
     throw PictureFileError(std::string("Cannot read the JPEG picture: ") + d.err.message);
   }
-  if (!sizeProblem.empty()) {
-    CheckPictureSize(d.cinfo.image_width, d.cinfo.image_height, maxPixels, "JPEG");
-  }
+  if (!sizeProblem.empty()) throw PictureFileError(sizeProblem);
   return result;
 }
 

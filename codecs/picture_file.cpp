@@ -4,59 +4,87 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include <cctype>
+#include <algorithm>
 #include <cerrno>
 #include <cstring>
 #include <new>
 
 #include "codecs/atomic_file.h"
 #include "codecs/codec_internal.h"
+#include "imaging/memory_budget.h"
 
 namespace quillane {
 namespace codecs {
 
 void CheckPictureSize(std::int64_t width, std::int64_t height, std::int64_t maxPixels,
-                      const char* what) {
+                      const char* what, int extraBytesPerPixel) {
+  const std::string size = std::to_string(width) + " by " + std::to_string(height);
   if (width <= 0 || height <= 0) {
-    throw PictureFileError(std::string("The ") + what + " picture has no valid size (" +
-                           std::to_string(width) + " by " + std::to_string(height) + ")");
+    throw PictureFileError(std::string("The ") + what + " picture has no valid size (" + size +
+                           ")");
   }
   // Each side is at most 2^32 here, so the product cannot overflow.
   if (width > 0xFFFFFFFFll || height > 0xFFFFFFFFll || width * height > maxPixels) {
-    throw PictureFileError(std::string("The ") + what + " picture is " + std::to_string(width) +
-                           " by " + std::to_string(height) + " pixels, more than the " +
-                           std::to_string(maxPixels) + " pixels a picture may have");
+    throw PictureFileError(std::string("The ") + what + " picture is " + size +
+                           " pixels, more than the " + std::to_string(maxPixels) +
+                           " pixels a picture may have");
+  }
+  try {
+    CheckMemoryFor(width, height, std::string("The ") + what + " picture", extraBytesPerPixel);
+  } catch (const NotEnoughMemory& e) {
+    throw PictureFileError(e.what());
   }
 }
 
 std::vector<std::uint8_t> ReadWholeFile(const std::string& path) {
   // Far beyond the largest picture file of any accepted size.
   constexpr std::int64_t kMaxFileSize = std::int64_t{2} << 30;
-  const int fd = ::open(path.c_str(), O_RDONLY | O_CLOEXEC);
-  if (fd < 0) throw PictureFileError(std::string("Cannot read the file: ") + std::strerror(errno));
+  auto fail = [&](int error) {
+    return PictureFileError("Cannot read \"" + path + "\": " + std::strerror(error));
+  };
+  const int fd = ::open(path.c_str(), O_RDONLY | O_NONBLOCK | O_NOCTTY | O_CLOEXEC);
+  if (fd < 0) {
+    if (errno == ENXIO) throw PictureFileError(path + " is not a picture file");  // a socket
+    throw fail(errno);
+  }
   struct Closer {
     int fd;
     ~Closer() { ::close(fd); }
   } closer{fd};
   struct stat info {};
-  if (::fstat(fd, &info) != 0) {
-    throw PictureFileError(std::string("Cannot read the file: ") + std::strerror(errno));
+  if (::fstat(fd, &info) != 0) throw fail(errno);
+  if (!S_ISREG(info.st_mode)) throw PictureFileError(path + " is not a picture file");
+  if (info.st_size > kMaxFileSize) {
+    throw PictureFileError("\"" + path + "\" is too large to be a picture");
   }
-  if (!S_ISREG(info.st_mode)) throw PictureFileError("Cannot read the file: not a regular file");
-  if (info.st_size > kMaxFileSize) throw PictureFileError("The file is too large to be a picture");
   std::vector<std::uint8_t> bytes(static_cast<std::size_t>(info.st_size));
   std::size_t done = 0;
   while (done < bytes.size()) {
     const ssize_t got = ::read(fd, bytes.data() + done, bytes.size() - done);
     if (got < 0) {
       if (errno == EINTR) continue;
-      throw PictureFileError(std::string("Cannot read the file: ") + std::strerror(errno));
+      throw fail(errno);
     }
     if (got == 0) break;  // the file shrank while being read
     done += static_cast<std::size_t>(got);
   }
   bytes.resize(done);
   return bytes;
+}
+
+std::string SniffFamily(Bytes data) {
+  auto starts = [&](std::initializer_list<std::uint8_t> head) {
+    return data.size() >= head.size() && std::equal(head.begin(), head.end(), data.begin());
+  };
+  if (starts({0xFF, 0xD8, 0xFF})) return "JPEG";
+  if (starts({0x89, 'P', 'N', 'G'})) return "PNG";
+  if (starts({'G', 'I', 'F', '8'})) return "GIF";
+  if (starts({'B', 'M'})) return "bitmap";
+  if (starts({0, 0, 1, 0})) return "icon";
+  if (starts({0xD7, 0xCD, 0xC6, 0x9A}) || starts({1, 0, 9, 0}) || starts({2, 0, 9, 0}) ||
+      LooksLikeEnhancedMetafile(data))
+    return "metafile";
+  return "";
 }
 
 std::uint64_t Dib24BitsSize(const TBitmap32& picture) {
@@ -117,26 +145,31 @@ void EncodeBitmap24(const TBitmap32& picture, ByteSink& sink) {
 
 namespace {
 
-std::string TypeKey(const std::string& path) {
-  std::string key = path.size() > 4 ? path.substr(path.size() - 4) : path;
-  for (char& c : key) c = static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
-  return key;
-}
-
-bool FileExists(const std::string& path) {
+bool Exists(const std::string& path) {
   struct stat info {};
-  return ::stat(path.c_str(), &info) == 0 && S_ISREG(info.st_mode);
+  return ::stat(path.c_str(), &info) == 0;
 }
 
+// Every failure names the file, and one whose content is another known family says so: a JPEG
+// under a .gif name is otherwise only "not a valid GIF picture".
 template <typename Decoder>
-TBitmap32 Decode(const std::string& path, Decoder decode) {
+std::optional<TBitmap32> Decode(const std::string& path, const char* family, Decoder decode) {
+  if (!Exists(path)) return std::nullopt;
+  std::vector<std::uint8_t> bytes;
   try {
-    const std::vector<std::uint8_t> bytes = codecs::ReadWholeFile(path);
+    bytes = codecs::ReadWholeFile(path);
     return decode(codecs::Bytes(bytes));
   } catch (const PictureFileError& error) {
-    throw PictureFileError("\"" + path + "\": " + error.what());
+    std::string text = error.what();
+    const std::string found = codecs::SniffFamily(bytes);
+    if (!found.empty() && found != family) {
+      text = "the file holds a " + found + " picture, not a " + family + " one (" + text + ")";
+    }
+    if (text.find(path) != std::string::npos) throw;
+    throw PictureFileError("\"" + path + "\": " + text);
   } catch (const std::bad_alloc&) {
-    throw PictureFileError("\"" + path + "\": there is not enough memory to open the picture");
+    throw PictureFileError("\"" + path + "\": there is not enough memory to open the picture (" +
+                           MemoryAmount(AvailableMemory()) + " are available)");
   }
 }
 
@@ -158,31 +191,35 @@ void SaveAtomically(const TBitmap32& picture, const std::string& path, Encoder e
 }  // namespace
 
 std::optional<TBitmap32> LoadPictureFile(const std::string& path, const LoaderNotice& notice) {
-  if (!FileExists(path)) return std::nullopt;
-  const std::string key = TypeKey(path);
+  const std::string key = AsciiLower(path.size() > 4 ? path.substr(path.size() - 4) : path);
   using codecs::Bytes;
-  if (key == ".BMP") {
-    return Decode(path, [](Bytes b) { return DecodeWithQt(b, codecs::QtFormat::kBitmap); });
+  using codecs::QtFormat;
+  if (key == ".bmp") {
+    return Decode(path, "bitmap", [](Bytes b) { return DecodeWithQt(b, QtFormat::kBitmap); });
   }
-  if (key == ".ICO") {
+  if (key == ".ico") {
     try {
-      const std::vector<std::uint8_t> bytes = codecs::ReadWholeFile(path);
-      return codecs::DecodeWithQt(bytes, codecs::QtFormat::kIcon);
+      return Decode(path, "icon", [](Bytes b) { return DecodeWithQt(b, QtFormat::kIcon); });
     } catch (const std::exception& error) {
       if (notice) notice("Exit", "Input picture" + path + "Error." + error.what());
       return TBitmap32();
     }
   }
-  if (key == ".JPG" || key == "JPEG") {
-    return Decode(path, [](Bytes b) { return codecs::DecodeJpeg(b); });
+  if (key == ".jpg" || key == "jpeg") {
+    return Decode(path, "JPEG", [](Bytes b) { return codecs::DecodeJpeg(b); });
   }
-  if (key == ".GIF") {
-    return Decode(path, [](Bytes b) { return DecodeWithQt(b, codecs::QtFormat::kGif); });
+  if (key == ".gif") {
+    return Decode(path, "GIF", [](Bytes b) { return DecodeWithQt(b, QtFormat::kGif); });
   }
-  if (key == ".WMF" || key == ".EMF") {
-    return Decode(path, [](Bytes b) { return codecs::DecodeMetafile(b); });
+  if (key == ".wmf" || key == ".emf") {
+    return Decode(path, "metafile", [](Bytes b) { return codecs::DecodeMetafile(b); });
   }
+  if (!Exists(path)) return std::nullopt;
   return TBitmap32();
+}
+
+std::optional<TBitmap32> LoadPng(const std::string& path) {
+  return Decode(path, "PNG", [](codecs::Bytes b) { return codecs::DecodePng(b); });
 }
 
 void SaveJpeg(const TBitmap32& picture, const std::string& path, int quality) {
@@ -213,6 +250,13 @@ std::string ReplaceExtension(const std::string& name, const std::string& extensi
   const auto last = name.find_last_of(".\\/:");
   if (last != std::string::npos && name[last] == '.') return name.substr(0, last) + extension;
   return name + extension;
+}
+
+std::string AsciiLower(std::string_view text) {
+  std::string lower(text);
+  for (char& c : lower)
+    if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
+  return lower;
 }
 
 }  // namespace quillane

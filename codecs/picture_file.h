@@ -6,6 +6,7 @@
 #include <optional>
 #include <stdexcept>
 #include <string>
+#include <string_view>
 
 #include "imaging/bitmap32.h"
 
@@ -25,13 +26,19 @@ using LoaderNotice = std::function<void(const std::string& caption, const std::s
 // in upper case: ".BMP", ".ICO", ".JPG" or "JPEG", ".GIF", ".WMF" or ".EMF".
 // - std::nullopt when no file exists at path;
 // - an empty bitmap for any other ending;
+// - PictureFileError "<path> is not a picture file" for a folder, FIFO, device or socket;
 // - otherwise the decoded 32-bit picture. Its alpha bytes are whatever the decoder gives;
 //   callers set them to 255.
-// A corrupt file or a picture larger than TBitmap32::kMaxPixels throws PictureFileError; an
+// A corrupt file, a picture larger than TBitmap32::kMaxPixels or one that would not fit in the
+// memory available (the message says how much it needs) throws PictureFileError; an
 // icon that cannot be read is reported through notice (caption "Exit") and gives an empty
 // bitmap.
 std::optional<TBitmap32> LoadPictureFile(const std::string& path,
                                          const LoaderNotice& notice = nullptr);
+
+// A PNG file (not one of the program's own input types; the command line reads it), alpha kept
+// as stored. Throws PictureFileError as LoadPictureFile does; std::nullopt when no file exists.
+std::optional<TBitmap32> LoadPng(const std::string& path);
 
 // Writers. Each writes beside the target and renames over it only when complete, so a failed
 // write leaves any existing file as it was. They throw PictureFileError.
@@ -43,5 +50,9 @@ void SavePng(const TBitmap32& picture, const std::string& path);  // keeps the a
 // If the name's last ".", "\" or "/" or ":" is a ".", everything from that dot on is replaced
 // by extension (given with its dot); otherwise extension is appended.
 std::string ReplaceExtension(const std::string& name, const std::string& extension);
+
+// text with A..Z made a..z and every other byte left alone (file names are bytes, not letters
+// of any locale).
+std::string AsciiLower(std::string_view text);
 
 }  // namespace quillane

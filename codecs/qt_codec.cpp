@@ -8,7 +8,6 @@
 #include <cstdlib>
 #include <cstring>
 #include <limits>
-#include <mutex>
 
 #include "codecs/codec_internal.h"
 
@@ -40,14 +39,12 @@ const char* FamilyName(QtFormat format) {
 }
 
 // Qt refuses decoded images above a process-wide limit (128 MB by default, less than a
-// 50-megapixel photo in 32 bits). Our own limit is checked from the header before reading, so
-// Qt's is raised to exactly what the largest accepted picture needs in 32 bits.
-void RaiseQtAllocationLimit() {
-  static std::once_flag once;
-  std::call_once(once, [] {
-    constexpr std::int64_t kMegabyte = 1024 * 1024;
-    QImageReader::setAllocationLimit(static_cast<int>(TBitmap32::kMaxPixels * 4 / kMegabyte + 1));
-  });
+// 50-megapixel photo in 32 bits). It is set for each picture to what the size checked from its
+// header needs in 32 bits, so that content asking Qt for more than the header said is refused
+// rather than allowed up to the largest picture the program accepts.
+void LimitQtAllocation(std::int64_t pixels) {
+  constexpr std::int64_t kMegabyte = 1024 * 1024;
+  QImageReader::setAllocationLimit(static_cast<int>(pixels * 4 / kMegabyte + 1));
 }
 
 int BitDepth(QImage::Format format) {
@@ -70,6 +67,15 @@ int BitDepth(QImage::Format format) {
       return 0;
     default:
       return 32;
+  }
+}
+
+// A directory of more entries than the file holds would have Qt look at (and warn about) each of
+// up to 65535 made-up entries, tens of milliseconds a file (found by fuzzing).
+void CheckIconDirectory(Bytes data) {
+  if (data.size() < 6 ||
+      6 + 16 * (std::size_t{data[4]} | std::size_t{data[5]} << 8) > data.size()) {
+    throw PictureFileError("The file is not a valid icon picture (its directory is cut short)");
   }
 }
 
@@ -154,21 +160,62 @@ void CheckBitmapHeaders(Bytes data, std::int64_t maxPixels) {
   }
 }
 
-// A GIF is rendered on its logical screen, whatever the size of its first frame.
-void CheckGifScreen(Bytes data, std::int64_t maxPixels) {
-  if (data.size() < 10) throw PictureFileError("The file is not a valid GIF picture");
-  const std::int64_t width = Little(data, 6, 2), height = Little(data, 8, 2);
-  if (width > 0 && height > 0) CheckPictureSize(width, height, maxPixels, "GIF");
+// Qt renders a GIF's first frame on the whole logical screen that the header declares, so a
+// 27 KB file claiming a 16000 by 16000 screen would take gigabytes. The screen is cut back to
+// the right and bottom edges of the first frame (what lies beyond them is only background), in
+// a copy handed to the reader. Headers that no encoder writes are refused on the way: another
+// signature, or an LZW code size above 8 bits, which Qt would quietly render as white.
+std::vector<std::uint8_t> GifWithFittedScreen(Bytes data, std::int64_t maxPixels) {
+  const auto bad = [](const char* why) {
+    return PictureFileError(std::string("The file is not a valid GIF picture (") + why + ")");
+  };
+  if (data.size() < 13) throw bad("it ends inside its header");
+  if (!std::equal(data.begin(), data.begin() + 6, "GIF87a") &&
+      !std::equal(data.begin(), data.begin() + 6, "GIF89a"))
+    throw bad("its signature is neither GIF87a nor GIF89a");
+  const auto table = [](std::uint8_t flags) {
+    return flags & 0x80 ? std::size_t{3} << ((flags & 7) + 1) : 0;
+  };
+  std::size_t at = 13 + table(data[10]);
+  while (true) {
+    if (at >= data.size()) throw bad("it holds no picture");
+    if (data[at] == 0x21) {  // extension: label, then sub-blocks up to an empty one
+      at += 2;
+      while (at < data.size() && data[at] != 0) at += std::size_t{data[at]} + 1;
+      ++at;
+      continue;
+    }
+    if (data[at] != 0x2C) throw bad("it holds no picture");
+    if (data.size() < at + 11) throw bad("it ends inside a frame header");
+    const std::size_t codeSizeAt = at + 10 + table(data[at + 9]);
+    if (codeSizeAt >= data.size()) throw bad("it ends inside a frame header");
+    if (data[codeSizeAt] > 8) throw bad("its LZW code size is above 8 bits");
+    const std::int64_t right = std::int64_t{Little(data, at + 1, 2)} + Little(data, at + 5, 2);
+    const std::int64_t bottom = std::int64_t{Little(data, at + 3, 2)} + Little(data, at + 7, 2);
+    const std::int64_t width = std::min<std::int64_t>(Little(data, 6, 2), right);
+    const std::int64_t height = std::min<std::int64_t>(Little(data, 8, 2), bottom);
+    constexpr int kReaderBytesPerPixel = 8;
+    CheckPictureSize(width, height, maxPixels, "GIF", kReaderBytesPerPixel);
+    std::vector<std::uint8_t> fitted(data.begin(), data.end());
+    std::uint8_t* size = fitted.data() + 6;
+    Put16(size, static_cast<std::uint16_t>(width));
+    Put16(size, static_cast<std::uint16_t>(height));
+    return fitted;
+  }
 }
 
 }  // namespace
 
 TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
-  RaiseQtAllocationLimit();
   const char* family = FamilyName(format);
   if (data.empty()) throw PictureFileError(std::string("The ") + family + " file is empty");
   if (data.size() > static_cast<std::size_t>(std::numeric_limits<int>::max())) {
     throw PictureFileError(std::string("The ") + family + " file is too large");
+  }
+  std::vector<std::uint8_t> fittedGif;
+  if (format == QtFormat::kGif) {
+    fittedGif = GifWithFittedScreen(data, maxPixels);
+    data = fittedGif;
   }
   // The reader only looks at the bytes; no copy is made.
   const QByteArray bytes = QByteArray::fromRawData(reinterpret_cast<const char*>(data.data()),
@@ -181,21 +228,22 @@ TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
   reader.setDecideFormatFromContent(false);
   reader.setAutoTransform(false);
   if (format == QtFormat::kBitmap) CheckBitmapHeaders(data, maxPixels);
-  if (format == QtFormat::kGif) CheckGifScreen(data, maxPixels);
   if (!reader.canRead()) {
     throw PictureFileError(std::string("The file is not a valid ") + family + " picture");
   }
   if (format == QtFormat::kIcon) {
+    CheckIconDirectory(data);
     const int entry = ChooseIconEntry(reader);
     if (entry < 0 || !reader.jumpToImage(entry)) {
       throw PictureFileError("The icon file holds no readable picture");
     }
   }
   const QSize size = reader.size();
-  if (size.width() <= 0 || size.height() == 0) {
-    throw PictureFileError(std::string("The ") + family + " picture has no valid size");
-  }
-  CheckPictureSize(size.width(), std::abs(std::int64_t{size.height()}), maxPixels, family);
+  // The reader's QImage and, for the formats it does not give in 32 bits, a converted copy.
+  constexpr int kReaderBytesPerPixel = 8;
+  const std::int64_t height = std::abs(std::int64_t{size.height()});
+  CheckPictureSize(size.width(), height, maxPixels, family, kReaderBytesPerPixel);
+  LimitQtAllocation(size.width() * height);
 
   QImage image;
   if (!reader.read(&image) || image.isNull()) {

@@ -3,15 +3,15 @@
 namespace quillane {
 
 PictureDocument::PictureDocument(TBitmap32 picture) {
+  const Picture empty = Share(TBitmap32());
+  slots_.fill(empty);
   Load(std::move(picture));
   ResetHistory();
 }
 
 void PictureDocument::Load(TBitmap32 picture) {
   SetAlphaChannel(picture, 255);
-  working_ = picture;
-  source_ = picture;
-  opened_ = std::move(picture);
+  working_ = source_ = opened_ = Share(std::move(picture));
 }
 
 void PictureDocument::Backup() {
@@ -24,10 +24,13 @@ void PictureDocument::Backup() {
 void PictureDocument::RestoreCurrentSlot() {
   working_ = slots_[static_cast<std::size_t>(currentSlot_ - 1)];
   // Only the widths are compared: a change of height alone leaves the source as it is.
-  if (working_.Width() != source_.Width() && !source_.Empty()) {
-    const long double heightFactor = static_cast<long double>(working_.Height()) / source_.Height();
-    const long double widthFactor = static_cast<long double>(working_.Width()) / source_.Width();
-    ZoomInandOut(source_, heightFactor, widthFactor);
+  if (working_->Width() != source_->Width() && !source_->Empty()) {
+    const long double heightFactor =
+        static_cast<long double>(working_->Height()) / source_->Height();
+    const long double widthFactor = static_cast<long double>(working_->Width()) / source_->Width();
+    TBitmap32 resampled = *source_;
+    ZoomInandOut(resampled, heightFactor, widthFactor);
+    source_ = Share(std::move(resampled));
   }
 }
 

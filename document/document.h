@@ -1,10 +1,15 @@
 // The picture document: the working picture the user sees, the source picture every effect
 // reads, the picture as last opened, and the ring of history slots that Undo and Redo walk.
 // Plain C++; the main window owns one and shows it.
+//
+// The pictures are shared, never copied: after opening, the working, source and opened picture
+// and the first history slot are one bitmap in memory, and each history step holds the result
+// it recorded. A picture is only ever replaced as a whole, so sharing is invisible to callers.
 #pragma once
 
 #include <array>
 #include <cstdint>
+#include <memory>
 
 #include "imaging/bitmap32.h"
 
@@ -19,14 +24,14 @@ class PictureDocument {
   // slot 1.
   explicit PictureDocument(TBitmap32 picture = TBitmap32());
 
-  const TBitmap32& Working() const { return working_; }
-  const TBitmap32& Source() const { return source_; }
-  const TBitmap32& Opened() const { return opened_; }
+  const TBitmap32& Working() const { return *working_; }
+  const TBitmap32& Source() const { return *source_; }
+  const TBitmap32& Opened() const { return *opened_; }
 
   // Effects write their result here; record it with Backup afterwards.
-  void SetWorking(TBitmap32 picture) { working_ = std::move(picture); }
+  void SetWorking(TBitmap32 picture) { working_ = Share(std::move(picture)); }
   // Rotation and resizing change the source picture as well.
-  void SetSource(TBitmap32 picture) { source_ = std::move(picture); }
+  void SetSource(TBitmap32 picture) { source_ = Share(std::move(picture)); }
 
   // Makes picture (alpha set to 255) the working, source and opened picture, as loading a file
   // does. The history is left alone; opening a file follows this with ResetHistory.
@@ -50,19 +55,23 @@ class PictureDocument {
   int UndoCount() const { return undoCount_; }
   int RedoCount() const { return redoCount_; }
   int CurrentSlot() const { return currentSlot_; }  // 1..21
-  const TBitmap32& Slot(int slot) const { return slots_.at(static_cast<std::size_t>(slot - 1)); }
+  const TBitmap32& Slot(int slot) const { return *slots_.at(static_cast<std::size_t>(slot - 1)); }
 
   // The random generator state the effects that draw continue: 0 when the document is made,
   // never reseeded by loading or history, so every run follows on from the one before.
   std::uint32_t& RandomState() { return randomState_; }
 
  private:
+  using Picture = std::shared_ptr<const TBitmap32>;
+  static Picture Share(TBitmap32 picture) {
+    return std::make_shared<const TBitmap32>(std::move(picture));
+  }
   void RestoreCurrentSlot();
 
-  TBitmap32 working_;
-  TBitmap32 source_;
-  TBitmap32 opened_;
-  std::array<TBitmap32, kSlots> slots_;
+  Picture working_;
+  Picture source_;
+  Picture opened_;
+  std::array<Picture, kSlots> slots_;
   int currentSlot_ = 1;
   int undoCount_ = 0;
   int redoCount_ = 0;

@@ -232,6 +232,8 @@ int main(int argc, char** argv) {
     Save(folder, "gif", 0, Gif(false, false));
     Save(folder, "gif", 1, Gif(true, true));
     Save(folder, "wmf", 0, Wmf());
+    Save(folder, "png", 0, c::EncodePng(picture));
+    Save(folder, "png", 1, c::EncodePng(Pattern(3, 2)));
 
     c::MemorySink emf;
     c::EncodeEnhancedMetafile(picture, emf);

@@ -221,6 +221,31 @@ TEST_F(BatchFolder, UnloadableEntriesAreSkippedWithoutAnOutputFile) {
   EXPECT_TRUE(recorder.messages.empty());
 }
 
+// a.JPG, a.jpg and a.bmp once wrote one output in turn ("Converted 3 of 3"), and with the output
+// folder the input folder, an input named like another's output was overwritten.
+TEST_F(BatchFolder, OutputsAlreadyWrittenOrListedAsInputsAreNeverOverwritten) {
+  for (const char* name : {"a.JPG", "a.jpg", "x-PencilSketch.jpg", "x.jpg"})
+    SaveJpeg(Picture(8, 8, name[1]), In(name));
+  SaveBitmap24(Picture(8, 8, 3), In("a.bmp"));
+  const std::string input = ReadBytes(In("x-PencilSketch.jpg"));
+  PictureDocument document;
+  const BatchResult result =
+      ConvertBatch(document, Pencil(), EffectParams(), {in_, in_, ScanBatchFolder(in_)});
+  EXPECT_EQ(result.outputs, (std::vector<std::string>{In("a-PencilSketch.jpg"),
+                                                      In("x-PencilSketch-PencilSketch.jpg")}));
+  ASSERT_EQ(result.skipped.size(), 3u);
+  const std::pair<std::string, std::string> want[] = {
+      {"a.jpg", "already written for a.JPG"},
+      {"x.jpg", "is one of the pictures being converted"},
+      {"a.bmp", "already written for a.JPG"}};
+  for (std::size_t i = 0; i < 3; ++i) {
+    EXPECT_EQ(result.skipped[i].name, want[i].first);
+    EXPECT_NE(result.skipped[i].reason.find(want[i].second), std::string::npos)
+        << result.skipped[i].reason;
+  }
+  EXPECT_EQ(ReadBytes(In("x-PencilSketch.jpg")), input);
+}
+
 TEST_F(BatchFolder, HistoryGrowsPerPictureOnlyForEffectsThatRecordBatchSteps) {
   SaveBitmap24(Picture(10, 7, 7), In("a.bmp"));
   SaveBitmap24(Picture(11, 8, 8), In("b.bmp"));

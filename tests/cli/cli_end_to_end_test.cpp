@@ -3,7 +3,6 @@
 #include <stdlib.h>
 #include <sys/wait.h>
 
-#include <QImage>
 #include <filesystem>
 #include <fstream>
 #include <iterator>
@@ -45,8 +44,8 @@ class CliRun : public ::testing::Test {
 
   // Runs quillane-cli with arguments (already quoted as the shell needs); its exit code, with
   // out_ and err_ holding what it printed.
-  int Run(const std::string& arguments) {
-    const std::string command = std::string("'") + QUILLANE_CLI_PATH + "' " + arguments + " >'" +
+  int Run(const std::string& arguments, const std::string& shellPrefix = "") {
+    const std::string command = shellPrefix + "'" + QUILLANE_CLI_PATH + "' " + arguments + " >'" +
                                 Path("stdout.txt") + "' 2>'" + Path("stderr.txt") + "'";
     const int status = std::system(command.c_str());
     out_ = ReadText(Path("stdout.txt"));
@@ -70,32 +69,12 @@ TBitmap32 Picture(int width, int height) {
 }
 
 TBitmap32 FromPng(const std::string& path) {
-  QImage image(QString::fromStdString(path), "png");
-  image = image.convertToFormat(QImage::Format_ARGB32);
-  TBitmap32 p(image.width(), image.height());
-  for (int y = 0; y < image.height(); ++y)
-    for (int x = 0; x < image.width(); ++x) {
-      const QRgb c = image.pixel(x, y);
-      p.At(x, y) = Pixel{static_cast<std::uint8_t>(qBlue(c)), static_cast<std::uint8_t>(qGreen(c)),
-                         static_cast<std::uint8_t>(qRed(c)), static_cast<std::uint8_t>(qAlpha(c))};
-    }
-  return p;
+  return LoadPng(path).value_or(TBitmap32());
 }
 
 TBitmap32 Pencil(TBitmap32 picture, PencilToneMode mode, int contrast, int lighting) {
   SetAlphaChannel(picture, 255);
   return peccilsketch(picture, mode, contrast, lighting);
-}
-
-void ExpectSameColours(const TBitmap32& a, const TBitmap32& b) {
-  ASSERT_EQ(a.Width(), b.Width());
-  ASSERT_EQ(a.Height(), b.Height());
-  for (int y = 0; y < a.Height(); ++y)
-    for (int x = 0; x < a.Width(); ++x) {
-      const Pixel p = a.At(x, y);
-      const Pixel q = b.At(x, y);
-      ASSERT_TRUE(p.r == q.r && p.g == q.g && p.b == q.b) << x << "," << y;
-    }
 }
 
 TEST_F(CliRun, ApplyWritesExactlyWhatTheRoutineGives) {
@@ -108,8 +87,7 @@ TEST_F(CliRun, ApplyWritesExactlyWhatTheRoutineGives) {
 
   ASSERT_EQ(Run("apply pencil-sketch --contrast=30 " + Q("in.bmp") + " -o " + Q("out.BMP")), 0)
       << err_;
-  ExpectSameColours(*LoadPictureFile(Path("out.BMP")),
-                    Pencil(loaded, PencilToneMode::Contrast, 30, 128));
+  EXPECT_EQ(*LoadPictureFile(Path("out.BMP")), Pencil(loaded, PencilToneMode::Contrast, 30, 128));
 
   // A JPEG output is the same file our own encoder makes of the result.
   ASSERT_EQ(Run("apply pencil-sketch " + Q("in.bmp") + " -o " + Q("out.jpeg")), 0) << err_;
@@ -134,13 +112,43 @@ TEST_F(CliRun, BadParametersExitWithTwoAndUnreadableInputWithOneWritingNothing) 
   EXPECT_EQ(Run("frobnicate"), 2);
 
   std::ofstream(Path("broken.jpg"), std::ios::binary) << "\xFF\xD8\xFF not really";
-  std::ofstream(Path("broken.png"), std::ios::binary) << "\x89PNG nothing";
+  // A true header, then image data that does not inflate: libpng printed its own line for it.
+  std::ofstream(Path("broken.png"), std::ios::binary) << std::string(
+      "\x89PNG\r\n\x1a\n\0\0\0\rIHDR\0\0\0\x10\0\0\0\x10\x08\x02\0\0\0\x90\x91h6"
+      "\0\0\0\x05IDATxxxxx\0\0\0\0",
+      46);
   std::ofstream(Path("picture.tga"), std::ios::binary) << "whatever";
   for (const char* name : {"broken.jpg", "broken.png", "picture.tga", "missing.bmp"}) {
     EXPECT_EQ(Run("apply pencil-sketch " + Q(name) + " -o " + Q("o.png")), 1) << name;
     EXPECT_NE(err_.find(Path(name)), std::string::npos) << err_;
+    EXPECT_EQ(err_.find("libpng"), std::string::npos) << err_;
   }
   EXPECT_FALSE(fs::exists(Path("o.png")));
+}
+
+// Running out of memory ended in std::terminate, and a batch died without its summary.
+TEST_F(CliRun, PictureTooLargeForTheMemoryLimitIsAMessageAndTheBatchGoesOn) {
+#if defined(__SANITIZE_ADDRESS__)
+  GTEST_SKIP() << "no address-space limit under ASan";
+#endif
+  fs::create_directory(Path("in"));
+  SaveJpeg(Picture(20, 15), Path("in/a.jpg"));
+  // 7000 x 7000 pixels announced by a small file's header.
+  std::string big = ReadText(Path("in/a.jpg"));
+  const std::size_t frame = big.find("\xFF\xC0");
+  ASSERT_NE(frame, std::string::npos);
+  big.replace(frame + 5, 4, "\x1B\x58\x1B\x58");
+  std::ofstream(Path("in/big.jpg"), std::ios::binary) << big;
+  const std::string limit = "ulimit -v 600000; ";
+  EXPECT_EQ(
+      Run("apply pencil-sketch '" + Path("in/big.jpg") + "' -o '" + Path("o.png") + "'", limit), 1);
+  EXPECT_NE(err_.find(Path("in/big.jpg")), std::string::npos) << err_;
+  EXPECT_NE(err_.find("7000 by 7000 pixels needs 748 MB; "), std::string::npos) << err_;
+  EXPECT_EQ(
+      Run("batch pencil-sketch --input '" + Path("in") + "' --output '" + Path("out") + "'", limit),
+      1);
+  EXPECT_NE(out_.find("Converted 1 of 2 pictures"), std::string::npos) << out_;
+  EXPECT_NE(err_.find("big.jpg: "), std::string::npos) << err_;
 }
 
 TEST_F(CliRun, ListShowsEveryEffectWithRangesAndDefaults) {
@@ -208,10 +216,16 @@ TEST_F(CliRun, BatchConvertsTheFolderAndListsSkippedFiles) {
   EXPECT_EQ(ReadText(out + "/b-PencilSketch.jpg"), ReadText(Path("expected.jpg")));
   EXPECT_TRUE(fs::is_regular_file(out + "/a-PencilSketch.jpg"));
 
-  std::ofstream(Path("in/x.jpg"), std::ios::binary) << "not a picture";
-  EXPECT_EQ(batch("", "in"), 1);
-  EXPECT_NE(err_.find("Skipped 1 picture:\n  x.jpg: "), std::string::npos) << err_;
-  EXPECT_FALSE(fs::exists(out + "/x-PencilSketch.jpg"));
+  // A name that is not UTF-8 and holds an escape sequence is shown escaped, never raw.
+  std::ofstream(Path("in/x\x1b[2J\xff.jpg"), std::ios::binary) << "not a picture";
+  EXPECT_EQ(Run("batch pencil-sketch --input '" + Path("in") + "' --output '" + out + "'"), 1);
+  EXPECT_NE(err_.find("Skipped 1 picture:\n  x\\x1b[2J\\xff.jpg: "), std::string::npos) << err_;
+  EXPECT_EQ(err_.find('\x1b'), std::string::npos);
+  fs::remove(out + "/b-PencilSketch.jpg");
+  fs::create_directory(out + "/b-PencilSketch.jpg");
+  EXPECT_EQ(Run("batch pencil-sketch --input '" + Path("in") + "' --output '" + out + "'"), 1);
+  EXPECT_NE(err_.find("Stopped before the end; 1 picture was not converted."), std::string::npos)
+      << err_;
 
   EXPECT_EQ(batch("", "nowhere"), 1);
   EXPECT_NE(err_.find("Sorry: Input Director in not exist."), std::string::npos) << err_;

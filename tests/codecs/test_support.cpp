@@ -1,5 +1,6 @@
 #include "tests/codecs/test_support.h"
 
+#include <sys/resource.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -139,6 +140,16 @@ std::vector<std::uint8_t> LzwLiterals(const std::vector<std::uint8_t>& indices, 
 }
 
 }  // namespace
+
+void LimitAddressSpaceGrowth(std::uint64_t extraBytes) {
+  std::ifstream statm("/proc/self/statm");
+  std::uint64_t pages = 0;
+  statm >> pages;
+  rlimit limit{};
+  ::getrlimit(RLIMIT_AS, &limit);
+  limit.rlim_cur = pages * ::sysconf(_SC_PAGESIZE) + extraBytes;
+  if (::setrlimit(RLIMIT_AS, &limit) != 0) std::abort();
+}
 
 std::vector<std::uint8_t> GifFile(int screenWidth, int screenHeight, int left, int top, int width,
                                   int height, const std::vector<std::uint8_t>& paletteRgb,

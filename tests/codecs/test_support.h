@@ -44,10 +44,6 @@ struct ByteWriter {
     bytes.insert(bytes.end(), text.begin(), text.end());
     return *this;
   }
-  ByteWriter& PadTo4() {
-    while (bytes.size() % 4 != 0) U8(0);
-    return *this;
-  }
   std::size_t Size() const { return bytes.size(); }
   void PatchU32(std::size_t at, std::uint32_t v) {
     for (int i = 0; i < 4; ++i) bytes[at + i] = static_cast<std::uint8_t>(v >> (8 * i));
@@ -55,6 +51,15 @@ struct ByteWriter {
 };
 
 void WriteBytes(const std::string& path, const std::vector<std::uint8_t>& bytes);
+
+// For a death test's child: lets the process grow by only extraBytes of address space.
+void LimitAddressSpaceGrowth(std::uint64_t extraBytes);
+// AddressSanitizer reserves terabytes of address space up front, so no limit can be set there.
+#if defined(__SANITIZE_ADDRESS__)
+#define QUILLANE_SKIP_UNDER_ADDRESS_LIMIT() GTEST_SKIP() << "no address-space limit under ASan"
+#else
+#define QUILLANE_SKIP_UNDER_ADDRESS_LIMIT() (void)0
+#endif
 std::vector<std::uint8_t> ReadBytes(const std::string& path);
 
 constexpr Pixel kRed{0, 0, 255, 255};

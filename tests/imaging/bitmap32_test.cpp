@@ -6,6 +6,7 @@
 #include <cmath>
 #include <limits>
 #include <set>
+#include <tuple>
 
 namespace quillane {
 namespace {
@@ -149,14 +150,13 @@ TEST(ZoomInandOut, UnitFactorsKeepThePictureAndNewSizesAreTruncated) {
   TBitmap32 b = Numbered(7, 4);
   ZoomInandOut(b, 1.0L, 1.0L);
   EXPECT_EQ(b, Numbered(7, 4));
-  b = Numbered(5, 3);
-  ZoomInandOut(b, 1.0L, 0.5L);
-  EXPECT_EQ(b.Width(), 2);
-  EXPECT_EQ(b.Height(), 3);
-  b = Numbered(10, 10);
-  ZoomInandOut(b, 0.99L, 1.55L);
-  EXPECT_EQ(b.Width(), 15);
-  EXPECT_EQ(b.Height(), 9);
+  for (const auto& [w, h, hf, wf, nw, nh] :
+       {std::tuple{5, 3, 1.0L, 0.5L, 2, 3}, {10, 10, 0.99L, 1.55L, 15, 9}}) {
+    TBitmap32 c = Numbered(w, h);
+    ZoomInandOut(c, hf, wf);
+    EXPECT_EQ(c.Width(), nw);
+    EXPECT_EQ(c.Height(), nh);
+  }
 }
 
 TEST(ZoomInandOut, SizesOfZeroOrBelowOrNotANumberGiveEmpty) {
