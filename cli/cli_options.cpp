@@ -4,6 +4,8 @@
 #include <map>
 #include <optional>
 
+#include "codecs/picture_file.h"
+
 namespace quillane::cli {
 namespace {
 
@@ -18,12 +20,6 @@ ParseResult Plain(Command command) {
   ParseResult r;
   r.options.command = command;
   return r;
-}
-
-std::string Lower(std::string s) {
-  for (char& c : s)
-    if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
-  return s;
 }
 
 // The parameters a user can give for effect.
@@ -138,7 +134,7 @@ ParseResult ParseEffectCommand(Command command, const std::vector<std::string>& 
                                                              : "folder"));
       if (isFormat) {
         if (!o.format.empty()) return Fail("--format given twice");
-        o.format = Lower(*value);
+        o.format = AsciiLower(*value);
         if (OutputTypeFor("x." + o.format) == OutputType::Unknown)
           return Fail("--format must be jpg, jpeg, bmp, wmf, emf or png, not '" + *value + "'");
         continue;
@@ -235,7 +231,7 @@ ParseResult ParseGallery(const std::vector<std::string>& args) {
 OutputType OutputTypeFor(const std::string& path) {
   const std::size_t dot = path.find_last_of("./");
   if (dot == std::string::npos || path[dot] != '.') return OutputType::Unknown;
-  const std::string ext = Lower(path.substr(dot));
+  const std::string ext = AsciiLower(path.substr(dot));
   if (ext == ".jpg" || ext == ".jpeg") return OutputType::Jpeg;
   if (ext == ".bmp") return OutputType::Bitmap;
   if (ext == ".wmf" || ext == ".emf") return OutputType::Metafile;
