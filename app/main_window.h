@@ -97,8 +97,8 @@ class TMyPicture : public QMainWindow, public ToolHost {
   // folder also lists its pictures in the batch file list.
   void OpenDir() override;
   void OpenDir2() override;
-  // The batch file list (the hidden ListView1): bare file names, as the last input-folder
-  // Browse found them.
+  // The batch file list (the hidden ListView1): bare file names as shown (ShownName), as the
+  // last input-folder Browse found them.
   QStringList BatchFiles() const;
 
   // Both typed folders become the shared folders. Each loaded picture is shown and the progress

@@ -1,9 +1,11 @@
 // Opening a picture file and saving the working picture.
+#include <new>
 #include <optional>
 
 #include "app/local_path.h"
 #include "app/main_window.h"
 #include "codecs/picture_file.h"
+#include "imaging/memory_budget.h"
 #include "ui/platform.h"
 
 namespace quillane {
@@ -37,7 +39,13 @@ void TMyPicture::SpeedButton1Click() {
     platform_.ShowMessage("Sorry", choice->path + " is not a valid format");
     return;
   }
-  ShowNewPicture(std::move(*picture), true);
+  const int width = picture->Width(), height = picture->Height();
+  try {
+    ShowNewPicture(std::move(*picture), true);
+  } catch (const std::bad_alloc&) {
+    platform_.ShowError(choice->path + " " +
+                        QString::fromStdString(MemoryNeedText(OperationBytes(width, height))));
+  }
 }
 
 void TMyPicture::SpeedButton2Click() {

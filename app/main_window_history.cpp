@@ -6,9 +6,12 @@
 #include <QScrollBar>
 #include <QToolButton>
 #include <exception>
+#include <new>
+#include <string>
 
 #include "app/main_window.h"
 #include "document/run_effect.h"
+#include "imaging/memory_budget.h"
 #include "ui/platform.h"
 
 namespace quillane {
@@ -30,6 +33,13 @@ bool TMyPicture::ApplyEffect(const EffectSpec& effect, const EffectParams& param
                              bool recordHistory) {
   try {
     RunEffect(document_, effect, params, recordHistory);
+  } catch (const std::bad_alloc&) {
+    const TBitmap32& source = document_.Source();
+    platform_.ShowError(QString::fromStdString(
+        effect.statusText + " on the picture of " + std::to_string(source.Width()) + " by " +
+        std::to_string(source.Height()) + " pixels " +
+        MemoryNeedText(OperationBytes(source.Width(), source.Height()))));
+    return false;
   } catch (const std::exception& e) {
     platform_.ShowError(QString::fromStdString(e.what()));
     return false;

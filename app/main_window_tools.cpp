@@ -56,8 +56,11 @@ void TMyPicture::OpenDir() {
   if (!folder) return;
   inputFolder_ = *folder;
   listView1_->clear();
-  for (const std::string& name : ScanBatchFolder(LocalPath(inputFolder_)))
-    listView1_->addItem(FromLocalPath(name));
+  // A name is any bytes: the list shows it readably and keeps the bytes themselves to load.
+  for (const std::string& name : ScanBatchFolder(LocalPath(inputFolder_))) {
+    auto* item = new QListWidgetItem(QString::fromStdString(ShownName(name)), listView1_);
+    item->setData(Qt::UserRole, QByteArray::fromStdString(name));
+  }
 }
 
 void TMyPicture::OpenDir2() {
@@ -80,7 +83,8 @@ BatchResult TMyPicture::ConvertBatchFolder(const EffectSpec& effect, const Effec
   BatchJob job;
   job.inputFolder = TrimBlanks(LocalPath(inputField));
   job.outputFolder = TrimBlanks(LocalPath(outputField));
-  for (const QString& name : BatchFiles()) job.files.push_back(LocalPath(name));
+  for (int i = 0; i < listView1_->count(); ++i)
+    job.files.push_back(listView1_->item(i)->data(Qt::UserRole).toByteArray().toStdString());
   inputFolder_ = FromLocalPath(job.inputFolder);
 
   BatchObserver observer;
@@ -95,7 +99,7 @@ BatchResult TMyPicture::ConvertBatchFolder(const EffectSpec& effect, const Effec
         statusBar()->showMessage(QStringLiteral("Converting picture %1 of %2: %3")
                                      .arg(progress.index)
                                      .arg(progress.count)
-                                     .arg(FromLocalPath(progress.name)));
+                                     .arg(QString::fromStdString(ShownName(progress.name))));
         break;
       case BatchProgress::Step::Loaded:
         ShowLoadedPicture(false);
@@ -129,10 +133,12 @@ BatchResult TMyPicture::ConvertBatchFolder(const EffectSpec& effect, const Effec
 
   if (!result.skipped.empty()) {
     QString text = "These pictures were skipped and have no output file:";
-    for (const BatchSkipped& skipped : result.skipped) text += "\n" + FromLocalPath(skipped.reason);
+    for (const BatchSkipped& skipped : result.skipped)
+      text += "\n" + QString::fromStdString(ShownName(skipped.reason));
     platform_.ShowMessage("Sorry", text);
   }
-  if (result.end == BatchResult::End::Stopped) platform_.ShowError(FromLocalPath(result.error));
+  if (result.end == BatchResult::End::Stopped)
+    platform_.ShowError(QString::fromStdString(ShownName(result.error)));
   return result;
 }
 

@@ -48,6 +48,31 @@ std::optional<FileId> IdOf(const std::string& path) {
 
 }  // namespace
 
+std::string ShownName(const std::string& text) {
+  std::string shown;
+  for (std::size_t i = 0; i < text.size();) {
+    const auto c = static_cast<unsigned char>(text[i]);
+    // The length of a well-formed UTF-8 sequence starting here, or 0.
+    std::size_t length = c < 0x80                ? 1
+                         : c >= 0xC2 && c < 0xE0 ? 2
+                         : c >= 0xE0 && c < 0xF0 ? 3
+                         : c >= 0xF0 && c < 0xF5 ? 4
+                                                 : 0;
+    for (std::size_t k = 1; k < length; ++k)
+      if (i + k >= text.size() || (static_cast<unsigned char>(text[i + k]) & 0xC0) != 0x80)
+        length = 0;
+    if (length == 0 || c < 0x20 || c == 0x7F) {
+      static const char kHex[] = "0123456789abcdef";
+      shown += {'\\', 'x', kHex[c >> 4], kHex[c & 15]};
+      ++i;
+    } else {
+      shown.append(text, i, length);
+      i += length;
+    }
+  }
+  return shown;
+}
+
 std::string NamingTheFile(const std::string& path, const std::string& message) {
   if (message.find(path) != std::string::npos) return message;
   return path + ": " + message;

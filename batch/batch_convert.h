@@ -37,6 +37,11 @@ std::string TrimBlanks(const std::string& text);
 std::string BatchOutputName(const std::string& outputFolder, const std::string& inputName,
                             const std::string& tag);
 
+// text as it may be shown to a person: control characters and bytes that are not UTF-8 (a file
+// name is any bytes) written as \xHH, so a name can neither move a terminal's cursor nor be
+// shown as something it is not.
+std::string ShownName(const std::string& text);
+
 // message as it stands when it names path already, otherwise path + ": " + message.
 std::string NamingTheFile(const std::string& path, const std::string& message);
 

@@ -23,33 +23,6 @@ namespace fs = std::filesystem;
 
 namespace {
 
-// text as it may go to a terminal: control characters and bytes that are not UTF-8 (a file name
-// is any bytes) written as \xHH, so a name can neither move the cursor nor garble the line.
-std::string Shown(const std::string& text) {
-  std::string shown;
-  for (std::size_t i = 0; i < text.size();) {
-    const auto c = static_cast<unsigned char>(text[i]);
-    // The length of a well-formed UTF-8 sequence starting here, or 0.
-    std::size_t length = c < 0x80                ? 1
-                         : c >= 0xC2 && c < 0xE0 ? 2
-                         : c >= 0xE0 && c < 0xF0 ? 3
-                         : c >= 0xF0 && c < 0xF5 ? 4
-                                                 : 0;
-    for (std::size_t k = 1; k < length; ++k)
-      if (i + k >= text.size() || (static_cast<unsigned char>(text[i + k]) & 0xC0) != 0x80)
-        length = 0;
-    if (length == 0 || c < 0x20 || c == 0x7F) {
-      static const char kHex[] = "0123456789abcdef";
-      shown += {'\\', 'x', kHex[c >> 4], kHex[c & 15]};
-      ++i;
-    } else {
-      shown.append(text, i, length);
-      i += length;
-    }
-  }
-  return shown;
-}
-
 // A file of our own in the temporary folder, removed when done with.
 class TempFile {
  public:
@@ -102,7 +75,7 @@ std::optional<TBitmap32> InputOrBuiltInPicture(const Options& o, std::ostream& e
   } else {
     loaded = LoadInputPicture(o.input, error, err);
   }
-  if (!loaded) err << "quillane-cli: " << Shown(error) << "\n";
+  if (!loaded) err << "quillane-cli: " << ShownName(error) << "\n";
   return loaded;
 }
 
@@ -133,23 +106,23 @@ int ApplyCommand(const Options& o, std::ostream& out, std::ostream& err) {
     } catch (const std::bad_alloc&) {
       throw;
     } catch (const std::exception& e) {
-      err << "quillane-cli: " << o.effect->cliName << ": " << Shown(e.what()) << "\n";
+      err << "quillane-cli: " << o.effect->cliName << ": " << ShownName(e.what()) << "\n";
       return kExitFailed;
     }
     try {
       WriteOutput(document.Working(), o, out);
     } catch (const std::exception& e) {
       err << "quillane-cli: cannot write "
-          << (o.output == "-" ? std::string("to standard output") : Shown(o.output)) << ": "
-          << Shown(e.what()) << "\n";
+          << (o.output == "-" ? std::string("to standard output") : ShownName(o.output)) << ": "
+          << ShownName(e.what()) << "\n";
       return kExitFailed;
     }
   } catch (const std::bad_alloc&) {
-    err << "quillane-cli: " << o.effect->cliName << ": " << Shown(name) << " "
+    err << "quillane-cli: " << o.effect->cliName << ": " << ShownName(name) << " "
         << MemoryNeedText(OperationBytes(width, height)) << "\n";
     return kExitFailed;
   }
-  if (o.output != "-") out << Shown(o.output) << "\n";
+  if (o.output != "-") out << ShownName(o.output) << "\n";
   return kExitOk;
 }
 
@@ -164,13 +137,13 @@ class ProgressBar {
     const int filled = count > 0 ? (index - 1) * kWidth / count : 0;
     err_ << "\r[" << std::string(static_cast<std::size_t>(filled), '#')
          << std::string(static_cast<std::size_t>(kWidth - filled), '.') << "] " << index << "/"
-         << count << " " << Shown(name) << "\x1b[K" << std::flush;
+         << count << " " << ShownName(name) << "\x1b[K" << std::flush;
     drawn_ = true;
   }
   // A line of its own above the bar.
   void Print(const std::string& line) {
     if (drawn_) err_ << "\r\x1b[K";
-    err_ << Shown(line) << "\n" << std::flush;
+    err_ << ShownName(line) << "\n" << std::flush;
     drawn_ = false;
   }
   void Finish() {
@@ -216,15 +189,15 @@ int BatchCommand(const Options& o, std::ostream& out, std::ostream& err, bool te
   if (result.end == BatchResult::End::Refused) return kExitFailed;
   const std::size_t listed = job.files.size();
   if (result.end == BatchResult::End::Stopped)
-    err << "quillane-cli: " << Shown(result.error) << "\n";
+    err << "quillane-cli: " << ShownName(result.error) << "\n";
   out << "Converted " << result.outputs.size() << " of " << listed
-      << (listed == 1 ? " picture" : " pictures") << " into " << Shown(TrimBlanks(o.output))
+      << (listed == 1 ? " picture" : " pictures") << " into " << ShownName(TrimBlanks(o.output))
       << "\n";
   if (!result.skipped.empty()) {
     err << "Skipped " << result.skipped.size()
         << (result.skipped.size() == 1 ? " picture:\n" : " pictures:\n");
     for (const BatchSkipped& s : result.skipped)
-      err << "  " << Shown(s.name) << ": " << Shown(s.reason) << "\n";
+      err << "  " << ShownName(s.name) << ": " << ShownName(s.reason) << "\n";
   }
   if (result.end == BatchResult::End::Stopped) {
     const std::size_t left = listed - result.outputs.size() - result.skipped.size();
@@ -288,7 +261,7 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
   std::error_code ec;
   fs::create_directories(o.output, ec);
   if (!fs::is_directory(o.output)) {
-    err << "quillane-cli: cannot create the folder " << Shown(o.output)
+    err << "quillane-cli: cannot create the folder " << ShownName(o.output)
         << (ec ? ": " + ec.message() : std::string()) << "\n";
     return kExitFailed;
   }
@@ -301,8 +274,8 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
       SavePng(p, (folder / file).string());
       return true;
     } catch (const std::exception& e) {
-      err << "quillane-cli: cannot write " << Shown((folder / file).string()) << ": "
-          << Shown(e.what()) << "\n";
+      err << "quillane-cli: cannot write " << ShownName((folder / file).string()) << ": "
+          << ShownName(e.what()) << "\n";
       status = kExitFailed;
       return false;
     }
@@ -327,13 +300,13 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
         RunEffect(trial, *effect, {}, false);
         if (!write(trial.Working(), file)) continue;
       } catch (const std::bad_alloc&) {
-        err << "quillane-cli: " << effect->cliName << ": " << Shown(sourceName) << " "
+        err << "quillane-cli: " << effect->cliName << ": " << ShownName(sourceName) << " "
             << MemoryNeedText(OperationBytes(document.Source().Width(), document.Source().Height()))
             << "\n";
         status = kExitFailed;
         continue;
       } catch (const std::exception& e) {
-        err << "quillane-cli: " << effect->cliName << ": " << Shown(e.what()) << "\n";
+        err << "quillane-cli: " << effect->cliName << ": " << ShownName(e.what()) << "\n";
         status = kExitFailed;
         continue;
       }
@@ -347,7 +320,7 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
   html << GalleryHtml(sourceName, {"Original", "original.png"}, menus, unavailable);
   html.close();
   if (!html) {
-    err << "quillane-cli: cannot write " << Shown(index) << "\n";
+    err << "quillane-cli: cannot write " << ShownName(index) << "\n";
     return kExitFailed;
   }
   out << "Wrote " << written << (written == 1 ? " effect" : " effects") << " and the original into "
