@@ -95,11 +95,14 @@ TEST_F(CliRun, ApplyWritesExactlyWhatTheRoutineGives) {
   EXPECT_EQ(ReadText(Path("out.jpeg")), ReadText(Path("expected.jpg")));
 }
 
-TEST_F(CliRun, ApplyReadsPngAndUsesTheBuiltInPictureWithoutInput) {
+TEST_F(CliRun, ApplyReadsPngStandardInputAndTheBuiltInPicture) {
   const TBitmap32 input = Picture(17, 13);  // alpha varies; the document makes it 255
   SavePng(input, Path("in.png"));
   ASSERT_EQ(Run("apply pencil-sketch " + Q("in.png") + " -o " + Q("out.png")), 0) << err_;
   EXPECT_EQ(FromPng(Path("out.png")), Pencil(input, PencilToneMode::Contrast, 45, 128));
+  // "-" both ways: the picture comes in and goes out as bytes, PNG by default.
+  ASSERT_EQ(Run("apply pencil-sketch - -o - < " + Q("in.png")), 0) << err_;
+  EXPECT_EQ(FromPng(Path("stdout.txt")), Pencil(input, PencilToneMode::Contrast, 45, 128));
 
   ASSERT_EQ(Run("apply pencil-sketch --lighting 90 -o " + Q("builtin.png")), 0) << err_;
   EXPECT_EQ(FromPng(Path("builtin.png")),
