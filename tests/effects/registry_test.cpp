@@ -96,6 +96,11 @@ const Reference kReferences[] = {
      {252, 252, 252, 255},
      {230, 230, 230, 255},
      {255, 255, 255, 255}},
+    {"color-pencil",
+     0x47ffeeb9b5b445d0,
+     {254, 252, 251, 255},
+     {245, 245, 244, 255},
+     {255, 255, 255, 255}},
 };
 
 TEST(EffectTable, EveryEffectGivesItsReferenceResultOnTheBuiltInPicture) {

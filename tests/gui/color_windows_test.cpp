@@ -1,0 +1,44 @@
+#include <QLabel>
+#include <QLineEdit>
+#include <QPushButton>
+#include <QSlider>
+#include <QToolButton>
+
+#include "effects/paint/color_pencil.h"
+#include "tests/gui/temp_folder.h"
+
+namespace quillane {
+namespace {
+
+class ColorWindows : public FileGuiTest {
+ protected:
+  // Opens the window of tool number n from its menu entry.
+  ToolWindow& Open(int n) {
+    MenuAction(QString::fromStdString(Tool(n).Spec().menuHandler).chopped(5))->trigger();
+    EXPECT_TRUE(Tool(n).isVisible());
+    return Tool(n);
+  }
+  QString Text(int n, const char* label) { return ToolChild<QLabel>(n, label)->text(); }
+  void Click(int n, const char* button) { ToolChild<QPushButton>(n, button)->click(); }
+  const TBitmap32& Working() { return Main().Document().Working(); }
+  const TBitmap32& Source() { return Main().Document().Source(); }
+};
+
+TEST_F(ColorWindows, ColorPencilShowsPressureAsPercentAndDrawsOnOk) {
+  Open(5);
+  auto* pressure = ToolChild<QSlider>(5, "TrackBar1");
+  EXPECT_EQ(Text(5, "Label8"), "Pressure:");
+  EXPECT_EQ(Text(5, "Label9"), "50");
+  for (auto [position, shown] :
+       {std::pair{46, "52"}, {45, "51"}, {89, "100"}, {0, "0"}, {60, "67"}}) {
+    pressure->setValue(position);
+    EXPECT_EQ(Text(5, "Label9"), shown);
+  }
+  Click(5, "Button1");
+  EXPECT_EQ(Working(), colorsketch(Source(), 60));
+  EXPECT_EQ(Main().Document().UndoCount(), 1);
+  EXPECT_EQ(Main().StatusText(), "Color Sketch");
+}
+
+}  // namespace
+}  // namespace quillane
