@@ -9,6 +9,7 @@
 #include "bench/synthetic_photo.h"
 #include "effects/mono/bw_sketch.h"
 #include "effects/paint/color_pencil.h"
+#include "effects/paint/water_color.h"
 #include "imaging/edge_map.h"
 #include "imaging/tone.h"
 
@@ -142,6 +143,27 @@ void BM_ColorPencil(benchmark::State& state) {
   SetBytes(state);
 }
 QUILLANE_EFFECT_BENCHMARK(BM_ColorPencil);
+
+// One median pass on its own.
+void BM_MedianPass(benchmark::State& state) {
+  TBitmap32 out = Photo();
+  for (auto _ : state) {
+    MedianPass(Photo(), out);
+    benchmark::DoNotOptimize(out.Data());
+  }
+  SetBytes(state);
+}
+QUILLANE_EFFECT_BENCHMARK(BM_MedianPass);
+
+void BM_WaterColor(benchmark::State& state) {
+  TBitmap32 out(kWidth, kHeight), scratch(kWidth, kHeight);
+  for (auto _ : state) {
+    WaterColorInto(Photo(), 3, out, scratch);
+    benchmark::DoNotOptimize(out.Data());
+  }
+  SetBytes(state);
+}
+QUILLANE_EFFECT_BENCHMARK(BM_WaterColor);
 
 }  // namespace
 }  // namespace quillane

@@ -101,6 +101,11 @@ const Reference kReferences[] = {
      {254, 252, 251, 255},
      {245, 245, 244, 255},
      {255, 255, 255, 255}},
+    {"water-color",
+     0xe2b296672cd83970,
+     {136, 82, 46, 255},
+     {146, 140, 135, 255},
+     {28, 73, 48, 255}},
 };
 
 TEST(EffectTable, EveryEffectGivesItsReferenceResultOnTheBuiltInPicture) {

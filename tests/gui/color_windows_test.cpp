@@ -3,8 +3,10 @@
 #include <QPushButton>
 #include <QSlider>
 #include <QToolButton>
+#include <functional>
 
 #include "effects/paint/color_pencil.h"
+#include "effects/paint/water_color.h"
 #include "tests/gui/temp_folder.h"
 
 namespace quillane {
@@ -38,6 +40,35 @@ TEST_F(ColorWindows, ColorPencilShowsPressureAsPercentAndDrawsOnOk) {
   EXPECT_EQ(Working(), colorsketch(Source(), 60));
   EXPECT_EQ(Main().Document().UndoCount(), 1);
   EXPECT_EQ(Main().StatusText(), "Color Sketch");
+}
+
+TEST_F(ColorWindows, ScopeSliderWindowsShowThePositionAndApplyIt) {
+  struct Case {
+    int tool;
+    int maximum;
+    const char* status;
+    std::function<TBitmap32(const TBitmap32&, int)> effect;
+  };
+  const Case cases[] = {
+      {9, 5, "Water color", [](const TBitmap32& s, int n) { return watercolor(s, n); }},
+  };
+  for (const Case& c : cases) {
+    SCOPED_TRACE(c.status);
+    Open(c.tool);
+    auto* scope = ToolChild<QSlider>(c.tool, "TrackBar2");
+    EXPECT_EQ(Text(c.tool, "Label2"), "Scope:");
+    EXPECT_EQ(Text(c.tool, "Label3"), "3");
+    EXPECT_EQ(scope->minimum(), 1);
+    EXPECT_EQ(scope->maximum(), c.maximum);
+    EXPECT_EQ(scope->pageStep(), 1);
+    scope->setValue(5);
+    EXPECT_EQ(Text(c.tool, "Label3"), "5");
+    const int steps = Main().Document().UndoCount();
+    Click(c.tool, "Button1");
+    EXPECT_EQ(Working(), c.effect(Source(), 5));
+    EXPECT_EQ(Main().Document().UndoCount(), steps + 1);
+    EXPECT_EQ(Main().StatusText(), c.status);
+  }
 }
 
 }  // namespace
