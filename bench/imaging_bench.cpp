@@ -9,6 +9,7 @@
 #include "bench/synthetic_photo.h"
 #include "effects/mono/bw_sketch.h"
 #include "effects/paint/color_pencil.h"
+#include "effects/paint/realism.h"
 #include "effects/paint/water_color.h"
 #include "imaging/edge_map.h"
 #include "imaging/tone.h"
@@ -164,6 +165,16 @@ void BM_WaterColor(benchmark::State& state) {
   SetBytes(state);
 }
 QUILLANE_EFFECT_BENCHMARK(BM_WaterColor);
+
+void BM_Realism(benchmark::State& state) {
+  TBitmap32 out(kWidth, kHeight);
+  for (auto _ : state) {
+    ConvolveInto(Photo(), {1, 2, 1, 0, 0, 0, -1, -1, -1}, 1, out);
+    benchmark::DoNotOptimize(out.Data());
+  }
+  SetBytes(state);
+}
+QUILLANE_EFFECT_BENCHMARK(BM_Realism);
 
 }  // namespace
 }  // namespace quillane

@@ -106,6 +106,11 @@ const Reference kReferences[] = {
      {136, 82, 46, 255},
      {146, 140, 135, 255},
      {28, 73, 48, 255}},
+    {"realism",
+     0xf59929b4aacceff2,
+     {136, 82, 46, 255},
+     {170, 162, 148, 255},
+     {28, 73, 48, 255}},
 };
 
 TEST(EffectTable, EveryEffectGivesItsReferenceResultOnTheBuiltInPicture) {

@@ -6,6 +6,7 @@
 #include <functional>
 
 #include "effects/paint/color_pencil.h"
+#include "effects/paint/realism.h"
 #include "effects/paint/water_color.h"
 #include "tests/gui/temp_folder.h"
 
@@ -67,6 +68,79 @@ TEST_F(ColorWindows, ScopeSliderWindowsShowThePositionAndApplyIt) {
     Click(c.tool, "Button1");
     EXPECT_EQ(Working(), c.effect(Source(), 5));
     EXPECT_EQ(Main().Document().UndoCount(), steps + 1);
+    EXPECT_EQ(Main().StatusText(), c.status);
+  }
+}
+
+TEST_F(ColorWindows, KernelWindowsConvertTheCellsAsTypedAndRefuseWhatIsNoInteger) {
+  struct Case {
+    int tool;
+    const char* caption;
+    const char* status;
+    const char* convertHint;
+    const char* defaultHint;
+    Kernel defaults;
+    TBitmap32 (*effect)(const TBitmap32&, const Kernel&);
+  };
+  const Case cases[] = {
+      {6,
+       "Setup for Realism",
+       "Realism",
+       "Convert with this setup",
+       "Default setup",
+       {1, 2, 1, 0, 0, 0, -1, -1, -1},
+       realism},
+  };
+  for (const Case& c : cases) {
+    SCOPED_TRACE(c.status);
+    ToolWindow& window = Open(c.tool);
+    EXPECT_EQ(window.windowTitle(), c.caption);
+    EXPECT_EQ(Text(c.tool, "Label1"), "You can change the figures");
+    auto cell = [&](int i) {
+      return ToolChild<QLineEdit>(c.tool, ("Edit" + std::to_string(i)).c_str());
+    };
+    for (int i = 1; i <= 9; ++i) {
+      EXPECT_EQ(cell(i)->text(), QString::number(c.defaults[static_cast<std::size_t>(i - 1)]));
+      EXPECT_EQ(cell(i)->toolTip(), "Change the number to get different effect");
+    }
+    auto* convert = ToolChild<QPushButton>(c.tool, "Button1");
+    auto* restore = ToolChild<QPushButton>(c.tool, "Button3");
+    EXPECT_EQ(convert->text(), "Convert");
+    EXPECT_EQ(convert->toolTip(), c.convertHint);
+    EXPECT_EQ(restore->text(), "Default");
+    EXPECT_EQ(restore->toolTip(), c.defaultHint);
+
+    const int steps = Main().Document().UndoCount();
+    Kernel typed = c.defaults;
+    typed[4] = 3;
+    typed[8] = -7;
+    cell(5)->setText("3");
+    cell(9)->setText("-7");
+    convert->click();
+    EXPECT_EQ(Working(), c.effect(Source(), typed));
+    EXPECT_EQ(Main().Document().UndoCount(), steps + 1);
+    EXPECT_EQ(Main().StatusText(), c.status);
+
+    // A cell that is no 32-bit integer: the standard error, and nothing changes.
+    const TBitmap32 before = Working();
+    Main().SetStatusText("before");
+    for (const char* bad : {"abc", "2147483648", "1.5", ""}) {
+      cell(2)->setText(bad);
+      convert->click();
+      ASSERT_FALSE(platform_.errors.empty());
+      EXPECT_EQ(platform_.errors.back(), QString("'%1' is not a valid integer value").arg(bad));
+    }
+    EXPECT_EQ(platform_.errors.size(), 4u);
+    platform_.errors.clear();
+    EXPECT_EQ(Working(), before);
+    EXPECT_EQ(Main().Document().UndoCount(), steps + 1);
+    EXPECT_EQ(Main().StatusText(), "before");
+
+    restore->click();
+    for (int i = 1; i <= 9; ++i)
+      EXPECT_EQ(cell(i)->text(), QString::number(c.defaults[static_cast<std::size_t>(i - 1)]));
+    EXPECT_EQ(Working(), c.effect(Source(), c.defaults));
+    EXPECT_EQ(Main().Document().UndoCount(), steps + 2);
     EXPECT_EQ(Main().StatusText(), c.status);
   }
 }
