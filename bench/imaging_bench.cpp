@@ -9,6 +9,7 @@
 #include "bench/synthetic_photo.h"
 #include "effects/mono/bw_sketch.h"
 #include "effects/paint/color_pencil.h"
+#include "effects/paint/kernel_gradient.h"
 #include "effects/paint/realism.h"
 #include "effects/paint/water_color.h"
 #include "imaging/edge_map.h"
@@ -175,6 +176,17 @@ void BM_Realism(benchmark::State& state) {
   SetBytes(state);
 }
 QUILLANE_EFFECT_BENCHMARK(BM_Realism);
+
+void BM_PopArt(benchmark::State& state) {
+  TBitmap32 out(kWidth, kHeight);
+  for (auto _ : state) {
+    KernelGradientFilterInto(Photo(), {-1, -2, -1, 0, 0, 0, 1, 2, 1}, Gradient::RightMinusLeftSobel,
+                             out);
+    benchmark::DoNotOptimize(out.Data());
+  }
+  SetBytes(state);
+}
+QUILLANE_EFFECT_BENCHMARK(BM_PopArt);
 
 }  // namespace
 }  // namespace quillane

@@ -106,11 +106,12 @@ const Reference kReferences[] = {
      {136, 82, 46, 255},
      {146, 140, 135, 255},
      {28, 73, 48, 255}},
-    {"realism",
-     0xf59929b4aacceff2,
-     {136, 82, 46, 255},
-     {170, 162, 148, 255},
-     {28, 73, 48, 255}},
+    {"realism", 0xf59929b4aacceff2, {136, 82, 46, 255}, {170, 162, 148, 255}, {28, 73, 48, 255}},
+    {"pop-art",
+     0x0ac48edf0124145b,
+     {247, 245, 244, 255},
+     {255, 255, 255, 255},
+     {229, 166, 175, 255}},
 };
 
 TEST(EffectTable, EveryEffectGivesItsReferenceResultOnTheBuiltInPicture) {

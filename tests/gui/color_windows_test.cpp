@@ -6,6 +6,7 @@
 #include <functional>
 
 #include "effects/paint/color_pencil.h"
+#include "effects/paint/pop_art.h"
 #include "effects/paint/realism.h"
 #include "effects/paint/water_color.h"
 #include "tests/gui/temp_folder.h"
