@@ -188,6 +188,17 @@ void BM_PopArt(benchmark::State& state) {
 }
 QUILLANE_EFFECT_BENCHMARK(BM_PopArt);
 
+void BM_Abstract(benchmark::State& state) {
+  TBitmap32 out(kWidth, kHeight);
+  for (auto _ : state) {
+    KernelGradientFilterInto(Photo(), {-1, -1, -1, 0, 0, 0, -1, -1, -1}, Gradient::LeftMinusRight,
+                             out);
+    benchmark::DoNotOptimize(out.Data());
+  }
+  SetBytes(state);
+}
+QUILLANE_EFFECT_BENCHMARK(BM_Abstract);
+
 }  // namespace
 }  // namespace quillane
 

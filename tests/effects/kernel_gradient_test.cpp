@@ -3,6 +3,7 @@
 
 #include <limits>
 
+#include "effects/paint/abstract.h"
 #include "effects/paint/pop_art.h"
 
 namespace quillane {
@@ -48,6 +49,17 @@ TEST(PopArt, BrighteningDownwardsOrRightwardsDrawsADarkLine) {
     EXPECT_EQ(Profile(popart(Edge(vertical, 100, 150), kPopArt), vertical), line);
     EXPECT_EQ(Profile(popart(Edge(vertical, 150, 100), kPopArt), vertical), none);
   }
+}
+
+TEST(Abstract, DarkeningFromLeftToRightDrawsADarkLine) {
+  const Kernel defaults{-1, -1, -1, 0, 0, 0, -1, -1, -1};
+  const TBitmap32 flat(5, 4, Pixel{9, 99, 199, 255});
+  EXPECT_EQ(doabstract(flat, defaults), TBitmap32(5, 4, kWhite));
+  EXPECT_EQ(doabstract(flat, Kernel{0, 0, 0, 0, 1}), TBitmap32(5, 4, Pixel{246, 156, 56, 255}));
+  EXPECT_EQ(Profile(doabstract(Edge(false, 150, 100), defaults), false),
+            (std::vector<int>{255, 255, 105, 105, 255, 255}));
+  EXPECT_EQ(Profile(doabstract(Edge(false, 100, 150), defaults), false), std::vector<int>(6, 255));
+  EXPECT_EQ(Profile(doabstract(Edge(true, 150, 100), defaults), true), std::vector<int>(6, 255));
 }
 
 TEST(KernelGradient, SmallPicturesRepeatTheirInnerLineInverted) {

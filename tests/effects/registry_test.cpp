@@ -112,6 +112,11 @@ const Reference kReferences[] = {
      {247, 245, 244, 255},
      {255, 255, 255, 255},
      {229, 166, 175, 255}},
+    {"abstract",
+     0x420f922fe65bc838,
+     {254, 252, 255, 255},
+     {245, 245, 252, 255},
+     {255, 255, 255, 255}},
 };
 
 TEST(EffectTable, EveryEffectGivesItsReferenceResultOnTheBuiltInPicture) {

@@ -5,6 +5,7 @@
 #include <QToolButton>
 #include <functional>
 
+#include "effects/paint/abstract.h"
 #include "effects/paint/color_pencil.h"
 #include "effects/paint/pop_art.h"
 #include "effects/paint/realism.h"
