@@ -8,6 +8,7 @@
 
 #include "bench/synthetic_photo.h"
 #include "effects/mono/bw_sketch.h"
+#include "effects/paint/brume.h"
 #include "effects/paint/color_pencil.h"
 #include "effects/paint/kernel_gradient.h"
 #include "effects/paint/realism.h"
@@ -198,6 +199,17 @@ void BM_Abstract(benchmark::State& state) {
   SetBytes(state);
 }
 QUILLANE_EFFECT_BENCHMARK(BM_Abstract);
+
+void BM_Brume(benchmark::State& state) {
+  TBitmap32 out(kWidth, kHeight);
+  std::uint32_t seed = 0;
+  for (auto _ : state) {
+    BrumeInto(Photo(), 3, seed, out);
+    benchmark::DoNotOptimize(out.Data());
+  }
+  SetBytes(state);
+}
+QUILLANE_EFFECT_BENCHMARK(BM_Brume);
 
 }  // namespace
 }  // namespace quillane

@@ -5,7 +5,9 @@
 #include <QToolButton>
 #include <functional>
 
+#include "codecs/picture_file.h"
 #include "effects/paint/abstract.h"
+#include "effects/paint/brume.h"
 #include "effects/paint/color_pencil.h"
 #include "effects/paint/pop_art.h"
 #include "effects/paint/realism.h"
@@ -54,6 +56,11 @@ TEST_F(ColorWindows, ScopeSliderWindowsShowThePositionAndApplyIt) {
   };
   const Case cases[] = {
       {9, 5, "Water color", [](const TBitmap32& s, int n) { return watercolor(s, n); }},
+      {10, 10, "Brume",
+       [](const TBitmap32& s, int a) {
+         std::uint32_t seed = 0;  // the first run since the program started
+         return Brume(s, a, seed);
+       }},
   };
   for (const Case& c : cases) {
     SCOPED_TRACE(c.status);
@@ -72,6 +79,12 @@ TEST_F(ColorWindows, ScopeSliderWindowsShowThePositionAndApplyIt) {
     EXPECT_EQ(Main().Document().UndoCount(), steps + 1);
     EXPECT_EQ(Main().StatusText(), c.status);
   }
+  // Brume goes on drawing where its last run stopped, so a second OK gives another picture.
+  std::uint32_t seed = 0;
+  const TBitmap32 first = Brume(Source(), 5, seed);
+  Click(10, "Button1");
+  EXPECT_EQ(Working(), Brume(Source(), 5, seed));
+  EXPECT_NE(Working(), first);
 }
 
 TEST_F(ColorWindows, KernelWindowsConvertTheCellsAsTypedAndRefuseWhatIsNoInteger) {
@@ -145,6 +158,55 @@ TEST_F(ColorWindows, KernelWindowsConvertTheCellsAsTypedAndRefuseWhatIsNoInteger
     EXPECT_EQ(Main().Document().UndoCount(), steps + 2);
     EXPECT_EQ(Main().StatusText(), c.status);
   }
+}
+
+TEST_F(ColorWindows, EachBatchWritesItsTagAndRecordsAStepPerPicture) {
+  std::filesystem::create_directories(LocalPath("in"));
+  SaveBitmap24(TestPicture(9, 7), LocalPath("in/a.bmp"));
+  SaveBitmap24(TestPicture(12, 5), LocalPath("in/b.bmp"));
+  platform_.folderAnswers.push_back(Path("in"));
+  Open(5);
+  ToolChild<QToolButton>(5, "SpeedButton1")->click();
+  ToolChild<QToolButton>(5, "SpeedButton2")->click();
+  const QStringList files = Main().BatchFiles();
+  ASSERT_EQ(files.size(), 2);
+  auto input = [&](const QString& name) {
+    TBitmap32 picture = *LoadPictureFile(LocalPath("in/" + name));
+    SetAlphaChannel(picture, 255);
+    return picture;
+  };
+
+  // A kernel cell that is no integer stops Convert before any picture is loaded.
+  Open(6);
+  ToolChild<QLineEdit>(6, "Edit4")->setText("x");
+  ToolChild<QLineEdit>(6, "Edit11")->setText(Path("out"));
+  ToolChild<QToolButton>(6, "SpeedButton4")->click();
+  EXPECT_EQ(platform_.errors, std::vector<QString>{"'x' is not a valid integer value"});
+  EXPECT_FALSE(Exists("out"));
+  EXPECT_EQ(Main().Document().Source(), TestPicture());
+  ToolChild<QLineEdit>(6, "Edit4")->setText("0");
+
+  for (int tool : {5, 6, 7, 8, 9, 10}) {
+    const EffectSpec& spec = Open(tool).Spec();
+    SCOPED_TRACE(spec.batchTag);
+    ToolChild<QLineEdit>(tool, spec.outputField.c_str())->setText(Path("out"));
+    const int steps = Main().Document().UndoCount();
+    const std::uint32_t seed = Main().Document().RandomState();
+    ToolChild<QToolButton>(tool, "SpeedButton4")->click();
+    for (const QString& name : files)
+      EXPECT_TRUE(
+          Exists("out/" + name.chopped(4) + "-" + QString::fromStdString(spec.batchTag) + ".jpg"));
+    EXPECT_EQ(Main().Document().UndoCount(), steps + 2);
+    EXPECT_EQ(Main().StatusText(), QString::fromStdString(spec.statusText));
+    // The last picture's result; brume's draws go on from the first picture to the second.
+    std::uint32_t expectedSeed = seed;
+    EffectInput in{input(files[0]), input(files[0]), spec.Defaults(), &expectedSeed};
+    spec.routine(in);
+    const TBitmap32 last = input(files[1]);
+    EXPECT_EQ(Working(), spec.routine({last, last, spec.Defaults(), &expectedSeed}));
+    EXPECT_EQ(Main().Document().RandomState(), expectedSeed);
+  }
+  EXPECT_TRUE(platform_.errors.size() == 1 && platform_.messages.empty());
 }
 
 }  // namespace
