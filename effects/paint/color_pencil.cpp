@@ -3,6 +3,7 @@
 #include <array>
 #include <cstdint>
 #include <cstring>
+#include <vector>
 
 #include "effects/registry.h"
 #include "imaging/edge_map.h"
@@ -50,24 +51,21 @@ void ColorSketchInto(const TBitmap32& source, int pressure, TBitmap32& out) {
     return t;
   }();
 
+  const HslTables& hsl = HslToRgbTables();
   const int w = out.Width();
   ParallelRows(0, out.Height(), static_cast<std::size_t>(w) * 8, [&](int y0, int y1) {
+    std::vector<Hsl> colours(static_cast<std::size_t>(w));
     for (int y = y0; y < y1; ++y) {
       Pixel* row = out.ScanLine(y);
-      const Pixel* src = source.ScanLine(y);
+      RgbToHslRow(source.ScanLine(y), colours.data(), w);
       for (int x = 0; x < w; ++x) {
-        const int e = tone[row[x].r];
-        // A fully light tone lifts every colour to lightness 100, which is white.
-        if (e == 100) {
-          row[x] = Pixel{255, 255, 255, 255};
-          continue;
-        }
-        const Pixel p = src[x];
-        const Hsl hsl = RgbToHsl(p.r, p.g, p.b);
-        const Rgb rgb = HslToRgb(
-            hsl.h, hsl.s, lightness[static_cast<std::size_t>(e)][static_cast<std::size_t>(hsl.l)]);
-        row[x] = Pixel{static_cast<std::uint8_t>(rgb.b), static_cast<std::uint8_t>(rgb.g),
-                       static_cast<std::uint8_t>(rgb.r), 255};
+        const Hsl c = colours[static_cast<std::size_t>(x)];
+        const std::uint8_t* light =
+            hsl.lightness[lightness[tone[row[x].r]][static_cast<std::size_t>(c.l)]];
+        const std::uint8_t* saturated = hsl.saturation[c.s];
+        const std::uint8_t* hue = hsl.hue[c.h];
+        row[x] = Pixel{light[saturated[hue[2]]], light[saturated[hue[1]]], light[saturated[hue[0]]],
+                       255};
       }
     }
   });
