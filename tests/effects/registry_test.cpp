@@ -117,11 +117,7 @@ const Reference kReferences[] = {
      {254, 252, 255, 255},
      {245, 245, 252, 255},
      {255, 255, 255, 255}},
-    {"brume",
-     0x7a58c4f68df92c52,
-     {136, 82, 46, 255},
-     {150, 147, 136, 255},
-     {28, 73, 48, 255}},
+    {"brume", 0x7a58c4f68df92c52, {136, 82, 46, 255}, {150, 147, 136, 255}, {28, 73, 48, 255}},
 };
 
 TEST(EffectTable, EveryEffectGivesItsReferenceResultOnTheBuiltInPicture) {
