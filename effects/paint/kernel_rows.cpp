@@ -1,6 +1,7 @@
 #include "effects/paint/kernel_rows.h"
 
 #include <algorithm>
+#include <cstdint>
 #include <cstdlib>
 #include <optional>
 
@@ -25,7 +26,12 @@ void ShortSums(const std::uint8_t* const rows[3], int first, int count,
 Kernel KernelFrom(const EffectParams::Values& values) {
   if (values.size() != 9) throw std::invalid_argument("a kernel has nine cells");
   Kernel k{};
-  for (std::size_t i = 0; i < 9; ++i) k[i] = values[i];
+  for (std::size_t i = 0; i < 9; ++i) {
+    // Wider weights could overflow even the 64-bit sums.
+    if (values[i] < INT32_MIN || values[i] > INT32_MAX)
+      throw std::invalid_argument("a kernel's cells are 32-bit integers");
+    k[i] = values[i];
+  }
   return k;
 }
 

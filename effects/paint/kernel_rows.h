@@ -16,9 +16,11 @@
 namespace quillane {
 
 // Nine weights k0..k8 in row-major order: k0 k1 k2 the row above, k6 k7 k8 the row below.
+// Each is a 32-bit integer, so 64-bit sums of nine weighted bytes never overflow.
 using Kernel = std::array<std::int64_t, 9>;
 
-// The nine cells of a kernel parameter; std::invalid_argument when there are not nine.
+// The nine cells of a kernel parameter; std::invalid_argument when there are not nine or one
+// is beyond 32 bits.
 Kernel KernelFrom(const EffectParams::Values& values);
 
 // One weighted tap: the byte `offset` bytes across in the row above (0), the same row (1) or
