@@ -22,6 +22,21 @@ std::int64_t WeightedSum(const TBitmap32& picture, const Kernel& k, int x, int y
   return s;
 }
 
+// The gradients weigh one column of three against the next but one: each column's weighted
+// sum is formed once and serves both neighbours. sums[i] = sign (column(i - 4) - column(i + 4))
+// over byte first + i, with the middle row weighing middleWeight.
+void GradientSums(const std::uint8_t* const rows[3], int first, int count, int middleWeight,
+                  int sign, std::int16_t* __restrict sums) {
+  std::int16_t columns[kSumChunk + 8];
+  const std::uint8_t* __restrict above = rows[0] + first - 4;
+  const std::uint8_t* __restrict row = rows[1] + first - 4;
+  const std::uint8_t* __restrict below = rows[2] + first - 4;
+  for (int i = 0; i < count + 8; ++i)
+    columns[i] = static_cast<std::int16_t>(above[i] + middleWeight * row[i] + below[i]);
+  for (int i = 0; i < count; ++i)
+    sums[i] = static_cast<std::int16_t>(sign * (columns[i] - columns[i + 8]));
+}
+
 std::int64_t Clamp(std::int64_t v) {
   return v < 0 ? 0 : (v > 255 ? 255 : v);
 }
@@ -74,7 +89,8 @@ void KernelGradientFilterInto(const TBitmap32& picture, const Kernel& k, Gradien
     out = KernelGradientReference(picture, k, gradient);
     return;
   }
-  const std::vector<KernelTap> gradientTaps = *ShortTaps(GradientKernel(gradient));
+  const int middleWeight = gradient == Gradient::LeftMinusRight ? 1 : 2;
+  const int sign = gradient == Gradient::LeftMinusRight ? 1 : -1;
   const int bytes = w * 4;
   ParallelRows(1, h - 1, static_cast<std::size_t>(w) * (taps->size() + 8), [&](int y0, int y1) {
     std::int16_t kernelSums[kSumChunk];
@@ -89,7 +105,7 @@ void KernelGradientFilterInto(const TBitmap32& picture, const Kernel& k, Gradien
       for (int first = 4; first < bytes - 4; first += kSumChunk) {
         const int count = std::min(kSumChunk, bytes - 4 - first);
         ShortSums(rows, first, count, *taps, kernelSums);
-        ShortSums(rows, first, count, gradientTaps, gradientSums);
+        GradientSums(rows, first, count, middleWeight, sign, gradientSums);
         // The clamp is monotonic, so the larger clamped response is the clamped larger one;
         // the result is stored inverted at once.
         for (int i = 0; i < count; ++i)
