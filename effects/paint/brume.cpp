@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <array>
 #include <cstring>
+#include <vector>
 
 #include "effects/registry.h"
 #include "imaging/parallel.h"
@@ -45,31 +46,28 @@ void BrumeRows(const TBitmap32& source, TBitmap32& out, int scope, std::uint32_t
   const int h = source.Height();
   const auto range = static_cast<std::uint32_t>(scope + 3);
   const Affine lanesAhead = Steps(kLanes);
+  // A row draw d picks source row y + d - scope, limited to the picture: one pointer per d.
+  std::vector<const Pixel*> pickRows(range);
   for (int y = y0; y < y1; ++y) {
+    for (std::uint32_t d = 0; d < range; ++d)
+      pickRows[d] = source.ScanLine(std::clamp(static_cast<int>(d) + y - scope, 0, h - 1));
     std::array<std::uint32_t, kLanes> lane;
     std::uint32_t s = seed;
     for (std::uint32_t& l : lane) l = s = kMultiplier * s + 1;
     Pixel* row = out.ScanLine(y);
+    const auto pick = [&](std::uint32_t rowSeed, std::uint32_t columnSeed, int x) {
+      const int rx = std::clamp(static_cast<int>(Scaled(columnSeed, range)) + x - scope, 0, w - 1);
+      const Pixel p = pickRows[Scaled(rowSeed, range)][rx];
+      row[x] = Pixel{p.b, p.g, p.r, 255};
+    };
     int x = 1;
     // kLanes / 2 pixels per round, each taking a row draw and then a column draw.
     for (; x + kLanes / 2 <= w; x += kLanes / 2) {
-      for (int i = 0; i < kLanes / 2; ++i) {
-        const int ry =
-            std::clamp(static_cast<int>(Scaled(lane[2 * i], range)) + y - scope, 0, h - 1);
-        const int rx =
-            std::clamp(static_cast<int>(Scaled(lane[2 * i + 1], range)) + x + i - scope, 0, w - 1);
-        const Pixel p = source.ScanLine(ry)[rx];
-        row[x + i] = Pixel{p.b, p.g, p.r, 255};
-      }
+      for (int i = 0; i < kLanes / 2; ++i) pick(lane[2 * i], lane[2 * i + 1], x + i);
       for (std::uint32_t& l : lane) l = lanesAhead(l);
     }
     // The last few pixels of the row take the lanes in order.
-    for (int i = 0; x < w; ++x, i += 2) {
-      const int ry = std::clamp(static_cast<int>(Scaled(lane[i], range)) + y - scope, 0, h - 1);
-      const int rx = std::clamp(static_cast<int>(Scaled(lane[i + 1], range)) + x - scope, 0, w - 1);
-      const Pixel p = source.ScanLine(ry)[rx];
-      row[x] = Pixel{p.b, p.g, p.r, 255};
-    }
+    for (int i = 0; x < w; ++x, i += 2) pick(lane[i], lane[i + 1], x);
     seed = RandomJump(seed, 2 * static_cast<std::uint64_t>(w - 1));
   }
 }
