@@ -23,43 +23,37 @@ TBitmap32 Noise(int w, int h) {
   return b;
 }
 
-// Level first in the rows (vertical) or columns (!vertical) before the middle of a 6 x 6
-// picture, second after it.
-TBitmap32 Edge(bool vertical, std::uint8_t first, std::uint8_t second) {
+// The levels down the middle column (vertical) or along the middle row of the result on a
+// 6 x 6 picture of level first before the middle and second after it.
+std::vector<int> AcrossEdge(TBitmap32 (*effect)(const TBitmap32&, const Kernel&), const Kernel& k,
+                            bool vertical, std::uint8_t first, std::uint8_t second) {
   TBitmap32 b(6, 6);
   for (int y = 0; y < 6; ++y)
     for (int x = 0; x < 6; ++x) {
       const std::uint8_t v = (vertical ? y : x) < 3 ? first : second;
       b.At(x, y) = Pixel{v, v, v, 255};
     }
-  return b;
-}
-
-// The levels along the middle column (vertical) or row.
-std::vector<int> Profile(const TBitmap32& b, bool vertical) {
+  const TBitmap32 out = effect(b, k);
   std::vector<int> levels;
-  for (int i = 0; i < 6; ++i) levels.push_back((vertical ? b.At(2, i) : b.At(i, 2)).g);
+  for (int i = 0; i < 6; ++i) levels.push_back((vertical ? out.At(2, i) : out.At(i, 2)).g);
   return levels;
 }
 
-TEST(PopArt, BrighteningDownwardsOrRightwardsDrawsADarkLine) {
-  EXPECT_EQ(popart(TBitmap32(5, 4, Pixel{9, 99, 199, 255}), kPopArt), TBitmap32(5, 4, kWhite));
-  const std::vector<int> line{255, 255, 55, 55, 255, 255}, none(6, 255);
-  for (bool vertical : {true, false}) {
-    EXPECT_EQ(Profile(popart(Edge(vertical, 100, 150), kPopArt), vertical), line);
-    EXPECT_EQ(Profile(popart(Edge(vertical, 150, 100), kPopArt), vertical), none);
-  }
-}
-
-TEST(Abstract, DarkeningFromLeftToRightDrawsADarkLine) {
-  const Kernel defaults{-1, -1, -1, 0, 0, 0, -1, -1, -1};
+TEST(KernelGradient, PopArtDrawsBrighteningDownAndRightAbstractDarkeningRight) {
+  const Kernel abstract{-1, -1, -1, 0, 0, 0, -1, -1, -1};
   const TBitmap32 flat(5, 4, Pixel{9, 99, 199, 255});
-  EXPECT_EQ(doabstract(flat, defaults), TBitmap32(5, 4, kWhite));
+  EXPECT_EQ(popart(flat, kPopArt), TBitmap32(5, 4, kWhite));
+  EXPECT_EQ(doabstract(flat, abstract), TBitmap32(5, 4, kWhite));
   EXPECT_EQ(doabstract(flat, Kernel{0, 0, 0, 0, 1}), TBitmap32(5, 4, Pixel{246, 156, 56, 255}));
-  EXPECT_EQ(Profile(doabstract(Edge(false, 150, 100), defaults), false),
+  const std::vector<int> popLine{255, 255, 55, 55, 255, 255}, none(6, 255);
+  for (bool vertical : {true, false}) {
+    EXPECT_EQ(AcrossEdge(popart, kPopArt, vertical, 100, 150), popLine);
+    EXPECT_EQ(AcrossEdge(popart, kPopArt, vertical, 150, 100), none);
+    EXPECT_EQ(AcrossEdge(doabstract, abstract, vertical, 100, 150), none);
+  }
+  EXPECT_EQ(AcrossEdge(doabstract, abstract, false, 150, 100),
             (std::vector<int>{255, 255, 105, 105, 255, 255}));
-  EXPECT_EQ(Profile(doabstract(Edge(false, 100, 150), defaults), false), std::vector<int>(6, 255));
-  EXPECT_EQ(Profile(doabstract(Edge(true, 150, 100), defaults), true), std::vector<int>(6, 255));
+  EXPECT_EQ(AcrossEdge(doabstract, abstract, true, 150, 100), none);
 }
 
 TEST(KernelGradient, SmallPicturesRepeatTheirInnerLineInverted) {
