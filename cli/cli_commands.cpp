@@ -101,6 +101,7 @@ int ApplyCommand(const Options& o, std::ostream& out, std::ostream& err) {
   try {
     // Through a document, as the program does it: alpha 255, source in, working out.
     PictureDocument document(std::move(*picture));
+    document.RandomState() = o.seed;
     try {
       RunEffect(document, *o.effect, o.params, false);
     } catch (const std::bad_alloc&) {
@@ -160,6 +161,7 @@ int BatchCommand(const Options& o, std::ostream& out, std::ostream& err, bool te
   const std::string inputFolder = TrimBlanks(o.input);
   BatchJob job{o.input, o.output, ScanBatchFolder(inputFolder)};
   PictureDocument document;
+  document.RandomState() = o.seed;
   ProgressBar bar(err);
 
   BatchObserver observer;

@@ -1,5 +1,6 @@
 #include "cli/cli_options.h"
 
+#include <charconv>
 #include <filesystem>
 #include <map>
 #include <optional>
@@ -103,6 +104,7 @@ ParseResult ParseEffectCommand(Command command, const std::vector<std::string>& 
   bool haveInput = false;
   bool haveOutput = false;
   bool optionsEnded = false;
+  bool haveSeed = false;
   std::map<std::string, std::string> given;     // parameter -> the option that gave it
   std::map<std::string, std::string> selected;  // hidden parameter -> the option that chose it
 
@@ -143,6 +145,20 @@ ParseResult ParseEffectCommand(Command command, const std::vector<std::string>& 
       if (have) return Fail(arg + " given twice");
       (isOutput ? o.output : o.input) = *value;
       have = true;
+      continue;
+    }
+    if (arg == "--seed") {
+      const std::optional<std::string> value = walker.TakeValue();
+      std::uint32_t seed = 0;
+      const char* end = value ? value->data() + value->size() : nullptr;
+      const auto read =
+          value ? std::from_chars(value->data(), end, seed) : std::from_chars_result{};
+      if (!value || value->empty() || read.ec != std::errc() || read.ptr != end)
+        return Fail("--seed must be an integer from 0 to 4294967295" +
+                    (value ? ", not '" + *value + "'" : std::string()));
+      if (haveSeed) return Fail("--seed given twice");
+      o.seed = seed;
+      haveSeed = true;
       continue;
     }
     if (arg.compare(0, 2, "--") != 0)
@@ -267,8 +283,8 @@ std::string VersionText() {
 std::string UsageText() {
   return R"(Usage:
   quillane-cli list
-  quillane-cli apply EFFECT [--PARAM VALUE ...] [INPUT] -o OUTPUT [--format TYPE]
-  quillane-cli batch EFFECT [--PARAM VALUE ...] --input DIR --output DIR
+  quillane-cli apply EFFECT [--PARAM VALUE ...] [--seed N] [INPUT] -o OUTPUT [--format TYPE]
+  quillane-cli batch EFFECT [--PARAM VALUE ...] [--seed N] --input DIR --output DIR
   quillane-cli gallery DIR [--input FILE]
   quillane-cli --help | --version
 
@@ -289,12 +305,17 @@ Turns photographs into artwork with the effects of Quillane, without a window.
 INPUT may be a .jpg, .jpeg, .bmp, .ico, .gif, .wmf, .emf or .png file. Parameters take
 the values "list" shows (whole numbers within their ranges, words, lists, colours);
 unset ones keep their defaults; each may be given once. Values may also be written
---PARAM=VALUE, and "--" ends the options.
+--PARAM=VALUE, and "--" ends the options. --seed N (0 to 4294967295, default 0) starts
+the random generator that brume draws from where N says, as the program starts it at 0;
+the same seed, picture and settings give the same result, and a batch continues the
+sequence from one picture to the next.
 
 Examples:
   quillane-cli apply pencil-sketch --contrast 60 photo.jpg -o sketch.png
   quillane-cli apply pencil-sketch --lighting 140 -o builtin-sketch.jpg
   quillane-cli batch pencil-sketch --input ~/Pictures --output ~/Pictures/sketches
+  quillane-cli apply realism --kernel 1,2,1,0,1,0,-1,-2,-1 photo.jpg -o realism.png
+  quillane-cli apply brume --scope 6 --seed 42 photo.jpg -o misty.jpg
   quillane-cli gallery gallery/
 
 Exit status: 0 done; 1 an input could not be read, an output could not be written,

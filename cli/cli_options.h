@@ -2,6 +2,7 @@
 // every rule about names, ranges and exit codes can be tested without starting the program.
 #pragma once
 
+#include <cstdint>
 #include <string>
 #include <vector>
 
@@ -30,6 +31,9 @@ struct Options {
   std::string output;  // Apply: the file written ("-": standard output); Batch and Gallery: the
                        // folder
   std::string format;  // Apply to "-": the output type's extension without its dot ("png")
+  // Apply and Batch: the random generator's state when the run starts (--seed), as the program
+  // has it when it starts: 0. Effects that draw (brume) continue it from picture to picture.
+  std::uint32_t seed = 0;
 };
 
 struct ParseResult {

@@ -60,6 +60,7 @@ class PictureDocument {
   // The random generator state the effects that draw continue: 0 when the document is made,
   // never reseeded by loading or history, so every run follows on from the one before.
   std::uint32_t& RandomState() { return randomState_; }
+  std::uint32_t RandomState() const { return randomState_; }
 
  private:
   using Picture = std::shared_ptr<const TBitmap32>;

@@ -66,9 +66,20 @@ int RoundBetween(Extended v, int k) {
 // lies to a half (at least 1 / (2 den)), so both round alike. At an exact half the rounding
 // errors of the floating-point value decide, so that value is formed and rounded as the
 // formula does it.
+//
+// The quotient is taken by multiplying with a reciprocal: for num < 2^17 and den <= 510,
+// (num * ceil(2^32 / den)) >> 32 is floor(num / den) exactly, as the error it adds stays below
+// num / 2^32 < 1 / den.
+constexpr auto kReciprocals = [] {
+  std::array<std::uint64_t, 511> t{};
+  for (std::uint64_t d = 1; d < t.size(); ++d) t[d] = ((std::uint64_t{1} << 32) + d - 1) / d;
+  return t;
+}();
+
 template <typename FloatingValue>
 int RoundQuotient(int num, int den, FloatingValue&& floatingValue) {
-  const int k = num / den;
+  const int k = static_cast<int>(
+      (static_cast<std::uint64_t>(num) * kReciprocals[static_cast<std::size_t>(den)]) >> 32);
   const int twiceRest = 2 * (num - k * den);
   if (twiceRest != den) return twiceRest < den ? k : k + 1;
   return RoundBetween(floatingValue(), k);
@@ -91,16 +102,12 @@ inline Hsl FastRgbToHsl(int r, int g, int b) {
   out.s = RoundQuotient(100 * d, sum < 255 ? sum : 510 - sum,
                         [&] { return static_cast<Extended>(Fractions(r, g, b).s) * 100; });
   // Hue in degrees: 60 (g - b) / d, 120 + 60 (b - r) / d or 240 + 60 (r - g) / d by the
-  // largest channel (red before green before blue), a negative one taken a turn round.
-  int num;
-  if (r == mx) {
-    num = 60 * (g - b);
-    if (num < 0) num += 360 * d;
-  } else if (g == mx) {
-    num = 120 * d + 60 * (b - r);
-  } else {
-    num = 240 * d + 60 * (r - g);
-  }
+  // largest channel (red before green before blue), a negative one taken a turn round. All
+  // three are formed and one chosen, which photographs' colours favour over branching.
+  const int fromRed = 60 * (g - b) + (g < b ? 360 * d : 0);
+  const int fromGreen = 120 * d + 60 * (b - r);
+  const int fromBlue = 240 * d + 60 * (r - g);
+  const int num = r == mx ? fromRed : (g == mx ? fromGreen : fromBlue);
   out.h = RoundQuotient(num, d, [&] { return static_cast<Extended>(Fractions(r, g, b).h) * 360; });
   if (out.h == 360) out.h = 0;
   return out;
@@ -138,14 +145,6 @@ int LightnessBlend(int x, int l) {
   if (t < 0) return Round(x + static_cast<Extended>(x) * t);
   return x;
 }
-
-// HSL to RGB works on each channel alone: a pure hue value by H, blended by S, then by L. Each
-// step is a table of its two inputs, built once from the formulas above.
-struct HslTables {
-  std::uint8_t hue[360][3];
-  std::uint8_t saturation[101][256];
-  std::uint8_t lightness[101][256];
-};
 
 const HslTables& Tables() {
   static const HslTables tables = [] {
@@ -233,6 +232,14 @@ bool IsByte(int v) {
 Hsl RgbToHsl(int r, int g, int b) {
   if (!IsByte(r) || !IsByte(g) || !IsByte(b)) return PlainRgbToHsl(r, g, b);
   return FastRgbToHsl(r, g, b);
+}
+
+void RgbToHslRow(const Pixel* in, Hsl* out, int n) {
+  for (int i = 0; i < n; ++i) out[i] = FastRgbToHsl(in[i].r, in[i].g, in[i].b);
+}
+
+const HslTables& HslToRgbTables() {
+  return Tables();
 }
 
 Rgb HslToRgb(int h, int s, int l) {

@@ -37,6 +37,20 @@ Hsl RgbToHsl(int r, int g, int b);
 // give black.
 Rgb HslToRgb(int h, int s, int l);
 
+// RGB to HSL of n pixels (their R, G and B), one call for a whole row: the same values as
+// RgbToHsl gives.
+void RgbToHslRow(const Pixel* in, Hsl* out, int n);
+
+// HSL to RGB as three steps of tables, each channel alone: the pure hue hue[H][c] (c: 0 red,
+// 1 green, 2 blue), blended by saturation[S][x], then by lightness[L][x]. For H 0..359 and S, L
+// 0..100, HslToRgb gives lightness[L][saturation[S][hue[H][c]]].
+struct HslTables {
+  std::uint8_t hue[360][3];
+  std::uint8_t saturation[101][256];
+  std::uint8_t lightness[101][256];
+};
+const HslTables& HslToRgbTables();
+
 // The lightness contrast curve for L (0..100) and the contrast position c (0..89):
 // L1 = L - c + 45, k = tan(c pi / 180); L' = Round(k (L1 - 50)) + 50 for c >= 45 and
 // Round(k (L1 - P)) + P with P = 100 - c below; limited to 0..100. Extended precision.

@@ -1,8 +1,82 @@
-// Realism: a 3 x 3 convolution with a kernel the user edits.
-// Its window opens from the menu; the effect itself is still to come.
+#include "effects/paint/realism.h"
+
+#include <algorithm>
+#include <cstring>
+#include <limits>
+
 #include "effects/registry.h"
+#include "imaging/numeric.h"
+#include "imaging/parallel.h"
 
 namespace quillane {
+namespace {
+
+std::uint8_t ClampWide(std::int64_t v) {
+  return static_cast<std::uint8_t>(v < 0 ? 0 : (v > 255 ? 255 : v));
+}
+
+}  // namespace
+
+TBitmap32 ConvolveReference(const TBitmap32& picture, const Kernel& k, std::uint16_t divisor) {
+  TBitmap32 out = picture;
+  const std::int64_t d = divisor == 0 ? 1 : divisor;
+  for (int y = 1; y < picture.Height() - 1; ++y) {
+    for (int x = 1; x < picture.Width() - 1; ++x) {
+      for (std::uint8_t Pixel::*c : {&Pixel::r, &Pixel::g, &Pixel::b}) {
+        std::int64_t s = 0;
+        for (int t = 0; t < 9; ++t)
+          s += k[static_cast<std::size_t>(t)] * picture.At(x + t % 3 - 1, y + t / 3 - 1).*c;
+        out.At(x, y).*c = ClampWide(s / d);
+      }
+      out.At(x, y).a = 255;
+    }
+  }
+  return out;
+}
+
+TBitmap32 Convolve(const TBitmap32& picture, const Kernel& k, std::uint16_t divisor) {
+  TBitmap32 out(picture.Width(), picture.Height());
+  ConvolveInto(picture, k, divisor, out);
+  return out;
+}
+
+void ConvolveInto(const TBitmap32& picture, const Kernel& k, std::uint16_t divisor,
+                  TBitmap32& out) {
+  const int w = picture.Width();
+  const int h = picture.Height();
+  const auto taps = ShortTaps(k);
+  // Kernels too heavy for 16-bit sums, and divisors other than 1, are rare: they take the
+  // plain way.
+  if (!taps || divisor > 1) {
+    out = ConvolveReference(picture, k, divisor);
+    return;
+  }
+  if (w == 0) return;
+  std::memcpy(out.Data(), picture.Data(), picture.PixelCount() * sizeof(Pixel));
+  if (w < 3 || h < 3) return;
+  const int bytes = w * 4;
+  ParallelRows(1, h - 1, static_cast<std::size_t>(w) * (taps->size() + 2), [&](int y0, int y1) {
+    std::int16_t sums[kSumChunk];
+    for (int y = y0; y < y1; ++y) {
+      const std::uint8_t* rows[3] = {
+          reinterpret_cast<const std::uint8_t*>(picture.ScanLine(y - 1)),
+          reinterpret_cast<const std::uint8_t*>(picture.ScanLine(y)),
+          reinterpret_cast<const std::uint8_t*>(picture.ScanLine(y + 1))};
+      Pixel* row = out.ScanLine(y);
+      auto* dst = reinterpret_cast<std::uint8_t*>(row);
+      for (int first = 4; first < bytes - 4; first += kSumChunk) {
+        const int count = std::min(kSumChunk, bytes - 4 - first);
+        ShortSums(rows, first, count, *taps, sums);
+        for (int i = 0; i < count; ++i) dst[first + i] = ClampShort(sums[i]);
+      }
+      for (int x = 1; x < w - 1; ++x) row[x].a = 255;
+    }
+  });
+}
+
+TBitmap32 realism(const TBitmap32& source, const Kernel& k) {
+  return Convolve(source, k, 1);
+}
 
 const EffectSpec& RealismEffect() {
   static const EffectSpec entry{
@@ -18,6 +92,29 @@ const EffectSpec& RealismEffect() {
       .batchTag = "Realism",
       .collapsedHeight = 157,
       .expandedHeight = 240,
+      .batchPushesHistory = true,
+      .apply = {"Button1", "Convert", "Convert with this setup"},
+      .restoreDefaults = {"Button3", "Default", "Default setup"},
+      .inputField = "Edit10",
+      .outputField = "Edit11",
+      .params =
+          {
+              {.kind = ParamKind::Cells,
+               .name = "kernel",
+               .captionLabel = "Label1",
+               .caption = "You can change the figures",
+               .minimum = std::numeric_limits<std::int32_t>::min(),
+               .maximum = std::numeric_limits<std::int32_t>::max(),
+               .cells = {"Edit1", "Edit2", "Edit3", "Edit4", "Edit5", "Edit6", "Edit7", "Edit8",
+                         "Edit9"},
+               .defaultList = {1, 2, 1, 0, 0, 0, -1, -1, -1},
+               .hint = "Change the number to get different effect",
+               .help = "the 3 x 3 weights, row by row (top row first)"},
+          },
+      .routine =
+          [](const EffectInput& in) {
+            return realism(in.source, KernelFrom(in.params.GetList("kernel")));
+          },
   };
   return entry;
 }

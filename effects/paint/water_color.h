@@ -1,0 +1,36 @@
+// Water colour: cycles of one sharpening pass and two median passes, which wash fine texture
+// out into patches of even colour.
+#pragma once
+
+#include "imaging/bitmap32.h"
+
+namespace quillane {
+
+// cycles (1..5) times: SharpenPass, then MedianPass twice. Both passes change only the
+// interior (rows 1..H-2, columns 1..W-2), so the one-pixel frame keeps the source's colours;
+// neither writes alpha, which stays the source's. A picture under 3 pixels wide or high comes
+// back unchanged.
+TBitmap32 watercolor(const TBitmap32& source, int cycles);
+
+// The same into out, with scratch as the second picture the passes need; both must already
+// have source's size (a caller that runs the effect again and again reuses them).
+void WaterColorInto(const TBitmap32& source, int cycles, TBitmap32& out, TBitmap32& scratch);
+
+// The interior of out becomes, per colour channel c of in:
+//   clamp(5 c(x, y) - c(x, y-1) - c(x-1, y) - c(x+1, y) - c(x, y+1)) to 0..255.
+// out must have in's size; its frame and alpha bytes are not written.
+void SharpenPass(const TBitmap32& in, TBitmap32& out);
+
+// The interior of out becomes, per colour channel, the median of the nine values of in in the
+// 3 x 3 block around the pixel. out must have in's size; its frame and alpha are not written.
+void MedianPass(const TBitmap32& in, TBitmap32& out);
+
+// The same effect as written out first: full copies per pass, nine values per channel gathered
+// and sorted with SelectionSort, entry 4 taken. The reference for watercolor.
+TBitmap32 WaterColorReference(const TBitmap32& source, int cycles);
+
+// Ascending sort of a[0..last]: for i from 0 to last-1, for j from last down to i+1, a[j] and
+// a[i] swap when a[j] < a[i].
+void SelectionSort(int* a, int last);
+
+}  // namespace quillane

@@ -1,0 +1,63 @@
+#include "effects/paint/water_color.h"
+
+#include <gtest/gtest.h>
+
+namespace quillane {
+namespace {
+
+TBitmap32 Noise(int w, int h, unsigned seed) {
+  TBitmap32 b(w, h);
+  for (int y = 0; y < h; ++y)
+    for (int x = 0; x < w; ++x) {
+      seed = seed * 1103515245u + 12345u;
+      // Mostly mid tones with some extremes, so that the sharpening clamps on both sides.
+      b.At(x, y) =
+          Pixel{static_cast<std::uint8_t>(seed >> 24), static_cast<std::uint8_t>(seed >> 16),
+                static_cast<std::uint8_t>(seed % 7 == 0 ? 255 : seed >> 8),
+                static_cast<std::uint8_t>(seed >> 4)};
+    }
+  return b;
+}
+
+TEST(WaterColor, MediansRemoveSpecksAndLinesButKeepTheEdgeOfTwoAreas) {
+  const Pixel dark{20, 30, 40, 255}, bright{250, 240, 230, 255};
+  TBitmap32 speck(7, 7, dark);
+  speck.At(3, 3) = bright;
+  EXPECT_EQ(watercolor(speck, 1), TBitmap32(7, 7, dark));
+
+  TBitmap32 line(7, 6, dark);
+  for (int y = 0; y < 6; ++y) line.At(3, y) = bright;
+  const TBitmap32 washed = watercolor(line, 1);
+  for (int y = 1; y < 5; ++y) EXPECT_EQ(washed.At(3, y), dark) << y;
+  EXPECT_EQ(washed.At(3, 0), bright);  // the frame is never written
+
+  TBitmap32 halves(8, 6, dark);
+  for (int y = 0; y < 6; ++y)
+    for (int x = 4; x < 8; ++x) halves.At(x, y) = bright;
+  EXPECT_EQ(watercolor(halves, 3), halves);
+}
+
+TEST(WaterColor, FastPassesGiveTheSelectionSortBytesAndKeepTheFrame) {
+  const TBitmap32 in = Noise(40, 9, 11);
+  TBitmap32 median(40, 9);
+  MedianPass(in, median);
+  for (int y = 1; y < 8; ++y)
+    for (int x = 1; x < 39; ++x)
+      for (std::uint8_t Pixel::*c : {&Pixel::r, &Pixel::g, &Pixel::b}) {
+        int block[9];
+        for (int i = 0; i < 9; ++i) block[i] = in.At(x + i % 3 - 1, y + i / 3 - 1).*c;
+        SelectionSort(block, 8);
+        ASSERT_EQ(median.At(x, y).*c, block[4]) << x << "," << y;
+      }
+  for (int n = 1; n <= 5; ++n) {
+    const TBitmap32 out = watercolor(in, n);
+    ASSERT_EQ(out, WaterColorReference(in, n)) << n;
+    for (int x = 0; x < 40; ++x) EXPECT_EQ(out.At(x, 8), in.At(x, 8));
+    for (int y = 0; y < 9; ++y) EXPECT_EQ(out.At(0, y), in.At(0, y));
+  }
+  for (auto [w, h] : {std::pair{0, 0}, {1, 6}, {6, 1}, {2, 5}, {5, 2}})
+    EXPECT_EQ(watercolor(Noise(w, h, 3), 3), Noise(w, h, 3));
+}
+
+}  // namespace
+}  // namespace quillane
