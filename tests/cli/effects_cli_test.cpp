@@ -1,4 +1,4 @@
-// The Color menu's effects from quillane-cli: the same bytes as the routines run here.
+// Every effect from quillane-cli: the same bytes as its routine run here.
 #include <gtest/gtest.h>
 #include <stdlib.h>
 #include <sys/wait.h>
@@ -25,7 +25,7 @@ TBitmap32 Input() {
 // Runs "quillane-cli apply" with arguments on Input() into a bitmap file; the exit code, with
 // the picture written in output and what went to stderr in err.
 int Apply(const std::string& arguments, TBitmap32& output, std::string& err) {
-  const std::string dir = testing::TempDir() + "/color-cli-" + std::to_string(getpid());
+  const std::string dir = testing::TempDir() + "/effects-cli-" + std::to_string(getpid());
   std::filesystem::create_directories(dir);
   SaveBitmap24(Input(), dir + "/in.bmp");
   std::filesystem::remove(dir + "/out.bmp");
@@ -42,24 +42,30 @@ int Apply(const std::string& arguments, TBitmap32& output, std::string& err) {
   return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
 }
 
-TEST(ColorCli, EveryEffectWritesWhatItsRoutineGivesAndBadValuesExitWithTwo) {
+TEST(EffectsCli, EveryEffectWritesWhatItsRoutineGivesAndBadValuesExitWithTwo) {
   struct Case {
     std::string arguments;
-    const char* param;
-    EffectParams::Values value;
+    std::vector<std::pair<const char*, EffectParams::Values>> set;
     std::uint32_t seed;
   };
   const Case cases[] = {
-      {"color-pencil --pressure 60", "pressure", {60}, 0},
-      {"realism --kernel=0,1,0,1,-3,1,0,1,0", "kernel", {0, 1, 0, 1, -3, 1, 0, 1, 0}, 0},
-      {"abstract --kernel 1,1,1,0,2,0,-1,-1,-1", "kernel", {1, 1, 1, 0, 2, 0, -1, -1, -1}, 0},
-      {"pop-art --kernel -2147483648,0,0,0,0,0,0,0,2147483647",
-       "kernel",
-       {-2147483648ll, 0, 0, 0, 0, 0, 0, 0, 2147483647},
+      {"pen-sketch --pen-pressure 200", {{"pen-pressure", {200}}}, 0},
+      {"vuzorar --vuzorar-pressure 220 --scope 2 --direction falling",
+       {{"vuzorar-pressure", {220}}, {"scope", {2}}, {"direction", {2}}},
        0},
-      {"water-color --scope 2", "scope", {2}, 0},
-      {"brume --scope 7", "scope", {7}, 0},
-      {"brume --seed 4000000000", "scope", {3}, 4000000000u},
+      {"vuzorar --direction 4", {{"direction", {4}}}, 0},
+      {"pen-and-ink --adjust-thread 100 --color-ink 1",
+       {{"adjust-thread", {100}}, {"color-ink", {1}}},
+       0},
+      {"color-pencil --pressure 60", {{"pressure", {60}}}, 0},
+      {"realism --kernel=0,1,0,1,-3,1,0,1,0", {{"kernel", {0, 1, 0, 1, -3, 1, 0, 1, 0}}}, 0},
+      {"abstract --kernel 1,1,1,0,2,0,-1,-1,-1", {{"kernel", {1, 1, 1, 0, 2, 0, -1, -1, -1}}}, 0},
+      {"pop-art --kernel -2147483648,0,0,0,0,0,0,0,2147483647",
+       {{"kernel", {-2147483648ll, 0, 0, 0, 0, 0, 0, 0, 2147483647}}},
+       0},
+      {"water-color --scope 2", {{"scope", {2}}}, 0},
+      {"brume --scope 7", {{"scope", {7}}}, 0},
+      {"brume --seed 4000000000", {}, 4000000000u},
   };
   for (const Case& c : cases) {
     SCOPED_TRACE(c.arguments);
@@ -69,7 +75,7 @@ TEST(ColorCli, EveryEffectWritesWhatItsRoutineGivesAndBadValuesExitWithTwo) {
     const TBitmap32 input = Input();
     const EffectSpec& spec = *FindEffectByCliName(c.arguments.substr(0, c.arguments.find(' ')));
     EffectParams params = spec.Defaults();
-    params.SetList(c.param, c.value);
+    for (const auto& [name, value] : c.set) params.SetList(name, value);
     std::uint32_t seed = c.seed;
     EXPECT_EQ(output, spec.routine({input, input, params, &seed}));
   }
