@@ -124,14 +124,13 @@ TEST_F(CliRun, BadParametersExitWithTwoAndUnreadableInputWithOneWritingNothing) 
   EXPECT_EQ(Run("apply pencil-sketch --contrast 90 -o " + Q("o.png")), 2);
   EXPECT_NE(err_.find("--contrast must be an integer from 0 to 89"), std::string::npos) << err_;
 
-  std::ofstream(Path("broken.jpg"), std::ios::binary) << "\xFF\xD8\xFF not really";
   // A true header, then image data that does not inflate: libpng printed its own line for it.
   std::ofstream(Path("broken.png"), std::ios::binary) << std::string(
       "\x89PNG\r\n\x1a\n\0\0\0\rIHDR\0\0\0\x10\0\0\0\x10\x08\x02\0\0\0\x90\x91h6"
       "\0\0\0\x05IDATxxxxx\0\0\0\0",
       46);
   std::ofstream(Path("picture.tga"), std::ios::binary) << "whatever";
-  for (const char* name : {"broken.jpg", "broken.png", "picture.tga", "missing.bmp"}) {
+  for (const char* name : {"broken.png", "picture.tga", "missing.bmp"}) {
     EXPECT_EQ(Run("apply pencil-sketch " + Q(name) + " -o " + Q("o.png")), 1) << name;
     EXPECT_NE(err_.find(Path(name)), std::string::npos) << err_;
     EXPECT_EQ(err_.find("libpng"), std::string::npos) << err_;
