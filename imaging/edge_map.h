@@ -17,4 +17,10 @@ namespace quillane {
 // gives the inverted input along that direction, 2 gives both lines the inverted second line.
 void picsobel(TBitmap32& bitmap);
 
+// The same edge map computed the plain way, pixel by pixel and channel by channel from a
+// snapshot, border columns, border rows, then the inversion. picsobel must equal it byte for
+// byte, alpha included; it is kept as the oracle for the banded, threaded fast path. For
+// pictures of at least 3 by 3.
+TBitmap32 PicsobelReference(const TBitmap32& input);
+
 }  // namespace quillane

@@ -160,4 +160,12 @@ const EffectSpec& PenAndInkEffect() {
   return entry;
 }
 
+TBitmap32 PenAndInkReference(const TBitmap32& source, int threshold, bool colorInk) {
+  TBitmap32 thresholded = source;
+  PictureTwoValue(thresholded, threshold);
+  TBitmap32 outline = penandink(thresholded);
+  if (colorInk) ColorValue(outline, source);
+  return outline;
+}
+
 }  // namespace quillane

@@ -30,4 +30,7 @@ void ColorValue(TBitmap32& outline, const TBitmap32& source);
 // the outline's ink in the source's colours. Identical to the three steps above in turn.
 TBitmap32 Pen_and_Ink(const TBitmap32& source, int threshold, bool colorInk);
 
+// Those three steps in turn; the oracle that the fused Pen_and_Ink must equal.
+TBitmap32 PenAndInkReference(const TBitmap32& source, int threshold, bool colorInk);
+
 }  // namespace quillane

@@ -5,6 +5,7 @@
 
 #include "effects/registry.h"
 #include "imaging/edge_map.h"
+#include "imaging/numeric.h"
 #include "imaging/parallel.h"
 #include "imaging/tone.h"
 
@@ -66,6 +67,17 @@ const EffectSpec& PenSketchEffect() {
           },
   };
   return entry;
+}
+
+TBitmap32 PenSketchReference(const TBitmap32& source, int pressure) {
+  TBitmap32 drawing = source;
+  picsobel(drawing);
+  for (int y = 0; y < drawing.Height(); ++y)
+    for (int x = 0; x < drawing.Width(); ++x) {
+      Pixel& p = drawing.At(x, y);
+      p = GrayValue(p.r, p.g, p.b) > pressure ? kPaper : kInk;
+    }
+  return drawing;
 }
 
 }  // namespace quillane

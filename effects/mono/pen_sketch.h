@@ -15,4 +15,8 @@ void two_Value1Click(TBitmap32& bitmap, int level);
 // The edge map of a copy of source (picsobel), thresholded at pressure (0..255).
 TBitmap32 PenSketch(const TBitmap32& source, int pressure);
 
+// The pen sketch the plain way, pixel by pixel through GrayValue; the oracle that PenSketch's
+// row-wise gray levels must equal.
+TBitmap32 PenSketchReference(const TBitmap32& source, int pressure);
+
 }  // namespace quillane

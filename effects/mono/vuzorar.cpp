@@ -215,4 +215,11 @@ const EffectSpec& VuzorarEffect() {
   return entry;
 }
 
+TBitmap32 VuzorarReference(const TBitmap32& source, int pressure, int scope,
+                           HatchDirection direction) {
+  TBitmap32 drawing = PenSketchReference(source, pressure);
+  for (int i = 0; i < scope; ++i) BitmapDilate(drawing, direction);
+  return drawing;
+}
+
 }  // namespace quillane

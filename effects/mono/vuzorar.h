@@ -24,4 +24,9 @@ void BitmapDilate(TBitmap32& bitmap, HatchDirection direction);
 // direction. Identical to thresholding the edge map and calling BitmapDilate scope times.
 TBitmap32 Vuzorar(const TBitmap32& source, int pressure, int scope, HatchDirection direction);
 
+// Those steps themselves: PenSketchReference, then BitmapDilate scope times. The oracle that
+// the fused, banded Vuzorar must equal.
+TBitmap32 VuzorarReference(const TBitmap32& source, int pressure, int scope,
+                           HatchDirection direction);
+
 }  // namespace quillane

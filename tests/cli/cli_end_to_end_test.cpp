@@ -1,4 +1,5 @@
-// Runs the built quillane-cli and checks what it writes against the routines run here.
+// Runs the built quillane-cli and checks what it writes against the routines run here. The
+// parsing itself is cli_options_test's; these check that its results reach the routines.
 #include <gtest/gtest.h>
 #include <stdlib.h>
 #include <sys/wait.h>
@@ -11,6 +12,9 @@
 #include "codecs/picture_file.h"
 #include "data/startup_picture.h"
 #include "effects/mono/bw_sketch.h"
+#include "effects/mono/pen_and_ink.h"
+#include "effects/mono/pen_sketch.h"
+#include "effects/mono/vuzorar.h"
 #include "effects/registry.h"
 
 namespace quillane {
@@ -80,11 +84,18 @@ TBitmap32 Pencil(TBitmap32 picture, PencilToneMode mode, int contrast, int light
 TEST_F(CliRun, ApplyWritesExactlyWhatTheRoutineGives) {
   SaveBitmap24(Picture(31, 22), Path("in.bmp"));
   const TBitmap32 loaded = *LoadPictureFile(Path("in.bmp"));
-
-  ASSERT_EQ(Run("apply pencil-sketch --lighting 140 " + Q("in.bmp") + " -o " + Q("out.png")), 0)
-      << err_;
-  EXPECT_EQ(FromPng(Path("out.png")), Pencil(loaded, PencilToneMode::Lighting, 45, 140));
-
+  // Each effect's own parameters, the direction by name and by number.
+  const std::pair<std::string, TBitmap32> cases[] = {
+      {"pencil-sketch --lighting 140", Pencil(loaded, PencilToneMode::Lighting, 45, 140)},
+      {"pen-sketch --pen-pressure 200", PenSketch(loaded, 200)},
+      {"vuzorar --vuzorar-pressure 220 --scope 2 --direction falling",
+       Vuzorar(loaded, 220, 2, HatchDirection::Falling)},
+      {"vuzorar --direction 4", Vuzorar(loaded, 128, 3, HatchDirection::Horizontal)},
+      {"pen-and-ink --adjust-thread 100 --color-ink 1", Pen_and_Ink(loaded, 100, true)}};
+  for (const auto& [arguments, expected] : cases) {
+    ASSERT_EQ(Run("apply " + arguments + " " + Q("in.bmp") + " -o " + Q("out.png")), 0) << err_;
+    EXPECT_EQ(FromPng(Path("out.png")), expected) << arguments;
+  }
   ASSERT_EQ(Run("apply pencil-sketch --contrast=30 " + Q("in.bmp") + " -o " + Q("out.BMP")), 0)
       << err_;
   EXPECT_EQ(*LoadPictureFile(Path("out.BMP")), Pencil(loaded, PencilToneMode::Contrast, 30, 128));
@@ -112,16 +123,14 @@ TEST_F(CliRun, ApplyReadsPngStandardInputAndTheBuiltInPicture) {
 TEST_F(CliRun, BadParametersExitWithTwoAndUnreadableInputWithOneWritingNothing) {
   EXPECT_EQ(Run("apply pencil-sketch --contrast 90 -o " + Q("o.png")), 2);
   EXPECT_NE(err_.find("--contrast must be an integer from 0 to 89"), std::string::npos) << err_;
-  EXPECT_EQ(Run("frobnicate"), 2);
 
-  std::ofstream(Path("broken.jpg"), std::ios::binary) << "\xFF\xD8\xFF not really";
   // A true header, then image data that does not inflate: libpng printed its own line for it.
   std::ofstream(Path("broken.png"), std::ios::binary) << std::string(
       "\x89PNG\r\n\x1a\n\0\0\0\rIHDR\0\0\0\x10\0\0\0\x10\x08\x02\0\0\0\x90\x91h6"
       "\0\0\0\x05IDATxxxxx\0\0\0\0",
       46);
   std::ofstream(Path("picture.tga"), std::ios::binary) << "whatever";
-  for (const char* name : {"broken.jpg", "broken.png", "picture.tga", "missing.bmp"}) {
+  for (const char* name : {"broken.png", "picture.tga", "missing.bmp"}) {
     EXPECT_EQ(Run("apply pencil-sketch " + Q(name) + " -o " + Q("o.png")), 1) << name;
     EXPECT_NE(err_.find(Path(name)), std::string::npos) << err_;
     EXPECT_EQ(err_.find("libpng"), std::string::npos) << err_;
@@ -214,10 +223,8 @@ TEST_F(CliRun, BatchConvertsTheFolderAndListsSkippedFiles) {
   // Not a terminal: one plain line per picture.
   EXPECT_NE(err_.find("picture 1 of 2: a.jpg -> " + out + "/a-PencilSketch.jpg"), std::string::npos)
       << err_;
-  SaveJpeg(Pencil(*LoadPictureFile(Path("in/b.BMP")), PencilToneMode::Lighting, 45, 100),
-           Path("expected.jpg"), 90);
-  EXPECT_EQ(ReadText(out + "/b-PencilSketch.jpg"), ReadText(Path("expected.jpg")));
-  EXPECT_TRUE(fs::is_regular_file(out + "/a-PencilSketch.jpg"));
+  // The pictures' bytes are the batch loop's own tests.
+  EXPECT_TRUE(fs::is_regular_file(out + "/b-PencilSketch.jpg"));
 
   // A name that is not UTF-8 and holds an escape sequence is shown escaped, never raw.
   std::ofstream(Path("in/x\x1b[2J\xff.jpg"), std::ios::binary) << "not a picture";
@@ -232,9 +239,6 @@ TEST_F(CliRun, BatchConvertsTheFolderAndListsSkippedFiles) {
 
   EXPECT_EQ(batch("", "nowhere"), 1);
   EXPECT_NE(err_.find("Sorry: Input Director in not exist."), std::string::npos) << err_;
-  fs::create_directory(Path("empty"));
-  EXPECT_EQ(batch("", "empty"), 1);
-  EXPECT_NE(err_.find("Sorry: There is no picture to convert."), std::string::npos) << err_;
 }
 
 }  // namespace

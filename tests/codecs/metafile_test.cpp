@@ -12,6 +12,22 @@ namespace {
 
 using codecs::DecodeMetafile;
 
+// records behind a placeable header (none for unitsPerInch 0) of w x h units and the
+// standard header.
+std::vector<std::uint8_t> Wmf(const ByteWriter& records, int w, int h, int unitsPerInch,
+                              unsigned objects, std::uint32_t largestRecord) {
+  ByteWriter file;
+  if (unitsPerInch > 0) {
+    file.U32(0x9AC6CDD7).U16(0).I16(0).I16(0).I16(w).I16(h).U16(unitsPerInch).U32(0);
+    std::uint16_t checksum = 0;
+    for (std::size_t i = 0; i < 20; i += 2) checksum ^= file.bytes[i] | file.bytes[i + 1] << 8;
+    file.U16(checksum);
+  }
+  file.U16(1).U16(9).U16(0x0300).U32(static_cast<std::uint32_t>(9 + records.Size() / 2));
+  file.U16(objects).U32(largestRecord).U16(0);
+  return file.Append(records.bytes).bytes;
+}
+
 // A placeable metafile of 40 x 30 pixels, in units of 1/96 inch or (k = 15) twips: white, a red
 // rectangle from (10, 5) to (30, 25) drawn with a null pen, and a blue line along row 2 from
 // column 2 to 37.
@@ -36,14 +52,7 @@ std::vector<std::uint8_t> WmfWithRectangle(int k = 1) {
   record(0x0214, {2 * k, 2 * k});                   // MoveTo (y, x)
   record(0x0213, {2 * k, 37 * k});                  // LineTo (y, x)
   record(0x0000, {});                               // EOF
-  ByteWriter file;
-  file.U32(0x9AC6CDD7).U16(0).I16(0).I16(0).I16(40 * k).I16(30 * k).I16(96 * k).U32(0);
-  std::uint16_t checksum = 0;
-  for (std::size_t i = 0; i < 20; i += 2) checksum ^= file.bytes[i] | file.bytes[i + 1] << 8;
-  file.U16(checksum);
-  file.U16(1).U16(9).U16(0x0300).U32(static_cast<std::uint32_t>(9 + records.Size() / 2));
-  file.U16(3).U32(largest).U16(0);
-  return file.Append(records.bytes).bytes;
+  return Wmf(records, 40 * k, 30 * k, 96 * k, 3, largest);
 }
 
 TEST(WindowsMetafile, PlaysShapesAndLinesOnWhite) {
@@ -73,16 +82,7 @@ std::vector<std::uint8_t> WmfWithBitmap(const TBitmap32& picture, int unitsPerIn
   records.U32(words).U16(0x0F43).U32(0x00CC0020).U16(0);  // StretchDIB, SRCCOPY, RGB colours
   for (int v : {picture.Height(), picture.Width(), 0, 0, h, w, 0, 0}) records.I16(v);
   records.Append(dib.bytes()).U32(3).U16(0);  // EOF
-  ByteWriter file;
-  if (placeable) {
-    file.U32(0x9AC6CDD7).U16(0).I16(0).I16(0).I16(w).I16(h).U16(unitsPerInch).U32(0);
-    std::uint16_t checksum = 0;
-    for (std::size_t i = 0; i < 20; i += 2) checksum ^= file.bytes[i] | file.bytes[i + 1] << 8;
-    file.U16(checksum);
-  }
-  file.U16(1).U16(9).U16(0x0300).U32(static_cast<std::uint32_t>(9 + records.Size() / 2));
-  file.U16(0).U32(words).U16(0);
-  return file.Append(records.bytes).bytes;
+  return Wmf(records, w, h, placeable ? unitsPerInch : 0, 0, words);
 }
 
 // Such a file loaded as a blown-up top-left corner (placeable) or at 68 x 68 (not placeable).

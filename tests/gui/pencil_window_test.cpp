@@ -3,10 +3,10 @@
 #include <QSlider>
 #include <QToolButton>
 
-#include "ui/picture_view.h"
 #include "effects/mono/bw_sketch.h"
 #include "effects/mono/bw_sketch_window.h"
 #include "tests/gui/gui_fixture.h"
+#include "ui/picture_view.h"
 
 namespace quillane {
 namespace {
@@ -53,16 +53,15 @@ TEST_F(PencilWindow, NumberLabelsShowPercentOfTheRange) {
   EXPECT_EQ(Text("Label4"), "100");
 }
 
+// Undo itself is the main window's test.
 TEST_F(PencilWindow, OkDrawsThePictureAndRecordsIt) {
   Main().SetLineArt(true);
   const TBitmap32 source = Main().Document().Source();
   PressOk();
   const TBitmap32 expected = peccilsketch(source, PencilToneMode::Contrast, 45, 128);
   EXPECT_EQ(Main().Document().Working(), expected);
-  EXPECT_NE(Main().Document().Working(), source);
   EXPECT_EQ(Main().Document().Source(), source);
   EXPECT_EQ(Main().Document().UndoCount(), 1);
-  EXPECT_EQ(Main().Document().Slot(Main().Document().CurrentSlot()), expected);
   EXPECT_EQ(Main().StatusText(), "Pencil Sketch");
   EXPECT_FALSE(Main().LineArt());
   EXPECT_TRUE(ToolChild<QToolButton>(1, "Button2")->isEnabled());
@@ -73,11 +72,6 @@ TEST_F(PencilWindow, OkDrawsThePictureAndRecordsIt) {
   PressOk();
   EXPECT_EQ(Main().Document().Working(), expected);
   EXPECT_EQ(Main().Document().UndoCount(), 2);
-
-  Main().SpeedButton3Click();
-  Main().SpeedButton3Click();
-  EXPECT_EQ(Main().Document().Working(), source);
-  EXPECT_EQ(Main().StatusText(), "Undo");
 }
 
 TEST_F(PencilWindow, TheSliderMovedLastChoosesTheTone) {

@@ -63,9 +63,11 @@ class ScriptedPlatform : public PlatformServices {
  private:
   template <typename T>
   static std::optional<T> Next(std::deque<std::optional<T>>& answers) {
-    if (answers.empty()) return std::nullopt;
-    std::optional<T> answer = std::move(answers.front());
-    answers.pop_front();
+    std::optional<T> answer;
+    if (!answers.empty()) {
+      answer.swap(answers.front());
+      answers.pop_front();
+    }
     return answer;
   }
 };
