@@ -76,7 +76,7 @@ int RoundQuotient(int num, int den, FloatingValue&& floatingValue) {
 
 // RGB to HSL for channels 0..255 in integer arithmetic, identical to the floating-point
 // formulas (checked for every colour in the tests).
-inline Hsl FastRgbToHsl(int r, int g, int b) {
+Hsl IntegerRgbToHsl(int r, int g, int b) {
   const int mx = std::max(r, std::max(g, b));
   const int mn = std::min(r, std::min(g, b));
   Hsl out;
@@ -103,6 +103,61 @@ inline Hsl FastRgbToHsl(int r, int g, int b) {
   }
   out.h = RoundQuotient(num, d, [&] { return static_cast<Extended>(Fractions(r, g, b).h) * 360; });
   if (out.h == 360) out.h = 0;
+  return out;
+}
+
+// The same answers from tables. The saturation depends on the largest and smallest channel
+// alone (the formula sees nothing else), so a table of the two holds it exactly. The hue is a
+// sector start (0, 120, 240) plus Round(60 diff / d), diff being the difference of the other
+// two channels; adding whole multiples of 120 (or 360) does not move a rounding unless the
+// quotient is an exact half, where the floating-point rounding errors of the actual colour
+// decide. Those are marked in the table and left to the integer conversion.
+constexpr std::int8_t kExactHalf = -128;
+
+struct RgbToHslTables {
+  std::uint8_t saturation[256][256];  // [largest][smallest]
+  std::int8_t hueStep[256][511];      // [d][diff + 255]: Round(60 diff / d), or kExactHalf
+};
+
+const RgbToHslTables& HslFromRgbTables() {
+  static const RgbToHslTables tables = [] {
+    RgbToHslTables t{};
+    for (int mx = 0; mx < 256; ++mx)
+      for (int mn = 0; mn <= mx; ++mn)
+        t.saturation[mx][mn] = static_cast<std::uint8_t>(IntegerRgbToHsl(mx, mn, mn).s);
+    for (int d = 1; d < 256; ++d)
+      for (int diff = -d; diff <= d; ++diff) {
+        const int a = 60 * std::abs(diff);
+        const int k = a / d;
+        const int twiceRest = 2 * (a - k * d);
+        const int step = k + (twiceRest > d ? 1 : 0);
+        t.hueStep[d][diff + 255] =
+            twiceRest == d ? kExactHalf : static_cast<std::int8_t>(diff < 0 ? -step : step);
+      }
+    return t;
+  }();
+  return tables;
+}
+
+inline Hsl FastRgbToHsl(const RgbToHslTables& t, int r, int g, int b) {
+  const int mx = std::max(r, std::max(g, b));
+  const int mn = std::min(r, std::min(g, b));
+  Hsl out;
+  out.l = ((mx + mn) * 200 + 510) / 1020;
+  if (mx == mn) return out;
+  out.s = t.saturation[mx][mn];
+  int start, diff;
+  if (r == mx) {
+    start = 0, diff = g - b;
+  } else if (g == mx) {
+    start = 120, diff = b - r;
+  } else {
+    start = 240, diff = r - g;
+  }
+  const int step = t.hueStep[mx - mn][diff + 255];
+  if (step == kExactHalf) return IntegerRgbToHsl(r, g, b);
+  const int h = start + step;
+  out.h = h < 0 ? h + 360 : h;
   return out;
 }
 
@@ -227,7 +282,7 @@ bool IsByte(int v) {
 
 Hsl RgbToHsl(int r, int g, int b) {
   if (!IsByte(r) || !IsByte(g) || !IsByte(b)) return PlainRgbToHsl(r, g, b);
-  return FastRgbToHsl(r, g, b);
+  return FastRgbToHsl(HslFromRgbTables(), r, g, b);
 }
 
 Rgb HslToRgb(int h, int s, int l) {
@@ -268,6 +323,7 @@ TBitmap32 PencilContrastPass(const TBitmap32& input, int c) {
         static_cast<std::uint8_t>(HslToRgb(hsl.h, hsl.s, curve[static_cast<std::size_t>(hsl.l)]).r);
   }
   const HslTables& tables = Tables();
+  const RgbToHslTables& fromRgb = HslFromRgbTables();
   const int w = out.Width();
   ParallelRows(0, out.Height(), static_cast<std::size_t>(w) * 4, [&](int y0, int y1) {
     for (int y = y0; y < y1; ++y) {
@@ -278,7 +334,7 @@ TBitmap32 PencilContrastPass(const TBitmap32& input, int c) {
           const std::uint8_t v = grayLevel[p.r];
           row[x] = Pixel{v, v, v, 255};
         } else {
-          const Hsl hsl = FastRgbToHsl(p.r, p.g, p.b);
+          const Hsl hsl = FastRgbToHsl(fromRgb, p.r, p.g, p.b);
           const Rgb rgb =
               TableHslToRgb(tables, hsl.h, hsl.s, curve[static_cast<std::size_t>(hsl.l)]);
           row[x] = Pixel{static_cast<std::uint8_t>(rgb.b), static_cast<std::uint8_t>(rgb.g),
@@ -305,6 +361,50 @@ void ConvertToGray(TBitmap32& bitmap) {
   ParallelRows(0, bitmap.Height(), static_cast<std::size_t>(w), [&](int y0, int y1) {
     for (int y = y0; y < y1; ++y) GrayRow(bitmap.ScanLine(y), bitmap.ScanLine(y), w, 0);
   });
+}
+
+void ConvertRowToGray(Pixel* row, int width) {
+  GrayRow(row, row, width, 0);
+}
+
+HslRowChanger::HslRowChanger(const HslChange& change)
+    : hueSaturation_(360 * 101), lightness_(change.lightness) {
+  const HslTables& t = Tables();
+  for (int h = 0; h < 360; ++h) {
+    const std::uint8_t* hue = t.hue[change.hue[static_cast<std::size_t>(h)]];
+    for (int s = 0; s < 101; ++s) {
+      const std::uint8_t* sat = t.saturation[change.saturation[static_cast<std::size_t>(s)]];
+      hueSaturation_[static_cast<std::size_t>(h * 101 + s)] =
+          static_cast<std::uint32_t>(sat[hue[0]]) << 16 |
+          static_cast<std::uint32_t>(sat[hue[1]]) << 8 | sat[hue[2]];
+    }
+  }
+}
+
+void HslRowChanger::Row(const Pixel* in, Pixel* out, int width,
+                        const std::int16_t* lightnessShift) const {
+  const RgbToHslTables& fromRgb = HslFromRgbTables();
+  const HslTables& toRgb = Tables();
+  for (int x = 0; x < width; ++x) {
+    const Pixel p = in[x];
+    const Hsl hsl = FastRgbToHsl(fromRgb, p.r, p.g, p.b);
+    int l = hsl.l;
+    if (lightnessShift != nullptr) l = std::clamp(l + lightnessShift[x], 0, 100);
+    const std::uint8_t* light = toRgb.lightness[lightness_[static_cast<std::size_t>(l)]];
+    const std::uint32_t c = hueSaturation_[static_cast<std::size_t>(hsl.h * 101 + hsl.s)];
+    out[x] = Pixel{light[c & 0xFF], light[(c >> 8) & 0xFF], light[c >> 16], 255};
+  }
+}
+
+HslChange NoHslChange() {
+  HslChange change{};
+  for (int h = 0; h < 360; ++h)
+    change.hue[static_cast<std::size_t>(h)] = static_cast<std::uint16_t>(h);
+  for (int v = 0; v <= 100; ++v) {
+    change.saturation[static_cast<std::size_t>(v)] = static_cast<std::uint8_t>(v);
+    change.lightness[static_cast<std::size_t>(v)] = static_cast<std::uint8_t>(v);
+  }
+  return change;
 }
 
 }  // namespace quillane
