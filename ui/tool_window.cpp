@@ -12,9 +12,9 @@
 #include <QToolButton>
 #include <QVBoxLayout>
 
+#include "batch/batch_convert.h"
 #include "ui/glyphs.h"
 #include "ui/platform.h"
-#include "batch/batch_convert.h"
 
 namespace quillane {
 namespace {
@@ -270,16 +270,17 @@ void ToolWindow::SpeedButton3Click() {
 
 void ToolWindow::SpeedButton4Click() {
   if (inputField_ == nullptr || outputField_ == nullptr || !spec_.routine) return;
+  // The window's own first step may change a setting ("For current" is cleared).
+  BeforeBatch();
   // Every setting is checked before the first picture is loaded, so a bad one converts nothing.
   const std::optional<EffectParams> params = CheckedParams();
   if (!params) return;
-  BeforeBatch();
   // The loop itself runs the effect (and the history step of the effects whose batch does);
   // the window adds its own steps after each picture.
   const BatchResult result = host_.ConvertBatchFolder(
       spec_, *params, inputField_->text(), outputField_->text(), [this] { AfterEffect(); });
   if (result.end != BatchResult::End::Completed) return;
-  AfterBatch();
+  AfterBatch(result);
   host_.ShowBatchConvertOk();
 }
 

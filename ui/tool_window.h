@@ -53,7 +53,8 @@ class ToolWindow : public QWidget {
   void SetWindowHeights(int collapsed, int expanded);
 
  public slots:
-  void ApplyClick();            // the apply button (OK, or "Convert" in the kernel windows)
+  // The apply button (OK, or "Convert" in the kernel windows).
+  virtual void ApplyClick();
   void RestoreDefaultsClick();  // "Default": every parameter back to its default, then apply
   void ColorUpClick();          // "Color up"
   void SpeedButton1Click();     // show or hide the batch panel
@@ -71,10 +72,11 @@ class ToolWindow : public QWidget {
   virtual void FormClose();
   // After a successful apply (OK or each picture of a batch), once the document has the result.
   virtual void AfterApply() {}
-  // Convert's own steps for the windows that have some: before the loop, and after a loop
-  // that ran to its end (before the completion dialog shows).
+  // Convert's own steps for the windows that have some: before anything else (even before the
+  // settings are read), and after a loop that ran to its end (before the completion dialog
+  // shows).
   virtual void BeforeBatch() {}
-  virtual void AfterBatch() {}
+  virtual void AfterBatch(const BatchResult& /*result*/) {}
   // A parameter changed, after the one it selects was set.
   virtual void ControlChanged(const ParamSpec& param);
 
