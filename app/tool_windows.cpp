@@ -4,8 +4,9 @@
 #include <iterator>
 
 #include "app/main_window.h"
-#include "ui/tool_window.h"
 #include "effects/mono/bw_sketch_window.h"
+#include "effects/surface/snapshot_window.h"
+#include "ui/tool_window.h"
 
 namespace quillane {
 namespace {
@@ -24,6 +25,7 @@ struct SpecialWindow {
 };
 constexpr SpecialWindow kSpecialWindows[] = {
     {1, Make<TBack_and_White_Sketch>},
+    {17, Make<TStria>},
 };
 
 }  // namespace

@@ -96,6 +96,9 @@ const Reference kReferences[] = {
      {252, 252, 252, 255},
      {230, 230, 230, 255},
      {255, 255, 255, 255}},
+    {"hsl-adjust", 0xefd517a0fc12dbf8, {137, 83, 47, 255}, {151, 150, 141, 255}, {28, 74, 49, 255}},
+    {"emboss", 0x9b93a73ce25c71c1, {149, 149, 149, 255}, {158, 158, 158, 255}, {28, 73, 48, 255}},
+    {"stria", 0x63d58d2b0864063c, {68, 41, 23, 255}, {151, 150, 140, 255}, {28, 73, 48, 255}},
 };
 
 TEST(EffectTable, EveryEffectGivesItsReferenceResultOnTheBuiltInPicture) {

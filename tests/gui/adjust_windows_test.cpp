@@ -1,0 +1,154 @@
+// The windows of the ColorAdjust and Veins menus, driven by their control names.
+#include <QCheckBox>
+#include <QLabel>
+#include <QLineEdit>
+#include <QMouseEvent>
+#include <QPointingDevice>
+#include <QPushButton>
+#include <QRadioButton>
+#include <QSlider>
+#include <QToolButton>
+
+#include "batch/batch_convert_ok.h"
+#include "codecs/picture_file.h"
+#include "effects/adjust/hsl_adjust.h"
+#include "effects/surface/emboss.h"
+#include "effects/surface/snapshot_window.h"
+#include "effects/surface/stria.h"
+#include "tests/gui/temp_folder.h"
+
+namespace quillane {
+namespace {
+
+constexpr int kHsl = 11;
+constexpr int kEmboss = 15;
+constexpr int kStria = 17;
+
+class AdjustWindows : public FileGuiTest {
+ protected:
+  ToolWindow& Open(const char* menuAction, int number) {
+    MenuAction(menuAction)->trigger();
+    return Tool(number);
+  }
+  QString Text(int number, const char* label) { return ToolChild<QLabel>(number, label)->text(); }
+  void Slide(int number, const char* slider, int value) {
+    ToolChild<QSlider>(number, slider)->setValue(value);
+  }
+  const TBitmap32& Source() { return Main().Document().Source(); }
+  const TBitmap32& Working() { return Main().Document().Working(); }
+
+  // One picture in folder "in" converted by the open window into "out"; the output's name.
+  std::vector<std::string> ConvertOnePicture(int number, const char* inputField,
+                                             const char* outputField) {
+    std::filesystem::create_directory(LocalPath("in"));
+    SaveBitmap24(TestPicture(13, 9), LocalPath("in/p.bmp"));
+    platform_.folderAnswers.push_back(Path("in"));
+    ToolChild<QToolButton>(number, "SpeedButton1")->click();
+    ToolChild<QToolButton>(number, "SpeedButton2")->click();
+    ToolChild<QLineEdit>(number, outputField)->setText(Path("out"));
+    EXPECT_EQ(ToolChild<QLineEdit>(number, inputField)->text(), Path("in"));
+    ToolChild<QToolButton>(number, "SpeedButton4")->click();
+    EXPECT_TRUE(Main().BatchConvertOk().isVisible());
+    return Entries("out");
+  }
+};
+
+TEST_F(AdjustWindows, EmbossShowsItsNumbersAndAppliesOnOk) {
+  Open("Emboss1", kEmboss);
+  EXPECT_EQ(Text(kEmboss, "Label9"), "100");
+  EXPECT_EQ(Text(kEmboss, "Label3"), "3");
+  Slide(kEmboss, "TrackBar1", 40);
+  Slide(kEmboss, "TrackBar2", 5);
+  EXPECT_EQ(Text(kEmboss, "Label9"), "40");
+  EXPECT_EQ(Text(kEmboss, "Label3"), "5");
+  ToolChild<QPushButton>(kEmboss, "Button2")->click();
+  EXPECT_EQ(Working(), emboss(Source(), 40, 5));
+  EXPECT_EQ(Main().StatusText(), "Emboss");
+  EXPECT_EQ(Main().Document().UndoCount(), 1);
+}
+
+TEST_F(AdjustWindows, EmbossBatchWritesTaggedFilesAndRecordsEachPicture) {
+  Open("Emboss1", kEmboss);
+  EXPECT_EQ(ConvertOnePicture(kEmboss, "Edit10", "Edit11"),
+            std::vector<std::string>{"p-Emboss.jpg"});
+  EXPECT_EQ(Working(), emboss(Source(), 100, 3));
+  EXPECT_EQ(Main().Document().UndoCount(), 1);
+}
+
+TEST_F(AdjustWindows, HslAdjustShowsSignedNumbersAndStartsNeutralOnEveryShowing) {
+  Open("HSLadjust1", kHsl);
+  EXPECT_EQ(ToolChild<QToolButton>(kHsl, "SpeedButton1"), nullptr);
+  for (const char* label : {"Label4", "Label3", "Label9"}) EXPECT_EQ(Text(kHsl, label), "0");
+  for (auto [position, shown] : {std::pair{0, "-100"}, {360, "100"}, {181, "1"}, {270, "50"}}) {
+    Slide(kHsl, "TrackBar1", position);
+    EXPECT_EQ(Text(kHsl, "Label4"), shown) << position;
+  }
+  Slide(kHsl, "TrackBar2", 0);
+  Slide(kHsl, "TrackBar3", 200);
+  EXPECT_EQ(Text(kHsl, "Label3"), "-100");
+  EXPECT_EQ(Text(kHsl, "Label9"), "100");
+  Slide(kHsl, "TrackBar3", 130);
+  ToolChild<QPushButton>(kHsl, "Button1")->click();
+  EXPECT_EQ(Working(), HslAdjust(Source(), 270, 0, 130));
+  EXPECT_EQ(Main().StatusText(), "HSL Adjusted");
+  EXPECT_EQ(Main().Document().UndoCount(), 1);
+
+  Tool(kHsl).close();
+  Open("HSLadjust1", kHsl);
+  EXPECT_EQ(ToolChild<QSlider>(kHsl, "TrackBar1")->value(), 180);
+  EXPECT_EQ(Text(kHsl, "Label9"), "0");
+}
+
+TEST_F(AdjustWindows, StriaTakesItsColourFromTheDialogAndStartsFromTheSnapshot) {
+  Open("Emboss1", kEmboss);
+  ToolChild<QPushButton>(kEmboss, "Button2")->click();
+  const TBitmap32 embossed = Working();
+  Open("Verticalstria1", kStria);
+  EXPECT_EQ(Text(kStria, "Label3"), "1");
+  EXPECT_EQ(Text(kStria, "Label4"), "2");
+  EXPECT_EQ(Text(kStria, "Label9"), "50");
+  for (auto [position, shown] : {std::pair{0, "0"}, {255, "100"}, {40, "16"}}) {
+    Slide(kStria, "TrackBar1", position);
+    EXPECT_EQ(Text(kStria, "Label9"), shown);
+  }
+  Slide(kStria, "TrackBar3", 2);
+  ToolChild<QRadioButton>(kStria, "RadioButton2")->setChecked(true);
+  platform_.colorAnswers.push_back(0x0000FF);
+  // A device of the test's own: the toolkit's default one outlives the application object.
+  static const QPointingDevice mouse("test mouse", 1, QInputDevice::DeviceType::Mouse,
+                                     QPointingDevice::PointerType::Generic,
+                                     QInputDevice::Capability::Position, 1, 3);
+  QMouseEvent release(QEvent::MouseButtonRelease, QPointF(4, 4), QPointF(4, 4), QPointF(4, 4),
+                      Qt::LeftButton, Qt::NoButton, Qt::NoModifier, &mouse);
+  QCoreApplication::sendEvent(ToolChild<QWidget>(kStria, "ColorPanel"), &release);
+  EXPECT_EQ(platform_.colorRequests, std::vector<std::uint32_t>{0});
+
+  // With "For current" both presses start from the picture as it was when the window opened.
+  const TBitmap32 expected = stria(embossed, Source().Width(), Source().Height(),
+                                   StriaDirection::Horizontal, 2, 2, 40, 0xFF);
+  for (int press = 1; press <= 2; ++press) {
+    ToolChild<QPushButton>(kStria, "Button1")->click();
+    EXPECT_EQ(Working(), expected);
+    EXPECT_EQ(Main().StatusText(), "Added stria");
+    EXPECT_EQ(Main().Document().UndoCount(), 1 + press);
+  }
+  ToolChild<QCheckBox>(kStria, "CheckBox1")->setChecked(false);
+  ToolChild<QPushButton>(kStria, "Button1")->click();
+  EXPECT_EQ(Working(), stria(Source(), Source().Width(), Source().Height(),
+                             StriaDirection::Horizontal, 2, 2, 40, 0xFF));
+  Tool(kStria).close();
+  Open("Verticalstria1", kStria);
+  EXPECT_TRUE(ToolChild<QCheckBox>(kStria, "CheckBox1")->isChecked());
+}
+
+TEST_F(AdjustWindows, StriaBatchStripesEachSourceAndRefreshesTheSnapshot) {
+  Open("Verticalstria1", kStria);
+  EXPECT_EQ(ConvertOnePicture(kStria, "Edit1", "Edit2"), std::vector<std::string>{"p-Stria.jpg"});
+  EXPECT_FALSE(ToolChild<QCheckBox>(kStria, "CheckBox1")->isChecked());
+  EXPECT_EQ(Working(), stria(Source(), 13, 9, StriaDirection::Vertical, 1, 2, 128, 0));
+  EXPECT_EQ(dynamic_cast<SnapshotWindow&>(Tool(kStria)).Snapshot(), Working());
+  EXPECT_EQ(Main().Document().UndoCount(), 1);
+}
+
+}  // namespace
+}  // namespace quillane
