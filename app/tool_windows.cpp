@@ -4,6 +4,7 @@
 #include <iterator>
 
 #include "app/main_window.h"
+#include "effects/adjust/color_panel_window.h"
 #include "effects/mono/bw_sketch_window.h"
 #include "effects/surface/snapshot_window.h"
 #include "ui/tool_window.h"
@@ -25,6 +26,7 @@ struct SpecialWindow {
 };
 constexpr SpecialWindow kSpecialWindows[] = {
     {1, Make<TBack_and_White_Sketch>},
+    {13, Make<TColor_Panel>},
     {17, Make<TStria>},
 };
 

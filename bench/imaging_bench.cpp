@@ -11,6 +11,7 @@
 #endif
 
 #include "bench/synthetic_photo.h"
+#include "effects/adjust/color_panel.h"
 #include "effects/adjust/hsl_adjust.h"
 #include "effects/mono/bw_sketch.h"
 #include "effects/surface/emboss.h"
@@ -132,6 +133,10 @@ BENCHMARK(BM_PencilSketch)
   BENCHMARK(name)->Unit(benchmark::kMillisecond)->MeasureProcessCPUTime()->UseRealTime()
 
 QUILLANE_EFFECT_BENCH(BM_Emboss, emboss(Photo(), 100, 3));
+QUILLANE_EFFECT_BENCH(BM_Panel2x2, ColorPanel(Photo(), PanelLayout::Panel2x2));
+QUILLANE_EFFECT_BENCH(BM_Panel3x3, ColorPanel(Photo(), PanelLayout::Panel3x3));
+QUILLANE_EFFECT_BENCH(BM_Pane3x3, ColorPanel(Photo(), PanelLayout::Pane3x3));
+QUILLANE_EFFECT_BENCH(BM_Catercorner16, ColorPanel(Photo(), PanelLayout::Catercorner16));
 QUILLANE_EFFECT_BENCH(BM_HslAdjust, HslAdjust(Photo(), 240, 130, 90));
 QUILLANE_EFFECT_BENCH(BM_Stria,
                       stria(Photo(), kWidth, kHeight, StriaDirection::Vertical, 1, 2, 128, 0));

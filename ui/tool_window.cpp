@@ -94,7 +94,7 @@ void ToolWindow::BuildButtonRow(QBoxLayout* outer) {
     connect(button, &QPushButton::clicked, this, click);
     row->addWidget(button);
   };
-  addButton(spec_.apply, &ToolWindow::ApplyClick);
+  if (!spec_.apply.objectName.empty()) addButton(spec_.apply, &ToolWindow::ApplyClick);
   if (!spec_.restoreDefaults.objectName.empty())
     addButton(spec_.restoreDefaults, &ToolWindow::RestoreDefaultsClick);
   outer->addLayout(row);

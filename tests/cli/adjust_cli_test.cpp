@@ -10,6 +10,7 @@
 #include <string>
 
 #include "codecs/picture_file.h"
+#include "effects/adjust/color_panel.h"
 #include "effects/adjust/hsl_adjust.h"
 #include "effects/surface/emboss.h"
 #include "effects/surface/stria.h"
@@ -48,6 +49,8 @@ TEST(AdjustCli, ApplyWritesWhatTheRoutineGives) {
     std::function<TBitmap32(const TBitmap32&)> expected;
   } const cases[] = {
       {"emboss --lighting 30 --depth 2", [](const TBitmap32& p) { return emboss(p, 30, 2); }},
+      {"color-panel --layout catercorner-16",
+       [](const TBitmap32& p) { return ColorPanel(p, PanelLayout::Catercorner16); }},
       {"hsl-adjust --hue 40 --saturation 150 --lighting 80",
        [](const TBitmap32& p) { return HslAdjust(p, 40, 150, 80); }},
       {"stria --direction horizontal --thickness 3 --space 4 --transparent 60 --color '#ff8000'",

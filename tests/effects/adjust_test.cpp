@@ -4,7 +4,9 @@
 
 #include <algorithm>
 
+#include "effects/adjust/color_panel.h"
 #include "effects/adjust/hsl_adjust.h"
+#include "imaging/numeric.h"
 #include "imaging/tone.h"
 #include "tests/imaging/random_picture.h"
 
@@ -58,6 +60,157 @@ TEST(HslAdjust, MatchesTheConversionsPixelByPixel) {
           }
         ASSERT_EQ(HslAdjust(in, hue, s, l), expected) << w << "x" << h << " " << hue;
       }
+}
+
+Pixel Flood(Pixel p, char flood) {
+  switch (flood) {
+    case 'A':
+      p.r = 255;
+      break;
+    case 'B':
+      p.g = 255, p.b = 0;
+      break;
+    case 'C':
+      p.r = 0, p.b = 255;
+      break;
+    case 'D':
+      p.r = 255, p.b = 255;
+      break;
+  }
+  return p;
+}
+
+TEST(ColorPanel, Panel2x2WritesQuartersFromTheHalfSizeCopy) {
+  const TBitmap32 in = RandomPicture(4, 4, 5);
+  const TBitmap32 out = ColorPanel(in, PanelLayout::Panel2x2);
+  for (int y = 0; y < 4; ++y)
+    for (int x = 0; x < 4; ++x) {
+      if (x % 2 == 1 && y % 2 == 1) continue;
+      EXPECT_EQ(out.At(x, y), in.At(x, y)) << x << "," << y;
+    }
+  // The half-size copy's pixel (1, 1) is the source's (2, 2); alpha stays the base's.
+  const auto expect = [&](int x, int y, char flood) {
+    Pixel p = Flood(in.At(2, 2), flood);
+    p.a = in.At(x, y).a;
+    EXPECT_EQ(out.At(x, y), p) << flood;
+  };
+  expect(1, 1, 'A'), expect(3, 1, 'B'), expect(1, 3, 'C'), expect(3, 3, 'D');
+}
+
+TEST(ColorPanel, Panel3x3TilesAThirdSizeCopyWithAlphaZero) {
+  const TBitmap32 out = ColorPanel(RandomPicture(301, 200, 2), PanelLayout::Panel3x3);
+  ASSERT_EQ(out.Width(), 300);
+  ASSERT_EQ(out.Height(), 198);
+  for (int y = 0; y < 198; ++y)
+    for (int x = 0; x < 300; ++x) ASSERT_EQ(out.At(x, y).a, 0);
+  for (auto [w, h] : {std::pair{2, 9}, {9, 2}, {0, 0}})
+    EXPECT_TRUE(ColorPanel(RandomPicture(w, h, 1), PanelLayout::Panel3x3).Empty());
+  // One source pixel per tile: every tile's own tint.
+  const TBitmap32 tiles = ColorPanel(TBitmap32(3, 3, Rgb3(100, 30, 200)), PanelLayout::Panel3x3);
+  const Pixel expected[9] = {Rgb3(255, 30, 200), Rgb3(0, 150, 80),   Rgb3(100, 30, 255),
+                             Rgb3(20, 90, 255),  Rgb3(220, 90, 200), Rgb3(255, 30, 255),
+                             Rgb3(180, 0, 255),  Rgb3(0, 110, 255),  Rgb3(180, 110, 0)};
+  for (int i = 0; i < 9; ++i) {
+    Pixel p = expected[i];
+    p.a = 0;
+    EXPECT_EQ(tiles.At(i % 3, i / 3), p) << i;
+  }
+}
+
+// The zone layouts as stated, pixel by pixel in extended precision.
+char PlainZone(PanelLayout layout, int x, int y, int w, int h) {
+  const Extended W = w, H = h;
+  const auto triangle = [](bool lower, bool right) {
+    return lower ? (right ? 'D' : 'C') : (right ? 'B' : 'A');
+  };
+  switch (layout) {
+    case PanelLayout::Pane2x2:
+      return y < H / 2 ? (x < W / 2 ? 'A' : 'C') : (x < W / 2 ? 'B' : 'D');
+    case PanelLayout::Pane3x3: {
+      const auto zone = [](int v, Extended size) {
+        return v <= size / 3 ? 0
+                             : (v <= static_cast<Extended>(2 * static_cast<int>(size)) / 3 ? 1 : 2);
+      };
+      return static_cast<char>('0' + 3 * zone(y, H) + zone(x, W));
+    }
+    case PanelLayout::Catercorner4:
+      return triangle(x <= (W / H) * y, x >= static_cast<Extended>(w * (h - y)) / H);
+    default: {
+      const bool top = y <= H / 2, left = x <= W / 2;
+      const Extended u = left ? x : x - W / 2, v = top ? y : y - H / 2;
+      const Extended far = static_cast<Extended>(w * (h - y)) / H;
+      const bool right =
+          top && left ? x >= (H / 2 - y) * W / H : (left || top ? x >= far : u >= far);
+      return triangle(u <= (W / H) * v, right);
+    }
+  }
+}
+
+Pixel PlainZonePixel(Pixel p, char zone) {
+  const auto add = [](std::uint8_t& c, int v) {
+    c = static_cast<std::uint8_t>(std::min(255, c + v));
+  };
+  switch (zone) {
+    case '0':
+      p.r = 255;
+      break;
+    case '1':
+      p.g = 255, add(p.b, 50);
+      break;
+    case '2':
+      p.b = 255;
+      break;
+    case '3':
+      p.g = 255, add(p.r, 100);
+      break;
+    case '4':
+      p.b = 255, add(p.g, 50);
+      break;
+    case '5':
+      p.g = 255;
+      break;
+    case '6':
+      p.b = 255, p.r = 255;
+      break;
+    case '7':
+      p.b = 255, p.g = 255;
+      break;
+    case '8':
+      p.r = 255;
+      break;
+    default:
+      return Flood(p, zone);
+  }
+  return p;
+}
+
+TEST(ColorPanel, ZoneLayoutsMatchTheirBordersOnOddAndEvenSizes) {
+  for (PanelLayout layout : {PanelLayout::Pane2x2, PanelLayout::Pane3x3, PanelLayout::Catercorner4,
+                             PanelLayout::Catercorner16})
+    for (auto [w, h] : {std::pair{7, 5},
+                        {10, 3},
+                        {9, 9},
+                        {6, 4},
+                        {5, 8},
+                        {300, 7},
+                        {31, 17},
+                        {1, 6},
+                        {6, 1},
+                        {2, 2},
+                        {0, 0}}) {
+      const TBitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w * h));
+      TBitmap32 expected = in;
+      for (int y = 1; y < h; ++y)
+        for (int x = 1; x < w; ++x)
+          expected.At(x, y) = PlainZonePixel(in.At(x, y), PlainZone(layout, x, y, w, h));
+      ASSERT_EQ(ColorPanel(in, layout), expected)
+          << static_cast<int>(layout) << " " << w << "x" << h;
+    }
+  // Pane 3 x 3 at width 300: column 100 is in the left zone, column 200 in the middle one.
+  const TBitmap32 pane = ColorPanel(TBitmap32(300, 2, Rgb3(10, 10, 10)), PanelLayout::Pane3x3);
+  EXPECT_EQ(pane.At(100, 1), Rgb3(110, 255, 10));
+  EXPECT_EQ(pane.At(200, 1), Rgb3(10, 60, 255));
+  EXPECT_EQ(pane.At(201, 1), Rgb3(10, 255, 10));
 }
 
 }  // namespace

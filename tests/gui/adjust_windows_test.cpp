@@ -11,6 +11,7 @@
 
 #include "batch/batch_convert_ok.h"
 #include "codecs/picture_file.h"
+#include "effects/adjust/color_panel.h"
 #include "effects/adjust/hsl_adjust.h"
 #include "effects/surface/emboss.h"
 #include "effects/surface/snapshot_window.h"
@@ -21,6 +22,7 @@ namespace quillane {
 namespace {
 
 constexpr int kHsl = 11;
+constexpr int kPanel = 13;
 constexpr int kEmboss = 15;
 constexpr int kStria = 17;
 
@@ -148,6 +150,60 @@ TEST_F(AdjustWindows, StriaBatchStripesEachSourceAndRefreshesTheSnapshot) {
   EXPECT_EQ(Working(), stria(Source(), 13, 9, StriaDirection::Vertical, 1, 2, 128, 0));
   EXPECT_EQ(dynamic_cast<SnapshotWindow&>(Tool(kStria)).Snapshot(), Working());
   EXPECT_EQ(Main().Document().UndoCount(), 1);
+}
+
+TEST_F(AdjustWindows, ColorPanelAppliesALayoutWhenItBecomesSelected) {
+  Open("Colorpanel1", kPanel);
+  EXPECT_EQ(ToolChild<QPushButton>(kPanel, "Button1"), nullptr);
+  const auto click = [&](const char* name) { ToolChild<QRadioButton>(kPanel, name)->click(); };
+  struct Case {
+    const char* button;
+    PanelLayout layout;
+    const char* status;
+  } const cases[] = {{"RadioButton5", PanelLayout::Pane3x3, "Color Pane"},
+                     {"RadioButton6", PanelLayout::Catercorner16, "Color Catercorner"},
+                     {"RadioButton1", PanelLayout::Panel2x2, "Color Panels"},
+                     {"RadioButton4", PanelLayout::Panel3x3, "Color Panels"}};
+  int steps = 0;
+  for (const Case& c : cases) {
+    click(c.button);
+    EXPECT_EQ(Working(), ColorPanel(Source(), c.layout)) << c.button;
+    EXPECT_EQ(Main().StatusText(), c.status);
+    EXPECT_EQ(Main().Document().UndoCount(), ++steps);
+  }
+  click("RadioButton4");  // already selected: nothing happens
+  EXPECT_EQ(Main().Document().UndoCount(), steps);
+  Tool(kPanel).close();
+  Open("Colorpanel1", kPanel);
+  EXPECT_TRUE(ToolChild<QRadioButton>(kPanel, "RadioButton4")->isChecked());
+}
+
+// Panel 3 x 3 on a picture under 3 pixels leaves nothing to show; what follows must cope.
+TEST_F(AdjustWindows, AnEmptyWorkingPictureIsRefusedWhereNothingCanBeDone) {
+  Main().ShowNewPicture(TestPicture(2, 5), true);
+  Open("Colorpanel1", kPanel);
+  ToolChild<QRadioButton>(kPanel, "RadioButton4")->click();
+  ASSERT_TRUE(Working().Empty());
+  EXPECT_EQ(Main().StatusText(), "Color Panels");
+
+  platform_.saveAnswers.push_back(FileChoice{Path("out.jpg"), 1});
+  Main().SpeedButton2Click();
+  EXPECT_FALSE(Exists("out.jpg"));
+  ASSERT_EQ(platform_.errors.size(), 1u);
+  EXPECT_TRUE(platform_.errors[0].contains("no picture to save"))
+      << platform_.errors[0].toStdString();
+  Main().SetDisplaySize(250);
+
+  Open("Verticalstria1", kStria);  // "For current": stripes over nothing
+  ToolChild<QPushButton>(kStria, "Button1")->click();
+  EXPECT_TRUE(Working().Empty());
+  Open("Emboss1", kEmboss);  // from the source, which is still there
+  ToolChild<QPushButton>(kEmboss, "Button2")->click();
+  EXPECT_EQ(Working(), emboss(Source(), 100, 3));
+  Main().SpeedButton3Click();
+  Main().SpeedButton3Click();
+  EXPECT_TRUE(Working().Empty());
+  EXPECT_EQ(platform_.errors.size(), 1u);
 }
 
 }  // namespace
