@@ -11,7 +11,9 @@
 #endif
 
 #include "bench/synthetic_photo.h"
+#include "effects/adjust/color_filter.h"
 #include "effects/adjust/color_panel.h"
+#include "effects/adjust/color_variety.h"
 #include "effects/adjust/hsl_adjust.h"
 #include "effects/mono/bw_sketch.h"
 #include "effects/surface/emboss.h"
@@ -133,6 +135,8 @@ BENCHMARK(BM_PencilSketch)
   BENCHMARK(name)->Unit(benchmark::kMillisecond)->MeasureProcessCPUTime()->UseRealTime()
 
 QUILLANE_EFFECT_BENCH(BM_Emboss, emboss(Photo(), 100, 3));
+QUILLANE_EFFECT_BENCH(BM_ColorFilter, filter(Photo(), ColorFilterKind::Yellow));
+QUILLANE_EFFECT_BENCH(BM_ColorVariety, VarietyClicks(Photo(), {1, 5, 5}));
 QUILLANE_EFFECT_BENCH(BM_Panel2x2, ColorPanel(Photo(), PanelLayout::Panel2x2));
 QUILLANE_EFFECT_BENCH(BM_Panel3x3, ColorPanel(Photo(), PanelLayout::Panel3x3));
 QUILLANE_EFFECT_BENCH(BM_Pane3x3, ColorPanel(Photo(), PanelLayout::Pane3x3));

@@ -182,6 +182,27 @@ QLabel* ToolWindow::FindLabel(const QString& name) const {
   return findChild<QLabel*>(name);
 }
 
+namespace {
+
+bool TakeFromLayout(QLayout* layout, QWidget* widget) {
+  if (layout->indexOf(widget) >= 0) {
+    layout->removeWidget(widget);
+    return true;
+  }
+  for (int i = 0; i < layout->count(); ++i)
+    if (QLayout* inner = layout->itemAt(i)->layout(); inner && TakeFromLayout(inner, widget))
+      return true;
+  return false;
+}
+
+}  // namespace
+
+QWidget* ToolWindow::TakeControl(const QString& name) {
+  auto* widget = findChild<QWidget*>(name);
+  if (widget != nullptr) TakeFromLayout(controlsLayout_, widget);
+  return widget;
+}
+
 // --- Showing and closing ---------------------------------------------------------------------
 
 void ToolWindow::showEvent(QShowEvent* event) {

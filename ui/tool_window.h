@@ -84,6 +84,9 @@ class ToolWindow : public QWidget {
   // The rows of controls, top to bottom; subclasses may insert rows of their own.
   QVBoxLayout* ControlsLayout() { return controlsLayout_; }
   QLabel* FindLabel(const QString& name) const;
+  // The control named name taken out of the rows of controls, for a window that places it
+  // itself; null when there is none.
+  QWidget* TakeControl(const QString& name);
 
   void showEvent(QShowEvent* event) override;
   void closeEvent(QCloseEvent* event) override;

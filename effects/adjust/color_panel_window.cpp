@@ -10,18 +10,6 @@
 namespace quillane {
 namespace {
 
-// Removes widget from whichever layout under layout holds it.
-bool TakeFromLayout(QLayout* layout, QWidget* widget) {
-  if (layout->indexOf(widget) >= 0) {
-    layout->removeWidget(widget);
-    return true;
-  }
-  for (int i = 0; i < layout->count(); ++i)
-    if (QLayout* inner = layout->itemAt(i)->layout(); inner && TakeFromLayout(inner, widget))
-      return true;
-  return false;
-}
-
 const char* StatusFor(PanelLayout layout) {
   switch (layout) {
     case PanelLayout::Pane2x2:
@@ -46,10 +34,8 @@ TColor_Panel::TColor_Panel(const EffectSpec& spec, ToolHost& host, QWidget* pare
   grid->setHorizontalSpacing(12);
   for (int column = 0; column < 2; ++column)
     for (int row = 0; row < 3; ++row) {
-      auto* button = findChild<QRadioButton*>(kColumns[column][row]);
-      if (button == nullptr) continue;
-      TakeFromLayout(ControlsLayout(), button);
-      grid->addWidget(button, row, column);
+      if (QWidget* button = TakeControl(kColumns[column][row]))
+        grid->addWidget(button, row, column);
     }
   ControlsLayout()->addLayout(grid);
   // Nothing is selected at first, so that the first click on any layout applies it.

@@ -10,7 +10,9 @@
 #include <string>
 
 #include "codecs/picture_file.h"
+#include "effects/adjust/color_filter.h"
 #include "effects/adjust/color_panel.h"
+#include "effects/adjust/color_variety.h"
 #include "effects/adjust/hsl_adjust.h"
 #include "effects/surface/emboss.h"
 #include "effects/surface/stria.h"
@@ -49,6 +51,12 @@ TEST(AdjustCli, ApplyWritesWhatTheRoutineGives) {
     std::function<TBitmap32(const TBitmap32&)> expected;
   } const cases[] = {
       {"emboss --lighting 30 --depth 2", [](const TBitmap32& p) { return emboss(p, 30, 2); }},
+      {"color-filter --filter cyan",
+       [](const TBitmap32& p) { return filter(p, ColorFilterKind::Cyan); }},
+      {"color-variety --more red,cyan,cyan",
+       [](const TBitmap32& p) {
+         return VarietyClicks(p, {1, 5, 5});
+       }},
       {"color-panel --layout catercorner-16",
        [](const TBitmap32& p) { return ColorPanel(p, PanelLayout::Catercorner16); }},
       {"hsl-adjust --hue 40 --saturation 150 --lighting 80",

@@ -4,7 +4,9 @@
 
 #include <algorithm>
 
+#include "effects/adjust/color_filter.h"
 #include "effects/adjust/color_panel.h"
+#include "effects/adjust/color_variety.h"
 #include "effects/adjust/hsl_adjust.h"
 #include "imaging/numeric.h"
 #include "imaging/tone.h"
@@ -211,6 +213,49 @@ TEST(ColorPanel, ZoneLayoutsMatchTheirBordersOnOddAndEvenSizes) {
   EXPECT_EQ(pane.At(100, 1), Rgb3(110, 255, 10));
   EXPECT_EQ(pane.At(200, 1), Rgb3(10, 60, 255));
   EXPECT_EQ(pane.At(201, 1), Rgb3(10, 255, 10));
+}
+
+TEST(ColorFilter, GrayThenTheFilterChannelsAtFull) {
+  struct Case {
+    ColorFilterKind kind;
+    Pixel in, out;
+  } const cases[] = {
+      {ColorFilterKind::Red, Rgb3(255, 255, 255), Rgb3(255, 255, 255)},
+      {ColorFilterKind::Red, Rgb3(0, 0, 0), Rgb3(255, 0, 0)},
+      {ColorFilterKind::Red, Rgb3(10, 20, 30), Rgb3(255, 18, 18)},
+      {ColorFilterKind::Yellow, Rgb3(128, 128, 128), Rgb3(255, 255, 128)},
+      {ColorFilterKind::Cyan, Rgb3(5, 0, 0), Rgb3(2, 255, 255)},  // Round(1.5) = 2
+      {ColorFilterKind::Purple, Rgb3(0, 100, 0), Rgb3(255, 59, 255)},
+      {ColorFilterKind::Green, Rgb3(0, 0, 100), Rgb3(11, 255, 11)},
+      {ColorFilterKind::Blue, Rgb3(50, 50, 50), Rgb3(50, 50, 255)},
+  };
+  for (const Case& c : cases) {
+    Pixel in = c.in;
+    in.a = 0;
+    EXPECT_EQ(filter(TBitmap32(1, 1, in), c.kind).At(0, 0), c.out) << static_cast<int>(c.kind);
+  }
+  EXPECT_TRUE(filter(TBitmap32(), ColorFilterKind::Red).Empty());
+}
+
+TEST(ColorVariety, ClicksAccumulateUpToFull) {
+  const TBitmap32 one(1, 1, Rgb3(100, 150, 250));
+  EXPECT_EQ(variety(one, 4).At(0, 0), Rgb3(110, 160, 250));
+  EXPECT_EQ(variety(variety(one, 4), 4).At(0, 0), Rgb3(120, 170, 250));
+  EXPECT_EQ(VarietyClicks(one, {1, 5}).At(0, 0), Rgb3(110, 160, 255));
+  EXPECT_EQ(
+      VarietyClicks(TBitmap32(1, 1, Rgb3(5, 0, 0)), std::vector<std::int64_t>(25, 1)).At(0, 0),
+      Rgb3(255, 0, 0));
+  EXPECT_EQ(
+      VarietyClicks(TBitmap32(1, 1, Rgb3(4, 0, 0)), std::vector<std::int64_t>(25, 1)).At(0, 0),
+      Rgb3(254, 0, 0));
+  // All at once is click after click, on every size.
+  for (auto [w, h] : {std::pair{13, 7}, {1, 1}, {0, 0}}) {
+    const TBitmap32 in = RandomPicture(w, h, 4);
+    const std::vector<std::int64_t> clicks = {3, 6, 6, 2, 4, 5, 1, 6};
+    TBitmap32 stepwise = in;
+    for (std::int64_t c : clicks) stepwise = variety(stepwise, static_cast<int>(c));
+    EXPECT_EQ(VarietyClicks(in, clicks), stepwise) << w << "x" << h;
+  }
 }
 
 }  // namespace

@@ -11,19 +11,25 @@
 
 #include "batch/batch_convert_ok.h"
 #include "codecs/picture_file.h"
+#include "effects/adjust/color_filter.h"
 #include "effects/adjust/color_panel.h"
+#include "effects/adjust/color_variety.h"
 #include "effects/adjust/hsl_adjust.h"
+#include "effects/adjust/preview_window.h"
 #include "effects/surface/emboss.h"
 #include "effects/surface/snapshot_window.h"
 #include "effects/surface/stria.h"
 #include "tests/gui/temp_folder.h"
+#include "ui/picture_view.h"
 
 namespace quillane {
 namespace {
 
 constexpr int kHsl = 11;
+constexpr int kVariety = 12;
 constexpr int kPanel = 13;
 constexpr int kEmboss = 15;
+constexpr int kFilter = 16;
 constexpr int kStria = 17;
 
 class AdjustWindows : public FileGuiTest {
@@ -37,6 +43,16 @@ class AdjustWindows : public FileGuiTest {
     ToolChild<QSlider>(number, slider)->setValue(value);
   }
   const TBitmap32& Source() { return Main().Document().Source(); }
+  // A left click on a control that reacts to the mouse itself (colour panels, thumbnails).
+  void ClickOn(int number, const char* name) {
+    // A device of the test's own: the toolkit's default one outlives the application object.
+    static const QPointingDevice mouse("test mouse", 1, QInputDevice::DeviceType::Mouse,
+                                       QPointingDevice::PointerType::Generic,
+                                       QInputDevice::Capability::Position, 1, 3);
+    QMouseEvent release(QEvent::MouseButtonRelease, QPointF(4, 4), QPointF(4, 4), QPointF(4, 4),
+                        Qt::LeftButton, Qt::NoButton, Qt::NoModifier, &mouse);
+    QCoreApplication::sendEvent(ToolChild<QWidget>(number, name), &release);
+  }
   const TBitmap32& Working() { return Main().Document().Working(); }
 
   // One picture in folder "in" converted by the open window into "out"; the output's name.
@@ -116,13 +132,7 @@ TEST_F(AdjustWindows, StriaTakesItsColourFromTheDialogAndStartsFromTheSnapshot) 
   Slide(kStria, "TrackBar3", 2);
   ToolChild<QRadioButton>(kStria, "RadioButton2")->setChecked(true);
   platform_.colorAnswers.push_back(0x0000FF);
-  // A device of the test's own: the toolkit's default one outlives the application object.
-  static const QPointingDevice mouse("test mouse", 1, QInputDevice::DeviceType::Mouse,
-                                     QPointingDevice::PointerType::Generic,
-                                     QInputDevice::Capability::Position, 1, 3);
-  QMouseEvent release(QEvent::MouseButtonRelease, QPointF(4, 4), QPointF(4, 4), QPointF(4, 4),
-                      Qt::LeftButton, Qt::NoButton, Qt::NoModifier, &mouse);
-  QCoreApplication::sendEvent(ToolChild<QWidget>(kStria, "ColorPanel"), &release);
+  ClickOn(kStria, "ColorPanel");
   EXPECT_EQ(platform_.colorRequests, std::vector<std::uint32_t>{0});
 
   // With "For current" both presses start from the picture as it was when the window opened.
@@ -204,6 +214,50 @@ TEST_F(AdjustWindows, AnEmptyWorkingPictureIsRefusedWhereNothingCanBeDone) {
   Main().SpeedButton3Click();
   EXPECT_TRUE(Working().Empty());
   EXPECT_EQ(platform_.errors.size(), 1u);
+}
+
+TEST_F(AdjustWindows, ColorFilterPreviewsEachSwatchAndOkAppliesThePreview) {
+  Open("ColorFilter2", kFilter);
+  auto& window = dynamic_cast<PreviewWindow&>(Tool(kFilter));
+  const auto* image2 = ToolChild<PictureView>(kFilter, "Image2");
+  EXPECT_EQ(ToolChild<PictureView>(kFilter, "Image1")->geometry(), QRect(2, 19, 105, 72));
+  EXPECT_EQ(image2->geometry(), QRect(2, 19, 105, 72));
+  ToolChild<QRadioButton>(kFilter, "Panel6")->click();
+  EXPECT_EQ(window.Preview(), filter(Source(), ColorFilterKind::Yellow));
+  EXPECT_EQ(image2->Image(), OpaqueImage(window.Preview()));
+  ClickOn(kFilter, "Image1");  // Reset
+  EXPECT_EQ(window.Preview(), Source());
+  ToolChild<QRadioButton>(kFilter, "Panel6")->click();  // the same swatch again after a reset
+  EXPECT_EQ(window.Preview(), filter(Source(), ColorFilterKind::Yellow));
+  ToolChild<QRadioButton>(kFilter, "Panel4")->click();  // replaces, does not add
+  EXPECT_EQ(Working(), Source());
+  ToolChild<QPushButton>(kFilter, "Button1")->click();
+  EXPECT_EQ(Working(), filter(Source(), ColorFilterKind::Green));
+  EXPECT_EQ(Main().StatusText(), "Color Filter");
+  EXPECT_EQ(Main().Document().UndoCount(), 1);
+  EXPECT_FALSE(Tool(kFilter).isVisible());
+  EXPECT_EQ(Main().ActiveTool(), 0);
+}
+
+TEST_F(AdjustWindows, ColorVarietyAccumulatesClicksAndForCurrentStartsAgain) {
+  Main().SetWorkingPicture(TestPicture(10, 30), true);
+  Open("Colorvariety1", kVariety);
+  auto& window = dynamic_cast<PreviewWindow&>(Tool(kVariety));
+  EXPECT_EQ(window.Base(), Source());
+  for (const char* swatch : {"Panel6", "Panel6", "Panel3"})
+    ToolChild<QPushButton>(kVariety, swatch)->click();
+  EXPECT_EQ(window.Preview(), VarietyClicks(Source(), {4, 4, 1}));
+  ToolChild<QCheckBox>(kVariety, "CheckBox1")->setChecked(true);
+  EXPECT_EQ(window.Preview(), TestPicture(10, 30));
+  EXPECT_EQ(ToolChild<PictureView>(kVariety, "Image1")->geometry(), QRect(37, 2, 37, 105));
+  ToolChild<QPushButton>(kVariety, "Panel5")->click();
+  ToolChild<QPushButton>(kVariety, "Button1")->click();
+  EXPECT_EQ(Working(), variety(TestPicture(10, 30), 3));
+  EXPECT_EQ(Main().StatusText(), "Color Varied");
+  EXPECT_EQ(Main().Document().UndoCount(), 2);
+  Open("Colorvariety1", kVariety);
+  EXPECT_FALSE(ToolChild<QCheckBox>(kVariety, "CheckBox1")->isChecked());
+  EXPECT_EQ(window.Preview(), Source());
 }
 
 }  // namespace
