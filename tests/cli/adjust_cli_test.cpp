@@ -5,6 +5,7 @@
 #include <sys/wait.h>
 
 #include <QImage>
+#include <cstring>
 #include <filesystem>
 #include <functional>
 #include <string>
@@ -27,11 +28,7 @@ TBitmap32 FromPng(const std::string& path) {
       QImage(QString::fromStdString(path), "png").convertToFormat(QImage::Format_ARGB32);
   TBitmap32 p(image.width(), image.height());
   for (int y = 0; y < image.height(); ++y)
-    for (int x = 0; x < image.width(); ++x) {
-      const QRgb c = image.pixel(x, y);
-      p.At(x, y) = Pixel{static_cast<std::uint8_t>(qBlue(c)), static_cast<std::uint8_t>(qGreen(c)),
-                         static_cast<std::uint8_t>(qRed(c)), static_cast<std::uint8_t>(qAlpha(c))};
-    }
+    std::memcpy(p.ScanLine(y), image.constScanLine(y), 4 * static_cast<std::size_t>(p.Width()));
   return p;
 }
 
