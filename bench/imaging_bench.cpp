@@ -134,6 +134,8 @@ BENCHMARK(BM_PencilSketch)
   }                                                             \
   BENCHMARK(name)->Unit(benchmark::kMillisecond)->MeasureProcessCPUTime()->UseRealTime()
 
+// What every routine that returns a new picture pays before its own work.
+QUILLANE_EFFECT_BENCH(BM_PictureCopy, TBitmap32(Photo()));
 QUILLANE_EFFECT_BENCH(BM_Emboss, emboss(Photo(), 100, 3));
 QUILLANE_EFFECT_BENCH(BM_ColorFilter, filter(Photo(), ColorFilterKind::Yellow));
 QUILLANE_EFFECT_BENCH(BM_ColorVariety, VarietyClicks(Photo(), {1, 5, 5}));

@@ -18,11 +18,12 @@ TBitmap32 filter(const TBitmap32& base, ColorFilterKind kind) {
     for (int y = y0; y < y1; ++y) {
       Pixel* row = out.ScanLine(y);
       ConvertRowToGray(row, w);
-      for (int x = 0; x < w; ++x) {
-        if (red) row[x].r = 255;
-        if (green) row[x].g = 255;
-        if (blue) row[x].b = 255;
-      }
+      const std::uint8_t r = red ? 255 : 0, g = green ? 255 : 0, b = blue ? 255 : 0;
+      const int n = w;
+      for (int x = 0; x < n; ++x)
+        row[x] =
+            Pixel{static_cast<std::uint8_t>(row[x].b | b), static_cast<std::uint8_t>(row[x].g | g),
+                  static_cast<std::uint8_t>(row[x].r | r), 255};
     }
   });
   return out;

@@ -23,8 +23,10 @@ TBitmap32 emboss(const TBitmap32& source, int lighting, int depth) {
       const auto* q = reinterpret_cast<const std::uint8_t*>(source.ScanLine(y + depth) + depth);
       Pixel* row = out.ScanLine(y);
       auto* v = reinterpret_cast<std::uint8_t*>(row);
-      for (int i = 0; i < 4 * w; ++i) {
-        const int d = p[i] - q[i] + offset;
+      // Locals, so that the byte stores cannot be taken to change them and the loop widens.
+      const int bytes = 4 * w, lift = offset;
+      for (int i = 0; i < bytes; ++i) {
+        const int d = p[i] - q[i] + lift;
         const int a = d < 0 ? -d : d;
         v[i] = static_cast<std::uint8_t>(a > 255 ? 255 : a);
       }
