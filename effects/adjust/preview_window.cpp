@@ -6,6 +6,7 @@
 #include <QHBoxLayout>
 #include <QMouseEvent>
 #include <QVBoxLayout>
+#include <algorithm>
 #include <functional>
 
 #include "effects/adjust/color_filter.h"
@@ -71,6 +72,9 @@ void PreviewWindow::FormShow() {
   // The shared steps uncheck "For current", which loads the source.
   ToolWindow::FormShow();
   LoadBase();
+  // The swatches' style sheets take effect once the window is polished; only then does the
+  // layout know how tall the window must be.
+  SetWindowHeights(std::max(height(), sizeHint().height()), 0);
 }
 
 void PreviewWindow::LoadBase() {
@@ -110,7 +114,6 @@ TColor_Filter::TColor_Filter(const EffectSpec& spec, ToolHost& host, QWidget* pa
   PlaceSwatches(*grid, [this](const char* name) { return TakeControl(name); });
   ControlsLayout()->insertLayout(1, grid);
   ClearSwatches();
-  SetWindowHeights(std::max(height(), sizeHint().height()), 0);
 }
 
 void TColor_Filter::ClearSwatches() {
@@ -136,7 +139,6 @@ TColor_variety::TColor_variety(const EffectSpec& spec, ToolHost& host, QWidget* 
   grid->setSpacing(6);
   PlaceSwatches(*grid, [this](const char* name) { return TakeControl(name); });
   ControlsLayout()->insertLayout(1, grid);
-  SetWindowHeights(std::max(height(), sizeHint().height()), 0);
 }
 
 void TColor_variety::ClearSwatches() {
