@@ -4,7 +4,10 @@
 #include <iterator>
 
 #include "app/main_window.h"
+#include "effects/adjust/color_panel_window.h"
+#include "effects/adjust/preview_window.h"
 #include "effects/mono/bw_sketch_window.h"
+#include "effects/surface/snapshot_window.h"
 #include "ui/tool_window.h"
 
 namespace quillane {
@@ -23,7 +26,8 @@ struct SpecialWindow {
   ToolWindowFactory make;
 };
 constexpr SpecialWindow kSpecialWindows[] = {
-    {1, Make<TBack_and_White_Sketch>},
+    {1, Make<TBack_and_White_Sketch>}, {12, Make<TColor_variety>}, {13, Make<TColor_Panel>},
+    {16, Make<TColor_Filter>},         {17, Make<TStria>},
 };
 
 }  // namespace

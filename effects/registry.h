@@ -61,7 +61,8 @@ struct EffectSpec {
   bool batchPushesHistory = false;  // its batch routine records a history step per picture
   // After each apply the line-art flag becomes this; nothing: left as it is.
   std::optional<bool> lineArtAfterApply;
-  // The button that applies the settings shown.
+  // The button that applies the settings shown; empty name: none (the window applies by
+  // itself).
   ButtonSpec apply{"Button1", "OK", ""};
   // A second button that restores every parameter's default, then applies; empty name: none.
   ButtonSpec restoreDefaults;

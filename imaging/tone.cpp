@@ -396,4 +396,47 @@ TBitmap32 PencilContrastPassReference(const TBitmap32& input, int c) {
   return out;
 }
 
+void ConvertRowToGray(Pixel* row, int width) {
+  GrayRow(row, row, width, 0);
+}
+
+HslRowChanger::HslRowChanger(const HslChange& change)
+    : hueSaturation_(360 * 101), lightness_(change.lightness) {
+  const HslTables& t = Tables();
+  for (int h = 0; h < 360; ++h) {
+    const std::uint8_t* hue = t.hue[change.hue[static_cast<std::size_t>(h)]];
+    for (int s = 0; s < 101; ++s) {
+      const std::uint8_t* sat = t.saturation[change.saturation[static_cast<std::size_t>(s)]];
+      hueSaturation_[static_cast<std::size_t>(h * 101 + s)] =
+          static_cast<std::uint32_t>(sat[hue[0]]) << 16 |
+          static_cast<std::uint32_t>(sat[hue[1]]) << 8 | sat[hue[2]];
+    }
+  }
+}
+
+void HslRowChanger::Row(const Pixel* in, Pixel* out, int width,
+                        const std::int16_t* lightnessShift) const {
+  const HslTables& toRgb = Tables();
+  for (int x = 0; x < width; ++x) {
+    const Pixel p = in[x];
+    const Hsl hsl = FastRgbToHsl(p.r, p.g, p.b);
+    int l = hsl.l;
+    if (lightnessShift != nullptr) l = std::clamp(l + lightnessShift[x], 0, 100);
+    const std::uint8_t* light = toRgb.lightness[lightness_[static_cast<std::size_t>(l)]];
+    const std::uint32_t c = hueSaturation_[static_cast<std::size_t>(hsl.h * 101 + hsl.s)];
+    out[x] = Pixel{light[c & 0xFF], light[(c >> 8) & 0xFF], light[c >> 16], 255};
+  }
+}
+
+HslChange NoHslChange() {
+  HslChange change{};
+  for (int h = 0; h < 360; ++h)
+    change.hue[static_cast<std::size_t>(h)] = static_cast<std::uint16_t>(h);
+  for (int v = 0; v <= 100; ++v) {
+    change.saturation[static_cast<std::size_t>(v)] = static_cast<std::uint8_t>(v);
+    change.lightness[static_cast<std::size_t>(v)] = static_cast<std::uint8_t>(v);
+  }
+  return change;
+}
+
 }  // namespace quillane

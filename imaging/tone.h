@@ -4,6 +4,7 @@
 
 #include <array>
 #include <cstdint>
+#include <vector>
 
 #include "imaging/bitmap32.h"
 
@@ -82,5 +83,36 @@ void ConvertToGray(TBitmap32& bitmap);
 
 // The gray values (GrayValue) of count pixels, one byte each.
 void GrayLevels(const Pixel* in, std::uint8_t* out, int count);
+
+// The same for the first width pixels of one row.
+void ConvertRowToGray(Pixel* row, int width);
+
+// A change of every colour through the model: H, S and L of a colour are mapped through the
+// tables (each entry within the range of its component).
+struct HslChange {
+  std::array<std::uint16_t, 360> hue;
+  std::array<std::uint8_t, 101> saturation;
+  std::array<std::uint8_t, 101> lightness;
+};
+
+// The tables that keep every component as it is.
+HslChange NoHslChange();
+
+// Applies a change row by row. Built once per picture (it holds tables of the change).
+class HslRowChanger {
+ public:
+  explicit HslRowChanger(const HslChange& change);
+
+  // For the first width pixels: RGB to HSL; L moved by lightnessShift[x] (when given) and
+  // limited to 0..100; H, S and that L through the change; HSL to RGB, alpha 255. in and out
+  // may be the same row. Identical to RgbToHsl and HslToRgb pixel by pixel, and faster.
+  void Row(const Pixel* in, Pixel* out, int width,
+           const std::int16_t* lightnessShift = nullptr) const;
+
+ private:
+  // [H][S]: the pure hue of the changed H, blended by the changed S: 0x00RRGGBB.
+  std::vector<std::uint32_t> hueSaturation_;
+  std::array<std::uint8_t, 101> lightness_{};
+};
 
 }  // namespace quillane

@@ -92,7 +92,7 @@ void ToolWindow::BuildButtonRow(QBoxLayout* outer) {
     connect(button, &QPushButton::clicked, this, click);
     row->addWidget(button);
   };
-  addButton(spec_.apply, &ToolWindow::ApplyClick);
+  if (!spec_.apply.objectName.empty()) addButton(spec_.apply, &ToolWindow::ApplyClick);
   if (!spec_.restoreDefaults.objectName.empty())
     addButton(spec_.restoreDefaults, &ToolWindow::RestoreDefaultsClick);
   outer->addLayout(row);
@@ -178,6 +178,27 @@ std::optional<EffectParams> ToolWindow::CheckedParams() {
 
 QLabel* ToolWindow::FindLabel(const QString& name) const {
   return findChild<QLabel*>(name);
+}
+
+namespace {
+
+bool TakeFromLayout(QLayout* layout, QWidget* widget) {
+  if (layout->indexOf(widget) >= 0) {
+    layout->removeWidget(widget);
+    return true;
+  }
+  for (int i = 0; i < layout->count(); ++i)
+    if (QLayout* inner = layout->itemAt(i)->layout(); inner && TakeFromLayout(inner, widget))
+      return true;
+  return false;
+}
+
+}  // namespace
+
+QWidget* ToolWindow::TakeControl(const QString& name) {
+  auto* widget = findChild<QWidget*>(name);
+  if (widget != nullptr) TakeFromLayout(controlsLayout_, widget);
+  return widget;
 }
 
 // --- Showing and closing ---------------------------------------------------------------------
@@ -268,16 +289,17 @@ void ToolWindow::SpeedButton3Click() {
 
 void ToolWindow::SpeedButton4Click() {
   if (inputField_ == nullptr || outputField_ == nullptr || !spec_.routine) return;
+  // The window's own first step may change a setting ("For current" is cleared).
+  BeforeBatch();
   // Every setting is checked before the first picture is loaded, so a bad one converts nothing.
   const std::optional<EffectParams> params = CheckedParams();
   if (!params) return;
-  BeforeBatch();
   // The loop itself runs the effect (and the history step of the effects whose batch does);
   // the window adds its own steps after each picture.
   const BatchResult result = host_.ConvertBatchFolder(
       spec_, *params, inputField_->text(), outputField_->text(), [this] { AfterEffect(); });
   if (result.end != BatchResult::End::Completed) return;
-  AfterBatch();
+  AfterBatch(result);
   host_.ShowBatchConvertOk();
 }
 

@@ -51,7 +51,8 @@ class ToolWindow : public QWidget {
   void SetWindowHeights(int collapsed, int expanded);
 
  public slots:
-  void ApplyClick();            // the apply button (OK, or "Convert" in the kernel windows)
+  // The apply button (OK, or "Convert" in the kernel windows).
+  virtual void ApplyClick();
   void RestoreDefaultsClick();  // "Default": every parameter back to its default, then apply
   void ColorUpClick();          // "Color up"
   void SpeedButton1Click();     // show or hide the batch panel
@@ -69,10 +70,11 @@ class ToolWindow : public QWidget {
   virtual void FormClose();
   // After a successful apply (OK or each picture of a batch), once the document has the result.
   virtual void AfterApply() {}
-  // Convert's own steps for the windows that have some: before the loop, and after a loop
-  // that ran to its end (before the completion dialog shows).
+  // Convert's own steps for the windows that have some: before anything else (even before the
+  // settings are read), and after a loop that ran to its end (before the completion dialog
+  // shows).
   virtual void BeforeBatch() {}
-  virtual void AfterBatch() {}
+  virtual void AfterBatch(const BatchResult& /*result*/) {}
   // A parameter changed, after the one it selects was set.
   virtual void ControlChanged(const ParamSpec& param);
 
@@ -80,6 +82,9 @@ class ToolWindow : public QWidget {
   // The rows of controls, top to bottom; subclasses may insert rows of their own.
   QVBoxLayout* ControlsLayout() { return controlsLayout_; }
   QLabel* FindLabel(const QString& name) const;
+  // The control named name taken out of the rows of controls, for a window that places it
+  // itself; null when there is none.
+  QWidget* TakeControl(const QString& name);
 
   void showEvent(QShowEvent* event) override;
   void closeEvent(QCloseEvent* event) override;

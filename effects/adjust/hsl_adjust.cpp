@@ -1,8 +1,33 @@
-// HSL adjust: hue, saturation and lightness shifted by fixed amounts.
-// Its window opens from the menu; the effect itself is still to come.
+#include "effects/adjust/hsl_adjust.h"
+
+#include <algorithm>
+
 #include "effects/registry.h"
+#include "imaging/numeric.h"
+#include "imaging/parallel.h"
+#include "imaging/tone.h"
 
 namespace quillane {
+
+TBitmap32 HslAdjust(const TBitmap32& source, int hue, int saturation, int lighting) {
+  HslChange change{};
+  for (int h = 0; h < 360; ++h)
+    change.hue[static_cast<std::size_t>(h)] =
+        static_cast<std::uint16_t>(((h + hue + 180) % 360 + 360) % 360);
+  for (int v = 0; v <= 100; ++v) {
+    change.saturation[static_cast<std::size_t>(v)] =
+        static_cast<std::uint8_t>(std::clamp(v + saturation - 100, 0, 100));
+    change.lightness[static_cast<std::size_t>(v)] =
+        static_cast<std::uint8_t>(std::clamp(v + lighting - 100, 0, 100));
+  }
+  const HslRowChanger changer(change);
+  TBitmap32 out(source.Width(), source.Height());
+  const int w = source.Width();
+  ParallelRows(0, source.Height(), static_cast<std::size_t>(w) * 8, [&](int y0, int y1) {
+    for (int y = y0; y < y1; ++y) changer.Row(source.ScanLine(y), out.ScanLine(y), w);
+  });
+  return out;
+}
 
 const EffectSpec& HslAdjustEffect() {
   static const EffectSpec entry{
@@ -15,6 +40,44 @@ const EffectSpec& HslAdjustEffect() {
       .caption = "HSL_Adjust",
       .statusText = "HSL Adjusted",
       .cliName = "hsl-adjust",
+      .params =
+          {
+              {.name = "hue",
+               .objectName = "TrackBar1",
+               .caption = "Hue:",
+               .maximum = 360,
+               .defaultValue = 180,
+               .numberLabel = "Label4",
+               .initialNumber = "0",
+               .numberFor = [](int h) { return Round(static_cast<Extended>(h - 180) * 100 / 180); },
+               .help = "hue turned by position - 180 degrees; 180 neutral",
+               .resetOnShow = true},
+              {.name = "saturation",
+               .objectName = "TrackBar2",
+               .caption = "Saturation:",
+               .maximum = 200,
+               .defaultValue = 100,
+               .numberLabel = "Label3",
+               .initialNumber = "0",
+               .numberFor = [](int s) { return s - 100; },
+               .help = "saturation moved by position - 100 percent; 100 neutral",
+               .resetOnShow = true},
+              {.name = "lighting",
+               .objectName = "TrackBar3",
+               .caption = "Lighting:",
+               .maximum = 200,
+               .defaultValue = 100,
+               .numberLabel = "Label9",
+               .initialNumber = "0",
+               .numberFor = [](int l) { return l - 100; },
+               .help = "lightness moved by position - 100 percent; 100 neutral",
+               .resetOnShow = true},
+          },
+      .routine =
+          [](const EffectInput& in) {
+            return HslAdjust(in.source, in.params.GetInt("hue"), in.params.GetInt("saturation"),
+                             in.params.GetInt("lighting"));
+          },
   };
   return entry;
 }

@@ -1,8 +1,87 @@
-// Stria: vertical or horizontal stripes laid over the picture.
-// Its window opens from the menu; the effect itself is still to come.
+#include "effects/surface/stria.h"
+
+#include <algorithm>
+#include <array>
+#include <vector>
+
 #include "effects/registry.h"
+#include "imaging/numeric.h"
+#include "imaging/parallel.h"
 
 namespace quillane {
+namespace {
+
+// DrawOver of one overlay pixel o (alpha 1..254 or 255) onto t, for targets that are not
+// opaque; opaque targets take the tables below.
+void CompositeOver(Pixel o, Pixel& t) {
+  if (t.a == 0 || o.a == 255) {
+    t = o;
+    return;
+  }
+  const std::uint32_t at = t.a, ao = o.a;
+  const std::uint32_t d = 255 * (ao + at) - ao * at;
+  const std::uint32_t wt = at * (255 - ao);
+  const std::uint32_t wo = 255 * ao;
+  t.b = static_cast<std::uint8_t>((wt * t.b + wo * o.b) / d);
+  t.g = static_cast<std::uint8_t>((wt * t.g + wo * o.g) / d);
+  t.r = static_cast<std::uint8_t>((wt * t.r + wo * o.r) / d);
+  t.a = static_cast<std::uint8_t>(d / 255);
+}
+
+// The stripe colour over an opaque pixel, channel by channel: DrawOver's quotient with
+// target alpha 255 reduces to ((255 - a) t + a c) div 255.
+struct OpaqueMix {
+  std::array<std::uint8_t, 256> b, g, r;
+};
+
+OpaqueMix MixTables(Pixel o) {
+  OpaqueMix mix{};
+  for (int t = 0; t < 256; ++t) {
+    const auto blend = [&](int c) {
+      return static_cast<std::uint8_t>(((255 - o.a) * t + o.a * c) / 255);
+    };
+    mix.b[static_cast<std::size_t>(t)] = blend(o.b);
+    mix.g[static_cast<std::size_t>(t)] = blend(o.g);
+    mix.r[static_cast<std::size_t>(t)] = blend(o.r);
+  }
+  return mix;
+}
+
+}  // namespace
+
+TBitmap32 stria(const TBitmap32& base, int layerWidth, int layerHeight, StriaDirection direction,
+                int thickness, int space, int transparency, std::uint32_t colour) {
+  TBitmap32 out = base;
+  const int w = std::min(base.Width(), std::max(0, layerWidth));
+  const int h = std::min(base.Height(), std::max(0, layerHeight));
+  if (w == 0 || h == 0) return out;
+  const int period = std::max(1, thickness + space);
+  const Pixel o =
+      PixelFromColorRef(colour, static_cast<std::uint8_t>(255 - ClampByte(transparency)));
+  const OpaqueMix mix = MixTables(o);
+  std::vector<std::uint8_t> stripeColumn(static_cast<std::size_t>(w), 1);
+  if (direction == StriaDirection::Vertical)
+    for (int x = 0; x < w; ++x) stripeColumn[static_cast<std::size_t>(x)] = x % period < thickness;
+
+  ParallelRows(0, h, static_cast<std::size_t>(w), [&](int y0, int y1) {
+    for (int y = y0; y < y1; ++y) {
+      Pixel* row = out.ScanLine(y);
+      const bool stripeRow = direction == StriaDirection::Vertical || y % period < thickness;
+      for (int x = 0; x < w; ++x) {
+        Pixel& t = row[x];
+        if (stripeRow && stripeColumn[static_cast<std::size_t>(x)] && o.a != 0) {
+          if (t.a == 255)
+            t = Pixel{mix.b[t.b], mix.g[t.g], mix.r[t.r], 255};
+          else
+            CompositeOver(o, t);
+        } else if (t.a == 0) {
+          t = Pixel{255, 255, 255, 0};  // a transparent overlay pixel over a transparent one
+        }
+      }
+    }
+  });
+  return out;
+}
 
 const EffectSpec& StriaEffect() {
   static const EffectSpec entry{
@@ -18,6 +97,67 @@ const EffectSpec& StriaEffect() {
       .batchTag = "Stria",
       .collapsedHeight = 159,
       .expandedHeight = 240,
+      .batchPushesHistory = true,
+      .params =
+          {
+              {.kind = ParamKind::Choice,
+               .name = "direction",
+               .defaultValue = static_cast<int>(StriaDirection::Vertical),
+               .options = {{"vertical", "Vertical", "RadioButton1", ""},
+                           {"horizontal", "Horizontal", "RadioButton2", ""}},
+               .help = "stripes down the picture or across it"},
+              {.name = "thickness",
+               .objectName = "TrackBar3",
+               .caption = "Thickness:",
+               .minimum = 1,
+               .maximum = 100,
+               .defaultValue = 1,
+               .numberLabel = "Label3",
+               .initialNumber = "1",
+               .help = "stripe width in pixels"},
+              {.name = "space",
+               .objectName = "TrackBar2",
+               .caption = "Space:",
+               .minimum = 1,
+               .maximum = 255,
+               .defaultValue = 2,
+               .numberLabel = "Label4",
+               .initialNumber = "2",
+               .help = "gap between stripes in pixels"},
+              {.name = "transparent",
+               .objectName = "TrackBar1",
+               .caption = "Transparent:",
+               .maximum = 255,
+               .defaultValue = 128,
+               .pageStep = 10,
+               .numberLabel = "Label9",
+               .initialNumber = "50",
+               .numberFor = [](int t) { return Round(static_cast<Extended>(t) * 100 / 255); },
+               .help = "0 paints the stripes solid, 255 leaves the picture as it is"},
+              {.kind = ParamKind::Colour,
+               .name = "color",
+               .objectName = "ColorPanel",
+               .defaultValue = 0x000000,
+               .hint = "Select a color for stria",
+               .help = "stripe colour"},
+              {.kind = ParamKind::Switch,
+               .name = "for-current",
+               .objectName = "CheckBox1",
+               .caption = "For current",
+               .maximum = 1,
+               .defaultValue = 1,
+               .help = "1: stripe the picture as shown when the window opened; 0: the source",
+               .resetOnShow = true},
+          },
+      .routine =
+          [](const EffectInput& in) {
+            const TBitmap32& base = in.params.GetInt("for-current") != 0 ? in.working : in.source;
+            return stria(base, in.source.Width(), in.source.Height(),
+                         static_cast<StriaDirection>(in.params.GetInt("direction")),
+                         in.params.GetInt("thickness"), in.params.GetInt("space"),
+                         in.params.GetInt("transparent"),
+                         static_cast<std::uint32_t>(in.params.Get("color")));
+          },
   };
   return entry;
 }

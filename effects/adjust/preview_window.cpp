@@ -1,0 +1,153 @@
+#include "effects/adjust/preview_window.h"
+
+#include <QAbstractButton>
+#include <QButtonGroup>
+#include <QGridLayout>
+#include <QHBoxLayout>
+#include <QMouseEvent>
+#include <QVBoxLayout>
+#include <algorithm>
+#include <functional>
+
+#include "effects/adjust/color_filter.h"
+#include "effects/adjust/color_variety.h"
+#include "ui/picture_view.h"
+
+namespace quillane {
+namespace {
+
+constexpr int kThumbnailBox = 109;  // the 105 by 105 fitting area and its margins
+const char* const kSwatches[] = {"Panel3", "Panel4", "Panel5", "Panel6", "Panel7", "Panel8"};
+const char* const kSwatchColours[] = {"#ff0000", "#008000", "#0000ff",
+                                      "#ffff00", "#008080", "#ff00ff"};
+
+class ClickableView : public PictureView {
+ public:
+  ClickableView(QWidget* parent, std::function<void()> clicked)
+      : PictureView(parent), clicked_(std::move(clicked)) {}
+
+ protected:
+  void mouseReleaseEvent(QMouseEvent* event) override {
+    if (event->button() == Qt::LeftButton && rect().contains(event->position().toPoint()))
+      clicked_();
+  }
+
+ private:
+  std::function<void()> clicked_;
+};
+
+// The swatches as coloured squares in two rows of three.
+void PlaceSwatches(QGridLayout& grid, const std::function<QWidget*(const char*)>& take) {
+  for (int i = 0; i < 6; ++i) {
+    QWidget* swatch = take(kSwatches[i]);
+    if (swatch == nullptr) continue;
+    swatch->setFixedSize(34, 22);
+    swatch->setStyleSheet(QString("* { background-color: %1; border: 1px solid gray; }"
+                                  " QRadioButton::indicator { width: 0px; height: 0px; }")
+                              .arg(kSwatchColours[i]));
+    grid.addWidget(swatch, i / 3, i % 3);
+  }
+}
+
+}  // namespace
+
+PreviewWindow::PreviewWindow(const EffectSpec& spec, ToolHost& host, QWidget* parent)
+    : ToolWindow(spec, host, parent) {
+  auto* row = new QHBoxLayout;
+  const auto box = [&](PictureView*& view, const char* name, bool clickable) {
+    auto* frame = new QWidget(this);
+    frame->setFixedSize(kThumbnailBox, kThumbnailBox);
+    view = clickable ? new ClickableView(frame, [this] { Image1Click(); }) : new PictureView(frame);
+    view->setObjectName(name);
+    row->addWidget(frame);
+  };
+  box(image1_, "Image1", true);
+  image1_->setToolTip("Reset");
+  box(image2_, "Image2", false);
+  row->addStretch(1);
+  ControlsLayout()->insertLayout(0, row);
+}
+
+void PreviewWindow::FormShow() {
+  // The shared steps uncheck "For current", which loads the source.
+  ToolWindow::FormShow();
+  LoadBase();
+  // The swatches' style sheets take effect once the window is polished; only then does the
+  // layout know how tall the window must be.
+  SetWindowHeights(std::max(height(), sizeHint().height()), 0);
+}
+
+void PreviewWindow::LoadBase() {
+  const bool current = Params().GetInt("for-current") != 0;
+  base_ = current ? Host().Document().Working() : Host().Document().Source();
+  image1_->SetPicture(base_);
+  Host().DisplayImage(*image1_);
+  ClearSwatches();
+  SetPreview(base_);
+}
+
+void PreviewWindow::SetPreview(TBitmap32 preview) {
+  preview_ = std::move(preview);
+  image2_->SetPicture(preview_);
+  Host().DisplayImage(*image2_);
+}
+
+void PreviewWindow::ControlChanged(const ParamSpec& param) {
+  if (param.name == "for-current") LoadBase();
+}
+
+void PreviewWindow::Image1Click() {
+  ClearSwatches();
+  SetPreview(base_);
+}
+
+void PreviewWindow::ApplyClick() {
+  Host().SetWorkingPicture(preview_, true);
+  Host().SetStatusText(QString::fromStdString(Spec().statusText));
+  close();
+}
+
+TColor_Filter::TColor_Filter(const EffectSpec& spec, ToolHost& host, QWidget* parent)
+    : PreviewWindow(spec, host, parent) {
+  auto* grid = new QGridLayout;
+  grid->setSpacing(6);
+  PlaceSwatches(*grid, [this](const char* name) { return TakeControl(name); });
+  ControlsLayout()->insertLayout(1, grid);
+  ClearSwatches();
+}
+
+void TColor_Filter::ClearSwatches() {
+  // No swatch is chosen, so that a click on any one filters.
+  auto* first = findChild<QAbstractButton*>(kSwatches[0]);
+  if (first == nullptr || first->group() == nullptr) return;
+  QButtonGroup* group = first->group();
+  group->setExclusive(false);
+  for (QAbstractButton* b : group->buttons()) b->setChecked(false);
+  group->setExclusive(true);
+}
+
+void TColor_Filter::ControlChanged(const ParamSpec& param) {
+  PreviewWindow::ControlChanged(param);
+  if (param.name != "filter") return;
+  const int f = Params().GetInt("filter");
+  if (f >= 1) SetPreview(filter(Base(), static_cast<ColorFilterKind>(f)));
+}
+
+TColor_variety::TColor_variety(const EffectSpec& spec, ToolHost& host, QWidget* parent)
+    : PreviewWindow(spec, host, parent) {
+  auto* grid = new QGridLayout;
+  grid->setSpacing(6);
+  PlaceSwatches(*grid, [this](const char* name) { return TakeControl(name); });
+  ControlsLayout()->insertLayout(1, grid);
+}
+
+void TColor_variety::ClearSwatches() {
+  if (!Params().GetList("more").empty()) SetParam("more", {});
+}
+
+void TColor_variety::ControlChanged(const ParamSpec& param) {
+  PreviewWindow::ControlChanged(param);
+  if (param.name == "more") SetPreview(VarietyClicks(Base(), Params().GetList("more")));
+}
+
+}  // namespace quillane

@@ -1,0 +1,65 @@
+// The colour filter and colour variety windows: the picture and a full-size preview shown side
+// by side as thumbnails, colour swatches that change the preview at once, "For current" and OK,
+// which makes the preview the working picture and closes the window. A click on the left
+// thumbnail ("Reset") puts the preview back to the unchanged picture.
+#pragma once
+
+#include "ui/tool_window.h"
+
+namespace quillane {
+
+class PictureView;
+
+class PreviewWindow : public ToolWindow {
+  Q_OBJECT
+
+ public:
+  PreviewWindow(const EffectSpec& spec, ToolHost& host, QWidget* parent);
+
+  const TBitmap32& Base() const { return base_; }
+  const TBitmap32& Preview() const { return preview_; }
+
+ public slots:
+  void ApplyClick() override;
+  void Image1Click();
+
+ protected:
+  void FormShow() override;
+  void ControlChanged(const ParamSpec& param) override;
+  // The swatches' own way back to "nothing chosen".
+  virtual void ClearSwatches() = 0;
+  void SetPreview(TBitmap32 preview);
+
+ private:
+  // Base and preview become a copy of the source, or of the working picture for "For current".
+  void LoadBase();
+
+  TBitmap32 base_;
+  TBitmap32 preview_;
+  PictureView* image1_ = nullptr;
+  PictureView* image2_ = nullptr;
+};
+
+class TColor_Filter : public PreviewWindow {
+  Q_OBJECT
+
+ public:
+  TColor_Filter(const EffectSpec& spec, ToolHost& host, QWidget* parent);
+
+ protected:
+  void ControlChanged(const ParamSpec& param) override;
+  void ClearSwatches() override;
+};
+
+class TColor_variety : public PreviewWindow {
+  Q_OBJECT
+
+ public:
+  TColor_variety(const EffectSpec& spec, ToolHost& host, QWidget* parent);
+
+ protected:
+  void ControlChanged(const ParamSpec& param) override;
+  void ClearSwatches() override;
+};
+
+}  // namespace quillane

@@ -1,0 +1,120 @@
+// Emboss, texture and stria on small crafted pictures, and against their plain formulas.
+#include <gtest/gtest.h>
+
+#include <array>
+#include <cstdlib>
+
+#include "effects/surface/emboss.h"
+#include "effects/surface/stria.h"
+#include "imaging/numeric.h"
+#include "tests/imaging/random_picture.h"
+
+namespace quillane {
+namespace {
+
+Pixel Gray(int v) {
+  const auto g = static_cast<std::uint8_t>(v);
+  return Pixel{g, g, g, 255};
+}
+
+// The relief formula exactly as stated, in place from the top row down.
+TBitmap32 PlainEmboss(TBitmap32 b, int lighting, int depth) {
+  for (int y = 0; y <= b.Height() - depth - 1; ++y)
+    for (int x = 0; x <= b.Width() - depth - 1; ++x) {
+      const Pixel p = b.At(x, y), q = b.At(x + depth, y + depth);
+      const auto v = [&](int pc, int qc) {
+        return std::min(255, std::abs(pc - qc + lighting + 50));
+      };
+      const Extended sum = 0.3L * v(p.r, q.r) + 0.59L * v(p.g, q.g) + 0.11L * v(p.b, q.b);
+      b.At(x, y) = Gray(Round(sum));
+    }
+  return b;
+}
+
+TEST(Emboss, ReliefOfTwoPixelsOneStepApart) {
+  struct Case {
+    int p, q, lighting, gray;
+  } const cases[] = {
+      {90, 90, 100, 150}, {90, 90, 0, 50}, {90, 90, 200, 250}, {95, 90, 200, 255},
+      {40, 90, 0, 0},     {30, 90, 0, 10},  // below the offset the difference folds back up
+  };
+  for (const Case& c : cases) {
+    TBitmap32 b(2, 2, Gray(c.q));
+    b.At(0, 0) = Gray(c.p);
+    const TBitmap32 out = emboss(b, c.lighting, 1);
+    EXPECT_EQ(out.At(0, 0), Gray(c.gray)) << c.p << " " << c.q << " " << c.lighting;
+    EXPECT_EQ(out.At(1, 1), Gray(c.q));
+  }
+}
+
+// The formula leaves the rightmost and bottom depth pixels as they were; pictures no larger
+// than depth in either direction come back unchanged.
+TEST(Emboss, MatchesTheFormulaOnRandomPicturesOfEverySize) {
+  for (int depth = 1; depth <= 5; ++depth)
+    for (int lighting : {0, 37, 100, 200})
+      for (auto [w, h] :
+           {std::pair{41, 13}, {depth, 7}, {7, depth}, {depth + 1, 2}, {1, 1}, {0, 0}}) {
+        const TBitmap32 in = RandomPicture(w, h, static_cast<unsigned>(depth * 1000 + lighting));
+        ASSERT_EQ(emboss(in, lighting, depth), PlainEmboss(in, lighting, depth))
+            << depth << " " << lighting << " " << w << "x" << h;
+      }
+  const TBitmap32 in = RandomPicture(6, 6, 1);
+  EXPECT_EQ(emboss(in, 100, 3).At(5, 0), in.At(5, 0));
+}
+
+// The stripe layer built pixel by pixel and composited with DrawOver.
+TBitmap32 PlainStria(const TBitmap32& base, int w, int h, StriaDirection direction, int t, int g,
+                     int transparency, std::uint32_t colour) {
+  TBitmap32 layer(w, h);
+  for (int y = 0; y < h; ++y)
+    for (int x = 0; x < w; ++x) {
+      const int m = (direction == StriaDirection::Vertical ? x : y) % (t + g);
+      layer.At(x, y) =
+          m < t ? PixelFromColorRef(colour, static_cast<std::uint8_t>(255 - transparency))
+                : Pixel{255, 255, 255, 0};
+    }
+  TBitmap32 out = base;
+  layer.DrawOver(0, 0, out);
+  return out;
+}
+
+TEST(Stria, StripesStartAtTheFirstColumnOrRow) {
+  const TBitmap32 white(7, 2, Gray(255));
+  const TBitmap32 dark = stria(white, 7, 2, StriaDirection::Vertical, 1, 2, 128, 0);
+  for (int x = 0; x < 7; ++x) EXPECT_EQ(dark.At(x, 1), Gray(x % 3 == 0 ? 128 : 255)) << x;
+  // Solid at transparency 0, nothing at 255.
+  EXPECT_EQ(stria(white, 7, 2, StriaDirection::Vertical, 1, 2, 0, 0x0080FF).At(3, 0),
+            (Pixel{0, 128, 255, 255}));
+  EXPECT_EQ(stria(white, 7, 2, StriaDirection::Vertical, 1, 2, 255, 0), white);
+  // Thickness 100 and space 1 leave every 101st column.
+  const TBitmap32 wide =
+      stria(TBitmap32(203, 1, Gray(255)), 203, 1, StriaDirection::Vertical, 100, 1, 0, 0);
+  for (int x = 0; x < 203; ++x) EXPECT_EQ(wide.At(x, 0).r, x == 100 || x == 201 ? 255 : 0) << x;
+  // A single row is a stripe row.
+  EXPECT_EQ(stria(TBitmap32(3, 1, Gray(255)), 3, 1, StriaDirection::Horizontal, 1, 2, 0, 0),
+            TBitmap32(3, 1, Gray(0)));
+}
+
+// Transparent base pixels take stripes unblended and gaps as transparent white; a base larger
+// than the layer keeps its excess, a smaller one is striped where both lie.
+TEST(Stria, MatchesTheCompositedLayerOnEveryAlphaAndSize) {
+  for (StriaDirection d : {StriaDirection::Vertical, StriaDirection::Horizontal})
+    for (int transparency : {0, 1, 128, 254, 255})
+      for (auto [w, h, lw, lh] : {std::array{29, 17, 29, 17},
+                                  {29, 17, 20, 9},
+                                  {9, 5, 20, 12},
+                                  {1, 6, 1, 6},
+                                  {6, 2, 6, 2},
+                                  {0, 0, 0, 0}}) {
+        TBitmap32 base = RandomPicture(w, h, static_cast<unsigned>(transparency * 7 + w));
+        for (int y = 0; y < h; ++y)
+          for (int x = 0; x < w; ++x) base.At(x, y).a = (x + y) % 3 == 0 ? base.At(x, y).a : 255;
+        if (w > 0) base.At(0, 0).a = 0;
+        ASSERT_EQ(stria(base, lw, lh, d, 3, 2, transparency, 0x123456),
+                  PlainStria(base, lw, lh, d, 3, 2, transparency, 0x123456))
+            << static_cast<int>(d) << " " << transparency << " " << w << "x" << h;
+      }
+}
+
+}  // namespace
+}  // namespace quillane
