@@ -7,10 +7,10 @@
 #include <stdexcept>
 #include <string>
 
-#include "document/document.h"
 #include "batch/batch_convert.h"
 #include "bench/synthetic_photo.h"
 #include "codecs/picture_file.h"
+#include "document/document.h"
 
 namespace quillane {
 namespace {

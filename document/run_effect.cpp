@@ -10,8 +10,8 @@ void RunEffect(PictureDocument& document, const EffectSpec& effect, const Effect
   // Settings a caller left out keep their defaults, so every routine finds all it reads.
   EffectParams settings = effect.Defaults();
   settings.Merge(params);
-  document.SetWorking(effect.routine(
-      {document.Source(), document.Working(), settings, &document.RandomState()}));
+  document.SetWorking(
+      effect.routine({document.Source(), document.Working(), settings, &document.RandomState()}));
   if (recordHistory) document.Backup();
 }
 

@@ -2,8 +2,8 @@
 // adjustment; its labels are drawn in the window-text colour and the other slider's in gray.
 #pragma once
 
-#include "ui/tool_window.h"
 #include "effects/mono/bw_sketch.h"
+#include "ui/tool_window.h"
 
 namespace quillane {
 

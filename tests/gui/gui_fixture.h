@@ -10,9 +10,9 @@
 #include <memory>
 
 #include "app/main_window.h"
-#include "ui/tool_window.h"
 #include "app/tool_windows.h"
 #include "tests/gui/scripted_platform.h"
+#include "ui/tool_window.h"
 
 namespace quillane {
 

@@ -6,9 +6,9 @@
 #include <QToolButton>
 #include <stdexcept>
 
-#include "ui/picture_view.h"
 #include "data/startup_picture.h"
 #include "tests/gui/gui_fixture.h"
+#include "ui/picture_view.h"
 
 namespace quillane {
 namespace {

@@ -7,8 +7,8 @@
 
 #include "app/main_window.h"
 #include "app/qt_platform.h"
-#include "ui/tool_window.h"
 #include "app/tool_windows.h"
+#include "ui/tool_window.h"
 
 int main(int argc, char* argv[]) {
   QApplication app(argc, argv);
