@@ -1,9 +1,10 @@
 // Not a test: shows the main window with the pencil window (batch panel open) on a real
 // display and saves the screen as a PNG, to look at the windows as a user sees them.
-//   xvfb-run -a -s "-screen 0 1280x1024x24" ./gui_screenshot out.png
+//   xvfb-run -a -s "-screen 0 1280x1024x24" ./gui_screenshot out.png [TOOL_NUMBER]
 #include <QApplication>
 #include <QScreen>
 #include <QTimer>
+#include <cstdlib>
 
 #include "app/main_window.h"
 #include "app/qt_platform.h"
@@ -17,10 +18,13 @@ int main(int argc, char* argv[]) {
   quillane::TMyPicture window(platform);
   quillane::CreateToolWindows(window);
   window.show();
-  window.OpenTool(1);
-  if (argc > 2) {
-    window.ToolWindowAt(1)->SpeedButton1Click();
-    window.ToolWindowAt(1)->ApplyClick();
+  // The tool window to show (1 unless a number follows the file name), its batch panel open
+  // and its effect applied.
+  const int tool = argc > 2 ? std::atoi(argv[2]) : 1;
+  window.OpenTool(tool);
+  if (quillane::ToolWindow* open = window.ToolWindowAt(tool)) {
+    open->SpeedButton1Click();
+    open->ApplyClick();
   }
   QTimer::singleShot(700, [&] {
     const QPixmap screen = QApplication::primaryScreen()->grabWindow(0);
