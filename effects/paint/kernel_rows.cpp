@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cstdint>
 #include <cstdlib>
+#include <limits>
 #include <optional>
 
 namespace quillane {
@@ -21,6 +22,20 @@ void ShortSums(const std::uint8_t* const rows[3], int first, int count,
                const std::vector<KernelTap>& taps, std::int16_t* sums) {
   std::fill(sums, sums + count, std::int16_t{0});
   for (const KernelTap& t : taps) AddTap(rows[t.row] + first + t.offset, t.weight, sums, count);
+}
+
+ParamSpec KernelParam(EffectParams::Values defaults) {
+  return {
+      .kind = ParamKind::Cells,
+      .name = "kernel",
+      .captionLabel = "Label1",
+      .caption = "You can change the figures",
+      .minimum = std::numeric_limits<std::int32_t>::min(),
+      .maximum = std::numeric_limits<std::int32_t>::max(),
+      .cells = {"Edit1", "Edit2", "Edit3", "Edit4", "Edit5", "Edit6", "Edit7", "Edit8", "Edit9"},
+      .defaultList = std::move(defaults),
+      .hint = "Change the number to get different effect",
+      .help = "the 3 x 3 weights, row by row (top row first)"};
 }
 
 Kernel KernelFrom(const EffectParams::Values& values) {

@@ -19,6 +19,10 @@ namespace quillane {
 // Each is a 32-bit integer, so 64-bit sums of nine weighted bytes never overflow.
 using Kernel = std::array<std::int64_t, 9>;
 
+// The kernel windows' one parameter: nine cells Edit1..Edit9 under "You can change the
+// figures", starting from defaults (row by row).
+ParamSpec KernelParam(EffectParams::Values defaults);
+
 // The nine cells of a kernel parameter; std::invalid_argument when there are not nine or one
 // is beyond 32 bits.
 Kernel KernelFrom(const EffectParams::Values& values);

@@ -1,7 +1,5 @@
 #include "effects/paint/pop_art.h"
 
-#include <limits>
-
 #include "effects/registry.h"
 
 namespace quillane {
@@ -31,17 +29,7 @@ const EffectSpec& PopArtEffect() {
       .outputField = "Edit11",
       .params =
           {
-              {.kind = ParamKind::Cells,
-               .name = "kernel",
-               .captionLabel = "Label1",
-               .caption = "You can change the figures",
-               .minimum = std::numeric_limits<std::int32_t>::min(),
-               .maximum = std::numeric_limits<std::int32_t>::max(),
-               .cells = {"Edit1", "Edit2", "Edit3", "Edit4", "Edit5", "Edit6", "Edit7", "Edit8",
-                         "Edit9"},
-               .defaultList = {-1, -2, -1, 0, 0, 0, 1, 2, 1},
-               .hint = "Change the number to get different effect",
-               .help = "the 3 x 3 weights, row by row (top row first)"},
+              KernelParam({-1, -2, -1, 0, 0, 0, 1, 2, 1}),
           },
       .routine =
           [](const EffectInput& in) {

@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <cstring>
-#include <limits>
 
 #include "effects/registry.h"
 #include "imaging/numeric.h"
@@ -99,17 +98,7 @@ const EffectSpec& RealismEffect() {
       .outputField = "Edit11",
       .params =
           {
-              {.kind = ParamKind::Cells,
-               .name = "kernel",
-               .captionLabel = "Label1",
-               .caption = "You can change the figures",
-               .minimum = std::numeric_limits<std::int32_t>::min(),
-               .maximum = std::numeric_limits<std::int32_t>::max(),
-               .cells = {"Edit1", "Edit2", "Edit3", "Edit4", "Edit5", "Edit6", "Edit7", "Edit8",
-                         "Edit9"},
-               .defaultList = {1, 2, 1, 0, 0, 0, -1, -1, -1},
-               .hint = "Change the number to get different effect",
-               .help = "the 3 x 3 weights, row by row (top row first)"},
+              KernelParam({1, 2, 1, 0, 0, 0, -1, -1, -1}),
           },
       .routine =
           [](const EffectInput& in) {
