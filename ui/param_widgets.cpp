@@ -8,7 +8,6 @@
 #include <QHBoxLayout>
 #include <QLabel>
 #include <QLineEdit>
-#include <QMouseEvent>
 #include <QPushButton>
 #include <QRadioButton>
 #include <QSlider>
@@ -16,6 +15,7 @@
 #include <algorithm>
 
 #include "imaging/bitmap32.h"
+#include "ui/clickable.h"
 #include "ui/platform.h"
 
 namespace quillane {
@@ -174,7 +174,7 @@ class ColourParam : public ParamWidget {
     auto* row = new QHBoxLayout;
     row->setSpacing(6);
     if (!p.caption.empty()) row->addWidget(CaptionLabel(p, window));
-    panel_ = new Swatch(&window, [this] { Choose(); });
+    panel_ = new Clickable<QFrame>(&window, [this] { Choose(); });
     panel_->setObjectName(Text(p.objectName));
     panel_->setFrameShape(QFrame::Panel);
     panel_->setFrameShadow(QFrame::Sunken);
@@ -193,21 +193,6 @@ class ColourParam : public ParamWidget {
   }
 
  private:
-  class Swatch : public QFrame {
-   public:
-    Swatch(QWidget* parent, std::function<void()> clicked)
-        : QFrame(parent), clicked_(std::move(clicked)) {}
-
-   protected:
-    void mouseReleaseEvent(QMouseEvent* event) override {
-      if (event->button() == Qt::LeftButton && rect().contains(event->position().toPoint()))
-        clicked_();
-    }
-
-   private:
-    std::function<void()> clicked_;
-  };
-
   void Choose() {
     if (const auto colour = platform_.ChooseColor(colour_)) SetValue({*colour});
   }
@@ -221,7 +206,7 @@ class ColourParam : public ParamWidget {
 
   PlatformServices& platform_;
   std::function<void()> changed_;
-  Swatch* panel_ = nullptr;
+  QFrame* panel_ = nullptr;
   std::uint32_t colour_ = 0;
 };
 

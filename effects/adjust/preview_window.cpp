@@ -4,13 +4,13 @@
 #include <QButtonGroup>
 #include <QGridLayout>
 #include <QHBoxLayout>
-#include <QMouseEvent>
 #include <QVBoxLayout>
 #include <algorithm>
 #include <functional>
 
 #include "effects/adjust/color_filter.h"
 #include "effects/adjust/color_variety.h"
+#include "ui/clickable.h"
 #include "ui/picture_view.h"
 
 namespace quillane {
@@ -20,21 +20,6 @@ constexpr int kThumbnailBox = 109;  // the 105 by 105 fitting area and its margi
 const char* const kSwatches[] = {"Panel3", "Panel4", "Panel5", "Panel6", "Panel7", "Panel8"};
 const char* const kSwatchColours[] = {"#ff0000", "#008000", "#0000ff",
                                       "#ffff00", "#008080", "#ff00ff"};
-
-class ClickableView : public PictureView {
- public:
-  ClickableView(QWidget* parent, std::function<void()> clicked)
-      : PictureView(parent), clicked_(std::move(clicked)) {}
-
- protected:
-  void mouseReleaseEvent(QMouseEvent* event) override {
-    if (event->button() == Qt::LeftButton && rect().contains(event->position().toPoint()))
-      clicked_();
-  }
-
- private:
-  std::function<void()> clicked_;
-};
 
 // The swatches as coloured squares in two rows of three.
 void PlaceSwatches(QGridLayout& grid, const std::function<QWidget*(const char*)>& take) {
@@ -57,7 +42,8 @@ PreviewWindow::PreviewWindow(const EffectSpec& spec, ToolHost& host, QWidget* pa
   const auto box = [&](PictureView*& view, const char* name, bool clickable) {
     auto* frame = new QWidget(this);
     frame->setFixedSize(kThumbnailBox, kThumbnailBox);
-    view = clickable ? new ClickableView(frame, [this] { Image1Click(); }) : new PictureView(frame);
+    view = clickable ? new Clickable<PictureView>(frame, [this] { Image1Click(); })
+                     : new PictureView(frame);
     view->setObjectName(name);
     row->addWidget(frame);
   };
