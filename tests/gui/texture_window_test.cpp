@@ -2,8 +2,6 @@
 #include <QCheckBox>
 #include <QLabel>
 #include <QLineEdit>
-#include <QMouseEvent>
-#include <QPointingDevice>
 #include <QPushButton>
 #include <QRadioButton>
 #include <QSlider>
@@ -45,13 +43,7 @@ TEST_F(TextureWindow, TileClicksChooseAndOkStartsFromTheSnapshot) {
   }
   Child<QSlider>("TrackBar1")->setValue(80);
   EXPECT_EQ(Child<QLabel>("Label9")->text(), "80");
-  // A device of the test's own: the toolkit's default one outlives the application object.
-  static const QPointingDevice mouse("test mouse", 1, QInputDevice::DeviceType::Mouse,
-                                     QPointingDevice::PointerType::Generic,
-                                     QInputDevice::Capability::Position, 1, 3);
-  QMouseEvent release(QEvent::MouseButtonRelease, QPointF(4, 4), QPointF(4, 4), QPointF(4, 4),
-                      Qt::LeftButton, Qt::NoButton, Qt::NoModifier, &mouse);
-  QCoreApplication::sendEvent(Child<QLabel>("texture7"), &release);
+  ClickOn(Child<QLabel>("texture7"));
   EXPECT_TRUE(Child<QRadioButton>("RadioButton7")->isChecked());
 
   // Two presses with different tiles do not pile up: both start from the picture as shown.
