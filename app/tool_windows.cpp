@@ -8,6 +8,7 @@
 #include "effects/adjust/preview_window.h"
 #include "effects/mono/bw_sketch_window.h"
 #include "effects/surface/snapshot_window.h"
+#include "effects/surface/texture_window.h"
 #include "ui/tool_window.h"
 
 namespace quillane {
@@ -27,7 +28,7 @@ struct SpecialWindow {
 };
 constexpr SpecialWindow kSpecialWindows[] = {
     {1, Make<TBack_and_White_Sketch>}, {12, Make<TColor_variety>}, {13, Make<TColor_Panel>},
-    {16, Make<TColor_Filter>},         {17, Make<TStria>},
+    {16, Make<TColor_Filter>},         {17, Make<TStria>},         {14, Make<TTexture>},
 };
 
 }  // namespace

@@ -11,6 +11,7 @@
 #endif
 
 #include "bench/synthetic_photo.h"
+#include "data/texture_tiles.h"
 #include "effects/adjust/color_filter.h"
 #include "effects/adjust/color_panel.h"
 #include "effects/adjust/color_variety.h"
@@ -26,6 +27,7 @@
 #include "effects/paint/water_color.h"
 #include "effects/surface/emboss.h"
 #include "effects/surface/stria.h"
+#include "effects/surface/texture.h"
 #include "imaging/edge_map.h"
 #include "imaging/tone.h"
 
@@ -280,6 +282,7 @@ QUILLANE_EFFECT_BENCH(BM_Catercorner16, ColorPanel(Photo(), PanelLayout::Caterco
 QUILLANE_EFFECT_BENCH(BM_HslAdjust, HslAdjust(Photo(), 240, 130, 90));
 QUILLANE_EFFECT_BENCH(BM_Stria,
                       stria(Photo(), kWidth, kHeight, StriaDirection::Vertical, 1, 2, 128, 0));
+QUILLANE_EFFECT_BENCH(BM_Texture, texture(Photo(), TextureTile(4), 50));
 
 }  // namespace
 }  // namespace quillane

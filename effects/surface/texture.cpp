@@ -1,8 +1,76 @@
-// Texture: one of fifteen surface tiles laid over the picture.
-// Its window opens from the menu; the effect itself is still to come.
+#include "effects/surface/texture.h"
+
+#include <algorithm>
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "data/texture_tiles.h"
 #include "effects/registry.h"
+#include "imaging/numeric.h"
+#include "imaging/parallel.h"
+#include "imaging/tone.h"
 
 namespace quillane {
+namespace {
+
+// Beyond 100 points either way every lightness ends at a limit, so the shift is kept there;
+// that keeps it in 16 bits for any pressure.
+int Shift(int tileLightness, int pressure) {
+  return std::clamp(Round(static_cast<Extended>(tileLightness - 70) * pressure / 50), -100, 100);
+}
+
+std::vector<ParamOption> TileOptions() {
+  std::vector<ParamOption> options;
+  for (int n = 1; n <= kTextureTiles; ++n)
+    options.push_back({std::to_string(n), "", "RadioButton" + std::to_string(n), ""});
+  return options;
+}
+
+}  // namespace
+
+TBitmap32 texture(const TBitmap32& base, const TBitmap32& tile, int pressure) {
+  const int w = base.Width(), h = base.Height();
+  TBitmap32 out(w, h);
+  if (w == 0 || h == 0) return out;
+  const int tw = std::max(1, tile.Width()), th = std::max(1, tile.Height());
+  const bool plain = tile.Width() == 0 || tile.Height() == 0;
+  // One row of shifts per tile row, already repeated across the picture's width.
+  const int rows = std::min(th, h);
+  std::vector<std::int16_t> shifts(static_cast<std::size_t>(rows) * static_cast<std::size_t>(w));
+  for (int ty = 0; ty < rows && !plain; ++ty) {
+    std::int16_t* row = &shifts[static_cast<std::size_t>(ty) * static_cast<std::size_t>(w)];
+    const Pixel* tileRow = tile.ScanLine(ty);
+    for (int x = 0; x < std::min(tw, w); ++x)
+      row[x] = static_cast<std::int16_t>(
+          Shift(RgbToHsl(tileRow[x].r, tileRow[x].g, tileRow[x].b).l, pressure));
+    for (int x = tw; x < w; ++x) row[x] = row[x - tw];
+  }
+  const HslRowChanger changer(NoHslChange());
+  ParallelRows(0, h, static_cast<std::size_t>(w) * 8, [&](int y0, int y1) {
+    for (int y = y0; y < y1; ++y)
+      changer.Row(base.ScanLine(y), out.ScanLine(y), w,
+                  &shifts[static_cast<std::size_t>(y % rows) * static_cast<std::size_t>(w)]);
+  });
+  return out;
+}
+
+TBitmap32 TextureReference(const TBitmap32& base, const TBitmap32& tile, int pressure) {
+  TBitmap32 out(base.Width(), base.Height());
+  const bool plain = tile.Width() == 0 || tile.Height() == 0;
+  for (int y = 0; y < base.Height(); ++y)
+    for (int x = 0; x < base.Width(); ++x) {
+      const Pixel b = base.At(x, y);
+      const Hsl hsl = RgbToHslReference(b.r, b.g, b.b);
+      const Pixel t = plain ? Pixel{} : tile.At(x % tile.Width(), y % tile.Height());
+      const Hsl lt = RgbToHslReference(t.r, t.g, t.b);
+      const int shift = plain ? 0 : Shift(lt.l, pressure);
+      const Rgb c = HslToRgbReference(hsl.h, hsl.s, std::clamp(hsl.l + shift, 0, 100));
+      out.At(x, y) = Pixel{static_cast<std::uint8_t>(c.b), static_cast<std::uint8_t>(c.g),
+                           static_cast<std::uint8_t>(c.r), 255};
+    }
+  return out;
+}
 
 const EffectSpec& TextureEffect() {
   static const EffectSpec entry{
@@ -18,6 +86,40 @@ const EffectSpec& TextureEffect() {
       .batchTag = "Texture",
       .collapsedHeight = 288,
       .expandedHeight = 368,
+      .batchPushesHistory = true,
+      .params =
+          {
+              {.kind = ParamKind::Choice,
+               .name = "texture",
+               .defaultValue = 4,
+               .options = TileOptions(),
+               .help = "the surface tile: 1 canvas, 2 paper, 3 brick, 4 stone, 5 wood, 6 twill, 7 "
+                       "crackle, 8 sandstone, 9 burlap, 10 leather, 11 plaster, 12 ripples, 13 "
+                       "hammered metal, 14 bark, 15 mosaic"},
+              {.name = "pressure",
+               .objectName = "TrackBar1",
+               .caption = "Pressure:",
+               .maximum = 100,
+               .defaultValue = 50,
+               .numberLabel = "Label9",
+               .initialNumber = "50",
+               .help =
+                   "0 keeps the lightness, 50 moves it by the tile's lightness - 70, 100 twice"},
+              {.kind = ParamKind::Switch,
+               .name = "for-current",
+               .objectName = "CheckBox1",
+               .caption = "For current",
+               .maximum = 1,
+               .defaultValue = 1,
+               .help = "1: texture the picture as shown when the window opened; 0: the source",
+               .resetOnShow = true},
+          },
+      .routine =
+          [](const EffectInput& in) {
+            const TBitmap32& base = in.params.GetInt("for-current") != 0 ? in.working : in.source;
+            return texture(base, TextureTile(in.params.GetInt("texture")),
+                           in.params.GetInt("pressure"));
+          },
   };
   return entry;
 }

@@ -66,6 +66,7 @@ TEST(EffectsCli, EveryEffectWritesWhatItsRoutineGivesAndBadValuesExitWithTwo) {
       {"water-color --scope 2", {{"scope", {2}}}, 0},
       {"brume --scope 7", {{"scope", {7}}}, 0},
       {"brume --seed 4000000000", {}, 4000000000u},
+      {"texture --texture 15 --pressure 100", {{"texture", {15}}, {"pressure", {100}}}, 0},
   };
   for (const Case& c : cases) {
     SCOPED_TRACE(c.arguments);

@@ -147,6 +147,7 @@ const Reference kReferences[] = {
      {147, 147, 255, 255},
      {61, 61, 255, 255}},
     {"stria", 0x63d58d2b0864063c, {68, 41, 23, 255}, {151, 150, 140, 255}, {28, 73, 48, 255}},
+    {"texture", 0xdeb5264a77da691f, {186, 113, 64, 255}, {197, 196, 191, 255}, {60, 159, 105, 255}},
 };
 
 TEST(EffectTable, EveryEffectGivesItsReferenceResultOnTheBuiltInPicture) {

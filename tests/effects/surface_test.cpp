@@ -4,9 +4,12 @@
 #include <array>
 #include <cstdlib>
 
+#include "data/texture_tiles.h"
 #include "effects/surface/emboss.h"
 #include "effects/surface/stria.h"
+#include "effects/surface/texture.h"
 #include "imaging/numeric.h"
+#include "imaging/tone.h"
 #include "tests/imaging/random_picture.h"
 
 namespace quillane {
@@ -113,6 +116,39 @@ TEST(Stria, MatchesTheCompositedLayerOnEveryAlphaAndSize) {
         ASSERT_EQ(stria(base, lw, lh, d, 3, 2, transparency, 0x123456),
                   PlainStria(base, lw, lh, d, 3, 2, transparency, 0x123456))
             << static_cast<int>(d) << " " << transparency << " " << w << "x" << h;
+      }
+}
+
+// One base pixel under one tile pixel of gray t.
+TEST(Texture, MovesTheLightnessByTheTileAndThePressure) {
+  const auto under = [](Pixel base, int t, int pressure) {
+    return texture(TBitmap32(1, 1, base), TBitmap32(1, 1, Gray(t)), pressure).At(0, 0);
+  };
+  const auto fromHsl = [](int l) {
+    const Rgb c = HslToRgb(0, 0, l);
+    return Pixel{static_cast<std::uint8_t>(c.b), static_cast<std::uint8_t>(c.g),
+                 static_cast<std::uint8_t>(c.r), 255};
+  };
+  const Pixel red{100, 100, 200, 255};
+  EXPECT_EQ(under(red, 179, 50), (Pixel{101, 101, 201, 255}));  // neutral: the round trip
+  EXPECT_EQ(under(red, 230, 50), (Pixel{176, 176, 227, 255}));  // lightness 90: +20
+  EXPECT_EQ(under(Gray(128), 255, 100), Gray(255));             // limited to 100
+  EXPECT_EQ(under(Gray(128), 0, 100), Gray(0));
+  // Pressure 25: shifts of 0.5, 1.5 and -0.5 round half to even.
+  EXPECT_EQ(under(Gray(128), 181, 25), fromHsl(50));
+  EXPECT_EQ(under(Gray(128), 186, 25), fromHsl(52));
+  EXPECT_EQ(under(Gray(128), 176, 25), fromHsl(50));
+}
+
+// Smaller pictures take the tile's top-left part, larger ones repeat it from the corner.
+TEST(Texture, MatchesThePlainConversionsOnEverySize) {
+  for (int n : {1, 5, 14})
+    for (int pressure : {0, 25, 50, 100})
+      for (auto [w, h] : {std::pair{130, 61}, {40, 3}, {1, 59}, {59, 1}, {1, 1}, {0, 0}}) {
+        const TBitmap32 base = RandomPicture(w, h, static_cast<unsigned>(n * 131 + pressure));
+        ASSERT_EQ(texture(base, TextureTile(n), pressure),
+                  TextureReference(base, TextureTile(n), pressure))
+            << n << " " << pressure << " " << w << "x" << h;
       }
 }
 

@@ -2,8 +2,6 @@
 #include <QCheckBox>
 #include <QLabel>
 #include <QLineEdit>
-#include <QMouseEvent>
-#include <QPointingDevice>
 #include <QPushButton>
 #include <QRadioButton>
 #include <QSlider>
@@ -43,15 +41,8 @@ class AdjustWindows : public FileGuiTest {
     ToolChild<QSlider>(number, slider)->setValue(value);
   }
   const TBitmap32& Source() { return Main().Document().Source(); }
-  // A left click on a control that reacts to the mouse itself (colour panels, thumbnails).
   void ClickOn(int number, const char* name) {
-    // A device of the test's own: the toolkit's default one outlives the application object.
-    static const QPointingDevice mouse("test mouse", 1, QInputDevice::DeviceType::Mouse,
-                                       QPointingDevice::PointerType::Generic,
-                                       QInputDevice::Capability::Position, 1, 3);
-    QMouseEvent release(QEvent::MouseButtonRelease, QPointF(4, 4), QPointF(4, 4), QPointF(4, 4),
-                        Qt::LeftButton, Qt::NoButton, Qt::NoModifier, &mouse);
-    QCoreApplication::sendEvent(ToolChild<QWidget>(number, name), &release);
+    quillane::ClickOn(ToolChild<QWidget>(number, name));
   }
   const TBitmap32& Working() { return Main().Document().Working(); }
 

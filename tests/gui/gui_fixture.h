@@ -6,6 +6,8 @@
 
 #include <QApplication>
 #include <QMenuBar>
+#include <QMouseEvent>
+#include <QPointingDevice>
 #include <QString>
 #include <memory>
 
@@ -22,6 +24,18 @@ inline QApplication& Application() {
   static char* argv[] = {name, nullptr};
   static QApplication app(argc, argv);
   return app;
+}
+
+// A left click on a control that reacts to the mouse itself (colour panels, thumbnails, tiles).
+inline void ClickOn(QWidget* control) {
+  // One device of the tests' own for the whole program: the toolkit's default one outlives the
+  // application object, and a second static one crashes when the program exits.
+  static const QPointingDevice mouse("test mouse", 1, QInputDevice::DeviceType::Mouse,
+                                     QPointingDevice::PointerType::Generic,
+                                     QInputDevice::Capability::Position, 1, 3);
+  QMouseEvent release(QEvent::MouseButtonRelease, QPointF(4, 4), QPointF(4, 4), QPointF(4, 4),
+                      Qt::LeftButton, Qt::NoButton, Qt::NoModifier, &mouse);
+  QCoreApplication::sendEvent(control, &release);
 }
 
 // A small picture with a different colour in every pixel, so effects change it visibly.

@@ -1,0 +1,16 @@
+// The texture window: the fifteen tiles in a grid, each above the radio button that chooses
+// it, and the snapshot behaviour of the windows laid over the picture as shown.
+#pragma once
+
+#include "effects/surface/snapshot_window.h"
+
+namespace quillane {
+
+class TTexture : public SnapshotWindow {
+  Q_OBJECT
+
+ public:
+  TTexture(const EffectSpec& spec, ToolHost& host, QWidget* parent);
+};
+
+}  // namespace quillane
