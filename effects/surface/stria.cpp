@@ -5,6 +5,7 @@
 #include <vector>
 
 #include "effects/registry.h"
+#include "effects/surface/for_current.h"
 #include "imaging/numeric.h"
 #include "imaging/parallel.h"
 
@@ -140,18 +141,12 @@ const EffectSpec& StriaEffect() {
                .defaultValue = 0x000000,
                .hint = "Select a color for stria",
                .help = "stripe colour"},
-              {.kind = ParamKind::Switch,
-               .name = "for-current",
-               .objectName = "CheckBox1",
-               .caption = "For current",
-               .maximum = 1,
-               .defaultValue = 1,
-               .help = "1: stripe the picture as shown when the window opened; 0: the source",
-               .resetOnShow = true},
+              ForCurrentParam(
+                  "1: stripe the picture as shown when the window opened; 0: the source"),
           },
       .routine =
           [](const EffectInput& in) {
-            const TBitmap32& base = in.params.GetInt("for-current") != 0 ? in.working : in.source;
+            const TBitmap32& base = ForCurrentBase(in);
             return stria(base, in.source.Width(), in.source.Height(),
                          static_cast<StriaDirection>(in.params.GetInt("direction")),
                          in.params.GetInt("thickness"), in.params.GetInt("space"),

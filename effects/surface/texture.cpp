@@ -7,6 +7,7 @@
 
 #include "data/texture_tiles.h"
 #include "effects/registry.h"
+#include "effects/surface/for_current.h"
 #include "imaging/numeric.h"
 #include "imaging/parallel.h"
 #include "imaging/tone.h"
@@ -105,18 +106,12 @@ const EffectSpec& TextureEffect() {
                .initialNumber = "50",
                .help =
                    "0 keeps the lightness, 50 moves it by the tile's lightness - 70, 100 twice"},
-              {.kind = ParamKind::Switch,
-               .name = "for-current",
-               .objectName = "CheckBox1",
-               .caption = "For current",
-               .maximum = 1,
-               .defaultValue = 1,
-               .help = "1: texture the picture as shown when the window opened; 0: the source",
-               .resetOnShow = true},
+              ForCurrentParam(
+                  "1: texture the picture as shown when the window opened; 0: the source"),
           },
       .routine =
           [](const EffectInput& in) {
-            const TBitmap32& base = in.params.GetInt("for-current") != 0 ? in.working : in.source;
+            const TBitmap32& base = ForCurrentBase(in);
             return texture(base, TextureTile(in.params.GetInt("texture")),
                            in.params.GetInt("pressure"));
           },
