@@ -5,10 +5,20 @@
 
 #include <filesystem>
 #include <fstream>
+#include <functional>
 #include <iterator>
 
 #include "codecs/picture_file.h"
+#include "effects/adjust/color_filter.h"
+#include "effects/adjust/color_panel.h"
+#include "effects/adjust/color_variety.h"
+#include "effects/adjust/hsl_adjust.h"
+#include "effects/mono/pen_and_ink.h"
+#include "effects/mono/pen_sketch.h"
+#include "effects/mono/vuzorar.h"
 #include "effects/registry.h"
+#include "effects/surface/emboss.h"
+#include "effects/surface/stria.h"
 
 namespace quillane {
 namespace {
@@ -42,43 +52,62 @@ int Apply(const std::string& arguments, TBitmap32& output, std::string& err) {
   return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
 }
 
+using Expected = std::function<TBitmap32(const TBitmap32&)>;
+
+// The effect's table routine with these parameters set over its defaults.
+Expected Routine(const char* effect, std::vector<std::pair<const char*, EffectParams::Values>> set,
+                 std::uint32_t seed = 0) {
+  return [=](const TBitmap32& input) {
+    const EffectSpec& spec = *FindEffectByCliName(effect);
+    EffectParams params = spec.Defaults();
+    for (const auto& [name, value] : set) params.SetList(name, value);
+    std::uint32_t s = seed;
+    return spec.routine({input, input, params, &s});
+  };
+}
+
 TEST(EffectsCli, EveryEffectWritesWhatItsRoutineGivesAndBadValuesExitWithTwo) {
-  struct Case {
-    std::string arguments;
-    std::vector<std::pair<const char*, EffectParams::Values>> set;
-    std::uint32_t seed;
-  };
-  const Case cases[] = {
-      {"pen-sketch --pen-pressure 200", {{"pen-pressure", {200}}}, 0},
-      {"vuzorar --vuzorar-pressure 220 --scope 2 --direction falling",
-       {{"vuzorar-pressure", {220}}, {"scope", {2}}, {"direction", {2}}},
-       0},
-      {"vuzorar --direction 4", {{"direction", {4}}}, 0},
-      {"pen-and-ink --adjust-thread 100 --color-ink 1",
-       {{"adjust-thread", {100}}, {"color-ink", {1}}},
-       0},
-      {"color-pencil --pressure 60", {{"pressure", {60}}}, 0},
-      {"realism --kernel=0,1,0,1,-3,1,0,1,0", {{"kernel", {0, 1, 0, 1, -3, 1, 0, 1, 0}}}, 0},
-      {"abstract --kernel 1,1,1,0,2,0,-1,-1,-1", {{"kernel", {1, 1, 1, 0, 2, 0, -1, -1, -1}}}, 0},
+  const std::pair<std::string, Expected> cases[] = {
+      {"color-pencil --pressure 60", Routine("color-pencil", {{"pressure", {60}}})},
+      {"realism --kernel=0,1,0,1,-3,1,0,1,0",
+       Routine("realism", {{"kernel", {0, 1, 0, 1, -3, 1, 0, 1, 0}}})},
+      {"abstract --kernel 1,1,1,0,2,0,-1,-1,-1",
+       Routine("abstract", {{"kernel", {1, 1, 1, 0, 2, 0, -1, -1, -1}}})},
       {"pop-art --kernel -2147483648,0,0,0,0,0,0,0,2147483647",
-       {{"kernel", {-2147483648ll, 0, 0, 0, 0, 0, 0, 0, 2147483647}}},
-       0},
-      {"water-color --scope 2", {{"scope", {2}}}, 0},
-      {"brume --scope 7", {{"scope", {7}}}, 0},
-      {"brume --seed 4000000000", {}, 4000000000u},
-      {"texture --texture 15 --pressure 100", {{"texture", {15}}, {"pressure", {100}}}, 0},
+       Routine("pop-art", {{"kernel", {-2147483648ll, 0, 0, 0, 0, 0, 0, 0, 2147483647}}})},
+      {"water-color --scope 2", Routine("water-color", {{"scope", {2}}})},
+      {"brume --scope 7", Routine("brume", {{"scope", {7}}})},
+      {"brume --seed 4000000000", Routine("brume", {}, 4000000000u)},
+      {"texture --texture 15 --pressure 100",
+       Routine("texture", {{"texture", {15}}, {"pressure", {100}}})},
+      // Against the functions themselves, so the table's reading of the values counts too.
+      {"pen-sketch --pen-pressure 200", [](const TBitmap32& p) { return PenSketch(p, 200); }},
+      {"vuzorar --vuzorar-pressure 220 --scope 2 --direction falling",
+       [](const TBitmap32& p) { return Vuzorar(p, 220, 2, HatchDirection::Falling); }},
+      {"vuzorar --direction 4",
+       [](const TBitmap32& p) { return Vuzorar(p, 128, 3, HatchDirection::Horizontal); }},
+      {"pen-and-ink --adjust-thread 100 --color-ink 1",
+       [](const TBitmap32& p) { return Pen_and_Ink(p, 100, true); }},
+      {"emboss --lighting 30 --depth 2", [](const TBitmap32& p) { return emboss(p, 30, 2); }},
+      {"color-filter --filter cyan",
+       [](const TBitmap32& p) { return filter(p, ColorFilterKind::Cyan); }},
+      {"color-variety --more red,cyan,cyan",
+       [](const TBitmap32& p) { return VarietyClicks(p, {1, 5, 5}); }},
+      {"color-panel --layout catercorner-16",
+       [](const TBitmap32& p) { return ColorPanel(p, PanelLayout::Catercorner16); }},
+      {"hsl-adjust --hue 40 --saturation 150 --lighting 80",
+       [](const TBitmap32& p) { return HslAdjust(p, 40, 150, 80); }},
+      {"stria --direction horizontal --thickness 3 --space 4 --transparent 60 --color '#ff8000'",
+       [](const TBitmap32& p) {
+         return stria(p, 23, 17, StriaDirection::Horizontal, 3, 4, 60, 0x0080FF);
+       }},
   };
-  for (const Case& c : cases) {
-    SCOPED_TRACE(c.arguments);
+  for (const auto& [arguments, expected] : cases) {
+    SCOPED_TRACE(arguments);
     TBitmap32 output;
     std::string err;
-    ASSERT_EQ(Apply(c.arguments, output, err), 0) << err;
-    const TBitmap32 input = Input();
-    const EffectSpec& spec = *FindEffectByCliName(c.arguments.substr(0, c.arguments.find(' ')));
-    EffectParams params = spec.Defaults();
-    for (const auto& [name, value] : c.set) params.SetList(name, value);
-    std::uint32_t seed = c.seed;
-    EXPECT_EQ(output, spec.routine({input, input, params, &seed}));
+    ASSERT_EQ(Apply(arguments, output, err), 0) << err;
+    EXPECT_EQ(output, expected(Input()));
   }
   TBitmap32 unused;
   std::string err;

@@ -5,6 +5,7 @@
 
 #include "effects/paint/abstract.h"
 #include "effects/paint/pop_art.h"
+#include "tests/imaging/random_picture.h"
 
 namespace quillane {
 namespace {
@@ -13,14 +14,7 @@ const Kernel kPopArt{-1, -2, -1, 0, 0, 0, 1, 2, 1};
 const Pixel kWhite{255, 255, 255, 255};
 
 TBitmap32 Noise(int w, int h) {
-  TBitmap32 b(w, h);
-  unsigned s = 5;
-  for (Pixel* p = b.Data(); p != b.Data() + b.PixelCount(); ++p) {
-    s = s * 1103515245u + 12345u;
-    *p = Pixel{static_cast<std::uint8_t>(s >> 24), static_cast<std::uint8_t>(s >> 16),
-               static_cast<std::uint8_t>(s >> 8), static_cast<std::uint8_t>(s >> 20)};
-  }
-  return b;
+  return RandomPicture(w, h, 5);
 }
 
 // The levels down the middle column (vertical) or along the middle row of the result on a

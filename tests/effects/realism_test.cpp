@@ -4,6 +4,8 @@
 
 #include <limits>
 
+#include "tests/imaging/random_picture.h"
+
 namespace quillane {
 namespace {
 
@@ -12,14 +14,7 @@ constexpr std::int64_t kMin = std::numeric_limits<std::int32_t>::min();
 const Kernel kDefault{1, 2, 1, 0, 0, 0, -1, -1, -1};
 
 TBitmap32 Noise(int w, int h) {
-  TBitmap32 b(w, h);
-  unsigned s = 99;
-  for (Pixel* p = b.Data(); p != b.Data() + b.PixelCount(); ++p) {
-    s = s * 1103515245u + 12345u;
-    *p = Pixel{static_cast<std::uint8_t>(s >> 24), static_cast<std::uint8_t>(s >> 16),
-               static_cast<std::uint8_t>(s >> 8), static_cast<std::uint8_t>(s >> 20)};
-  }
-  return b;
+  return RandomPicture(w, h, 99);
 }
 
 // The middle column of the default kernel's result on rows 0..2 of level top and 3..5 of
