@@ -55,36 +55,29 @@ TEST(HelperProcess, PassesMegabytesThroughBothWays) {
 
 TEST(HelperProcess, KillsAndReapsChildrenThatMisbehave) {
   const std::size_t descriptors = OpenDescriptors();
-  {
-    Collect output(0);
-    EXPECT_EQ(RunHelper("/bin/sleep", {"60"}, {}, 200ms, output).kind,
-              HelperEnding::Kind::kTimedOut);
-  }
-  {
-    // Sends more than the 10 bytes expected.
-    Collect output(10);
-    EXPECT_EQ(RunHelper("/bin/yes", {}, {}, 30s, output).kind, HelperEnding::Kind::kOverran);
-    EXPECT_EQ(output.got, 10u);
-  }
-  {
-    Collect output(0);
-    const HelperEnding ending = RunHelper("/bin/sh", {"-c", "kill -SEGV $$"}, {}, 30s, output);
-    EXPECT_EQ(ending.kind, HelperEnding::Kind::kSignalled);
-    EXPECT_EQ(ending.value, SIGSEGV);
-  }
-  {
-    // Ends without reading its input: the write fails quietly instead of raising SIGPIPE.
-    Collect output(0);
-    const std::vector<std::uint8_t> input(1 << 20, 'x');
-    const HelperEnding ending = RunHelper("/bin/sh", {"-c", "exit 3"}, input, 30s, output);
-    EXPECT_EQ(ending.kind, HelperEnding::Kind::kExited);
-    EXPECT_EQ(ending.value, 3);
-  }
-  {
-    Collect output(0);
-    const HelperEnding ending = RunHelper("/nonexistent/helper", {}, {}, 30s, output);
-    EXPECT_EQ(ending.kind, HelperEnding::Kind::kNotStarted);
-    EXPECT_EQ(ending.value, ENOENT);
+  using Kind = HelperEnding::Kind;
+  const struct {
+    const char* program;
+    std::vector<std::string> args;
+    std::size_t input, expected;
+    std::chrono::milliseconds timeout;
+    Kind kind;
+    int value;  // -1: any
+  } cases[] = {
+      {"/bin/sleep", {"60"}, 0, 0, 200ms, Kind::kTimedOut, -1},
+      // Sends more than the 10 bytes expected.
+      {"/bin/yes", {}, 0, 10, 30s, Kind::kOverran, -1},
+      {"/bin/sh", {"-c", "kill -SEGV $$"}, 0, 0, 30s, Kind::kSignalled, SIGSEGV},
+      // Ends without reading its input: the write fails quietly instead of raising SIGPIPE.
+      {"/bin/sh", {"-c", "exit 3"}, 1 << 20, 0, 30s, Kind::kExited, 3},
+      {"/nonexistent/helper", {}, 0, 0, 30s, Kind::kNotStarted, ENOENT}};
+  for (const auto& c : cases) {
+    Collect output(c.expected);
+    const std::vector<std::uint8_t> input(c.input, 'x');
+    const HelperEnding ending = RunHelper(c.program, c.args, input, c.timeout, output);
+    EXPECT_EQ(ending.kind, c.kind) << c.program;
+    EXPECT_TRUE(c.value < 0 || ending.value == c.value) << c.program << ": " << ending.value;
+    EXPECT_EQ(output.got, c.expected) << c.program;
   }
   ExpectNoChildren();
   EXPECT_EQ(OpenDescriptors(), descriptors);

@@ -62,6 +62,20 @@ void LimitAddressSpaceGrowth(std::uint64_t extraBytes);
 #endif
 std::vector<std::uint8_t> ReadBytes(const std::string& path);
 
+// The message of the PictureFileError that f throws, or "" when it returns.
+template <typename F>
+std::string ErrorOf(F&& f) {
+  try {
+    f();
+  } catch (const PictureFileError& error) {
+    return error.what();
+  }
+  return "";
+}
+inline bool Contains(const std::string& text, const std::string& part) {
+  return !part.empty() && text.find(part) != std::string::npos;
+}
+
 constexpr Pixel kRed{0, 0, 255, 255};
 constexpr Pixel kGreen{0, 255, 0, 255};
 constexpr Pixel kBlue{255, 0, 0, 255};
