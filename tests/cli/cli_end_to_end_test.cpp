@@ -6,13 +6,23 @@
 
 #include <filesystem>
 #include <fstream>
+#include <functional>
 #include <iterator>
 #include <string>
 
 #include "codecs/picture_file.h"
 #include "data/startup_picture.h"
+#include "effects/adjust/color_filter.h"
+#include "effects/adjust/color_panel.h"
+#include "effects/adjust/color_variety.h"
+#include "effects/adjust/hsl_adjust.h"
 #include "effects/mono/bw_sketch.h"
+#include "effects/mono/pen_and_ink.h"
+#include "effects/mono/pen_sketch.h"
+#include "effects/mono/vuzorar.h"
 #include "effects/registry.h"
+#include "effects/surface/emboss.h"
+#include "effects/surface/stria.h"
 
 namespace quillane {
 namespace {
@@ -78,13 +88,23 @@ TBitmap32 Pencil(TBitmap32 picture, PencilToneMode mode, int contrast, int light
   return peccilsketch(picture, mode, contrast, lighting);
 }
 
+using Expected = std::function<TBitmap32(const TBitmap32&)>;
+
+// The effect's table routine with these parameters set over its defaults.
+Expected Routine(const char* effect, std::vector<std::pair<const char*, EffectParams::Values>> set,
+                 std::uint32_t seed = 0) {
+  return [=](const TBitmap32& input) {
+    const EffectSpec& spec = *FindEffectByCliName(effect);
+    EffectParams params = spec.Defaults();
+    for (const auto& [name, value] : set) params.SetList(name, value);
+    std::uint32_t s = seed;
+    return spec.routine({input, input, params, &s});
+  };
+}
+
 TEST_F(CliRun, ApplyWritesExactlyWhatTheRoutineGives) {
   SaveBitmap24(Picture(31, 22), Path("in.bmp"));
   const TBitmap32 loaded = *LoadPictureFile(Path("in.bmp"));
-  // Other effects' parameters are effects_cli_test's.
-  ASSERT_EQ(Run("apply pencil-sketch --lighting 140 " + Q("in.bmp") + " -o " + Q("out.png")), 0)
-      << err_;
-  EXPECT_EQ(FromPng(Path("out.png")), Pencil(loaded, PencilToneMode::Lighting, 45, 140));
   ASSERT_EQ(Run("apply pencil-sketch --contrast=30 " + Q("in.bmp") + " -o " + Q("out.BMP")), 0)
       << err_;
   EXPECT_EQ(*LoadPictureFile(Path("out.BMP")), Pencil(loaded, PencilToneMode::Contrast, 30, 128));
@@ -93,6 +113,65 @@ TEST_F(CliRun, ApplyWritesExactlyWhatTheRoutineGives) {
   ASSERT_EQ(Run("apply pencil-sketch " + Q("in.bmp") + " -o " + Q("out.jpeg")), 0) << err_;
   SaveJpeg(Pencil(loaded, PencilToneMode::Contrast, 45, 128), Path("expected.jpg"), 90);
   EXPECT_EQ(ReadText(Path("out.jpeg")), ReadText(Path("expected.jpg")));
+}
+
+// Every effect's own parameters reach it: the same bytes as its routine run here.
+TEST_F(CliRun, EveryEffectWritesWhatItsRoutineGivesAndBadValuesExitWithTwo) {
+  SaveBitmap24(Picture(23, 17), Path("in.bmp"));
+  const TBitmap32 loaded = *LoadPictureFile(Path("in.bmp"));
+  const std::pair<std::string, Expected> cases[] = {
+      {"color-pencil --pressure 60", Routine("color-pencil", {{"pressure", {60}}})},
+      {"realism --kernel=0,1,0,1,-3,1,0,1,0",
+       Routine("realism", {{"kernel", {0, 1, 0, 1, -3, 1, 0, 1, 0}}})},
+      {"abstract --kernel 1,1,1,0,2,0,-1,-1,-1",
+       Routine("abstract", {{"kernel", {1, 1, 1, 0, 2, 0, -1, -1, -1}}})},
+      {"pop-art --kernel -2147483648,0,0,0,0,0,0,0,2147483647",
+       Routine("pop-art", {{"kernel", {-2147483648ll, 0, 0, 0, 0, 0, 0, 0, 2147483647}}})},
+      {"water-color --scope 2", Routine("water-color", {{"scope", {2}}})},
+      {"brume --scope 7", Routine("brume", {{"scope", {7}}})},
+      {"brume --seed 4000000000", Routine("brume", {}, 4000000000u)},
+      {"texture --texture 15 --pressure 100",
+       Routine("texture", {{"texture", {15}}, {"pressure", {100}}})},
+      // Against the functions themselves, so the table's reading of the values counts too.
+      {"pencil-sketch --lighting 140",
+       [](const TBitmap32& p) { return Pencil(p, PencilToneMode::Lighting, 45, 140); }},
+      {"pen-sketch --pen-pressure 200", [](const TBitmap32& p) { return PenSketch(p, 200); }},
+      {"vuzorar --vuzorar-pressure 220 --scope 2 --direction falling",
+       [](const TBitmap32& p) { return Vuzorar(p, 220, 2, HatchDirection::Falling); }},
+      {"vuzorar --direction 4",
+       [](const TBitmap32& p) { return Vuzorar(p, 128, 3, HatchDirection::Horizontal); }},
+      {"pen-and-ink --adjust-thread 100 --color-ink 1",
+       [](const TBitmap32& p) { return Pen_and_Ink(p, 100, true); }},
+      {"emboss --lighting 30 --depth 2", [](const TBitmap32& p) { return emboss(p, 30, 2); }},
+      {"color-filter --filter cyan",
+       [](const TBitmap32& p) { return filter(p, ColorFilterKind::Cyan); }},
+      {"color-variety --more red,cyan,cyan",
+       [](const TBitmap32& p) { return VarietyClicks(p, {1, 5, 5}); }},
+      {"color-panel --layout catercorner-16",
+       [](const TBitmap32& p) { return ColorPanel(p, PanelLayout::Catercorner16); }},
+      {"hsl-adjust --hue 40 --saturation 150 --lighting 80",
+       [](const TBitmap32& p) { return HslAdjust(p, 40, 150, 80); }},
+      {"stria --direction horizontal --thickness 3 --space 4 --transparent 60 --color '#ff8000'",
+       [](const TBitmap32& p) {
+         return stria(p, 23, 17, StriaDirection::Horizontal, 3, 4, 60, 0x0080FF);
+       }},
+  };
+  for (const auto& [arguments, expected] : cases) {
+    ASSERT_EQ(Run("apply " + arguments + " " + Q("in.bmp") + " -o " + Q("out.bmp")), 0) << err_;
+    TBitmap32 written = *LoadPictureFile(Path("out.bmp"));
+    SetAlphaChannel(written, 255);
+    EXPECT_EQ(written, expected(loaded)) << arguments;
+  }
+  const auto apply = [&](const std::string& arguments) {
+    return Run("apply " + arguments + " -o " + Q("bad.bmp"));
+  };
+  EXPECT_EQ(apply("realism --kernel 1,2,1,0,abc,0,-1,-1,-1"), 2);
+  EXPECT_NE(err_.find("'abc' is not a valid integer value"), std::string::npos) << err_;
+  EXPECT_EQ(apply("pop-art --kernel 1,2,3"), 2);
+  EXPECT_EQ(apply("brume --seed -1"), 2);
+  EXPECT_EQ(apply("brume --seed 4294967296"), 2);
+  EXPECT_NE(err_.find("--seed must be an integer from 0 to 4294967295"), std::string::npos) << err_;
+  EXPECT_FALSE(fs::exists(Path("bad.bmp")));
 }
 
 TEST_F(CliRun, ApplyReadsPngStandardInputAndTheBuiltInPicture) {
