@@ -6,6 +6,8 @@
 #include <stdexcept>
 #include <vector>
 
+#include "tests/codecs/test_support.h"
+
 namespace quillane {
 namespace {
 
@@ -30,32 +32,19 @@ TEST(StartupPicture, IsAnOpaqueDetailedPictureOfTheFixedSize) {
   EXPECT_EQ(StartupPicture(), picture);
 }
 
-// A small 24-bit BMP: 14 + 40 header bytes, then rows padded to four bytes.
+// A small 24-bit BMP whose pixel (x, row in file order) is (B x, G file row, R 200).
 std::vector<std::uint8_t> SmallBitmap(int width, int height, bool topDown) {
   const int stride = (width * 3 + 3) & ~3;
-  const int absHeight = height < 0 ? -height : height;
-  std::vector<std::uint8_t> b(54 + static_cast<std::size_t>(stride * absHeight), 0);
-  const auto put = [&](std::size_t at, std::uint32_t v, int n) {
-    for (int i = 0; i < n; ++i) b[at + i] = static_cast<std::uint8_t>(v >> (8 * i));
-  };
-  b[0] = 'B';
-  b[1] = 'M';
-  put(2, static_cast<std::uint32_t>(b.size()), 4);
-  put(10, 54, 4);
-  put(14, 40, 4);
-  put(18, static_cast<std::uint32_t>(width), 4);
-  put(22, static_cast<std::uint32_t>(topDown ? -height : height), 4);
-  put(26, 1, 2);
-  put(28, 24, 2);
-  // Pixel (x, row in file order) = (B x, G file row, R 200).
-  for (int row = 0; row < absHeight; ++row)
-    for (int x = 0; x < width; ++x) {
-      const std::size_t at = 54 + static_cast<std::size_t>(row * stride + x * 3);
-      b[at] = static_cast<std::uint8_t>(x);
-      b[at + 1] = static_cast<std::uint8_t>(row);
-      b[at + 2] = 200;
-    }
-  return b;
+  testing::ByteWriter w;
+  w.bytes.reserve(static_cast<std::size_t>(54 + stride * height));
+  w.U8('B').U8('M').U32(54 + stride * height).U32(0).U32(54);
+  w.U32(40).I32(width).I32(topDown ? -height : height).U16(1).U16(24);
+  for (int i = 0; i < 6; ++i) w.U32(0);
+  for (int row = 0; row < height; ++row) {
+    for (int x = 0; x < width; ++x) w.U8(x).U8(row).U8(200);
+    for (int pad = width * 3; pad < stride; ++pad) w.U8(0);
+  }
+  return w.bytes;
 }
 
 TEST(DecodeBitmap24, ReadsBottomUpAndTopDownRowsWithPadding) {
