@@ -2,30 +2,26 @@
 
 #include <gtest/gtest.h>
 
-#include "effects/registry.h"
 #include "imaging/edge_map.h"
 #include "imaging/tone.h"
 
 namespace quillane {
 namespace {
 
-TBitmap32 Flat(int w, int h, Pixel p) {
-  return TBitmap32(w, h, p);
-}
 Pixel Gray(std::uint8_t v) {
   return Pixel{v, v, v, 255};
 }
 
 TEST(PencilSketch, FlatPictureGivesUniformTones) {
-  const TBitmap32 flat = Flat(6, 5, Pixel{40, 90, 200, 255});
+  const TBitmap32 flat(6, 5, Pixel{40, 90, 200, 255});
   for (int v : {128, 200, 255})
-    EXPECT_EQ(peccilsketch(flat, PencilToneMode::Lighting, 0, v), Flat(6, 5, Gray(255)));
+    EXPECT_EQ(peccilsketch(flat, PencilToneMode::Lighting, 0, v), TBitmap32(6, 5, Gray(255)));
   for (int c : {45, 60, 89})
-    EXPECT_EQ(peccilsketch(flat, PencilToneMode::Contrast, c, 0), Flat(6, 5, Gray(255)));
-  EXPECT_EQ(peccilsketch(flat, PencilToneMode::Contrast, 10, 0), Flat(6, 5, Gray(250)));
-  EXPECT_EQ(peccilsketch(flat, PencilToneMode::Contrast, 0, 0), Flat(6, 5, Gray(255)));
-  EXPECT_EQ(peccilsketch(flat, PencilToneMode::Lighting, 45, 0), Flat(6, 5, Gray(0)));
-  EXPECT_EQ(peccilsketch(flat, PencilToneMode::Lighting, 45, 100), Flat(6, 5, Gray(199)));
+    EXPECT_EQ(peccilsketch(flat, PencilToneMode::Contrast, c, 0), TBitmap32(6, 5, Gray(255)));
+  EXPECT_EQ(peccilsketch(flat, PencilToneMode::Contrast, 10, 0), TBitmap32(6, 5, Gray(250)));
+  EXPECT_EQ(peccilsketch(flat, PencilToneMode::Contrast, 0, 0), TBitmap32(6, 5, Gray(255)));
+  EXPECT_EQ(peccilsketch(flat, PencilToneMode::Lighting, 45, 0), TBitmap32(6, 5, Gray(0)));
+  EXPECT_EQ(peccilsketch(flat, PencilToneMode::Lighting, 45, 100), TBitmap32(6, 5, Gray(199)));
 }
 
 TBitmap32 Scene() {
@@ -44,22 +40,9 @@ TEST(PencilSketch, LightingAtNeutralIsTheGrayEdgeMap) {
   EXPECT_EQ(peccilsketch(Scene(), PencilToneMode::Lighting, 3, 128), edges);
 }
 
-TEST(PencilSketch, RegistryRunsTheChosenToneOnly) {
-  const EffectSpec* pencil = FindEffectByCliName("pencil-sketch");
-  ASSERT_NE(pencil, nullptr);
-  EffectParams params = pencil->Defaults();
-  params.Set("contrast", 30);
-  params.Set("lighting", 200);
-  const TBitmap32 source = Scene();
-  const EffectInput in{source, source, params};
-  EXPECT_EQ(pencil->routine(in), peccilsketch(source, PencilToneMode::Contrast, 30, 999));
-  params.Set("tone-mode", 1);
-  EXPECT_EQ(pencil->routine(in), peccilsketch(source, PencilToneMode::Lighting, -7, 200));
-}
-
 TEST(PencilSketch, TinyPicturesNeverFail) {
   for (auto [w, h] : {std::pair{0, 0}, {1, 1}, {1, 5}, {5, 1}, {2, 3}, {3, 2}, {3, 3}}) {
-    const TBitmap32 src = Flat(w, h, Pixel{1, 2, 3, 255});
+    const TBitmap32 src = TBitmap32(w, h, Pixel{1, 2, 3, 255});
     const TBitmap32 out = peccilsketch(src, PencilToneMode::Contrast, 45, 128);
     EXPECT_EQ(out.Width(), src.Width());
     EXPECT_EQ(out.Height(), src.Height());
