@@ -2,13 +2,13 @@
 
 #include <QCloseEvent>
 #include <QImage>
+#include <QKeyEvent>
 #include <QKeySequence>
 #include <QMouseEvent>
 #include <QPaintEvent>
 #include <QPainter>
 #include <QScrollArea>
 #include <QScrollBar>
-#include <QShortcut>
 #include <QShowEvent>
 #include <QVBoxLayout>
 #include <cmath>
@@ -101,10 +101,13 @@ TFreehand::TFreehand(PaintingState& state, ToolHost& host)
   image1_->resize(0, 0);
   scrollBox_->setWidget(image1_);
   layout->addWidget(scrollBox_);
+}
 
-  auto* undo = new QShortcut(QKeySequence::Undo, this);
-  undo->setContext(Qt::WindowShortcut);
-  connect(undo, &QShortcut::activated, this, &TFreehand::UndoStroke);
+void TFreehand::keyPressEvent(QKeyEvent* event) {
+  if (event->matches(QKeySequence::Undo))
+    UndoStroke();
+  else
+    QWidget::keyPressEvent(event);
 }
 
 // --- Opening and closing -----------------------------------------------------------------------
