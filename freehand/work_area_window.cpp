@@ -1,8 +1,8 @@
 #include "freehand/work_area_window.h"
 
+#include <QAction>
 #include <QCloseEvent>
 #include <QImage>
-#include <QKeyEvent>
 #include <QKeySequence>
 #include <QMouseEvent>
 #include <QPaintEvent>
@@ -101,13 +101,13 @@ TFreehand::TFreehand(PaintingState& state, ToolHost& host)
   image1_->resize(0, 0);
   scrollBox_->setWidget(image1_);
   layout->addWidget(scrollBox_);
-}
 
-void TFreehand::keyPressEvent(QKeyEvent* event) {
-  if (event->matches(QKeySequence::Undo))
-    UndoStroke();
-  else
-    QWidget::keyPressEvent(event);
+  auto* undo = new QAction("Undo stroke", this);
+  undo->setObjectName("UndoStroke");
+  undo->setShortcut(QKeySequence::Undo);
+  undo->setShortcutContext(Qt::WindowShortcut);
+  connect(undo, &QAction::triggered, this, &TFreehand::UndoStroke);
+  addAction(undo);
 }
 
 // --- Opening and closing -----------------------------------------------------------------------
