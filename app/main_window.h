@@ -63,6 +63,7 @@ class TMyPicture : public QMainWindow, public ToolHost {
 
   QString StatusText() const;
   void SetStatusText(const QString& text) override;
+  void SetMainWindowEnabled(bool enabled) override { setEnabled(enabled); }
   double ZoomPercent() const { return zoomPercent_; }
   // The number the zoom label shows (its caption without the "%").
   double ZoomFromLabel() const;

@@ -9,6 +9,7 @@
 #include "effects/mono/bw_sketch_window.h"
 #include "effects/surface/snapshot_window.h"
 #include "effects/surface/texture_window.h"
+#include "freehand/painting_window.h"
 #include "ui/tool_window.h"
 
 namespace quillane {
@@ -34,6 +35,8 @@ constexpr SpecialWindow kSpecialWindows[] = {
 }  // namespace
 
 void CreateToolWindows(TMyPicture& main) {
+  // The freehand windows the drawing styles' "Color up" opens; they go with the main window.
+  auto* freehand = new FreehandPainting(main, &main);
   for (const EffectSpec* spec : Effects()) {
     const auto special =
         std::find_if(std::begin(kSpecialWindows), std::end(kSpecialWindows),
@@ -42,6 +45,8 @@ void CreateToolWindows(TMyPicture& main) {
         special != std::end(kSpecialWindows) ? special->make : Make<ToolWindow>;
     ToolWindow* window = make(*spec, main, &main);
     window->hide();
+    if (spec->colorUp)
+      QObject::connect(window, &ToolWindow::colorUpRequested, freehand, &FreehandPainting::ColorUp);
     main.RegisterToolWindow(window);
   }
 }

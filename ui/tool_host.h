@@ -35,6 +35,8 @@ class ToolHost {
   virtual void SetWorkingPicture(TBitmap32 picture, bool recordHistory) = 0;
 
   virtual void SetStatusText(const QString& text) = 0;
+  // The freehand windows keep the main window disabled while they are open.
+  virtual void SetMainWindowEnabled(bool enabled) = 0;
   virtual void SetActiveTool(int number) = 0;
   virtual bool LineArt() const = 0;
   virtual void SetLineArt(bool on) = 0;

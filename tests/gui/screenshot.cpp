@@ -1,6 +1,8 @@
 // Not a test: shows the main window with the pencil window (batch panel open) on a real
 // display and saves the screen as a PNG, to look at the windows as a user sees them.
-//   xvfb-run -a -s "-screen 0 1280x1024x24" ./gui_screenshot out.png [TOOL_NUMBER]
+//   xvfb-run -a -s "-screen 0 1280x1024x24" ./gui_screenshot out.png [TOOL_NUMBER [colorup]]
+// With "colorup" after a drawing window's number, its "Color up" opens the freehand windows
+// too, and the whole screen is saved as out.png.colorup.png.
 #include <QApplication>
 #include <QScreen>
 #include <QTimer>
@@ -25,10 +27,12 @@ int main(int argc, char* argv[]) {
   if (quillane::ToolWindow* open = window.ToolWindowAt(tool)) {
     open->SpeedButton1Click();
     open->ApplyClick();
+    if (argc > 3 && QString(argv[3]) == "colorup") open->ColorUpClick();
   }
   QTimer::singleShot(700, [&] {
     const QPixmap screen = QApplication::primaryScreen()->grabWindow(0);
     screen.copy(0, 0, 580, 500).save(out);
+    if (argc > 3) screen.save(out + ".colorup.png");
     // The toolbar three times as large, to judge the glyphs.
     screen.copy(0, 20, 560, 40).scaled(1680, 120).save(out + ".toolbar.png");
     app.quit();
