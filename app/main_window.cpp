@@ -104,6 +104,7 @@ TMyPicture::TMyPicture(PlatformServices& platform, TBitmap32 picture)
   batchConvertOk_ = new TBatchConvertOk(
       platform_, [this] { return outputFolder_; }, this);
   batchConvertOk_->hide();
+  ConnectExportCommands();
 
   ShowWorking(zoomPercent_);
   UpdateHistoryControls();

@@ -28,6 +28,7 @@ namespace quillane {
 
 class PictureView;
 class PlatformServices;
+class TAboutus;
 class TBatchConvertOk;
 class ToolWindow;
 struct BatchResult;
@@ -121,6 +122,11 @@ class TMyPicture : public QMainWindow, public ToolHost {
   void SpeedButton3Click();   // Undo
   void SpeedButton18Click();  // Redo
   void SpeedButton7Click();   // Renew
+  void SpeedButton9Click();   // set the working picture as the desktop wallpaper
+  void SpeedButton10Click();  // print the working picture
+  void SpeedButton11Click();  // mail the working picture
+  void Online1Click();        // the program's documentation
+  void About1Click();
   void Exit1Click();
 
  signals:
@@ -143,6 +149,8 @@ class TMyPicture : public QMainWindow, public ToolHost {
   // The view after the working picture changed in place: shown again, history buttons updated.
   void ShowWorkingChanged();
   void UpdateHistoryControls();
+  // Print, wallpaper, mail and Help: connected, and the About box created hidden.
+  void ConnectExportCommands();
 
   PlatformServices& platform_;
   PictureDocument document_;
@@ -169,6 +177,7 @@ class TMyPicture : public QMainWindow, public ToolHost {
   QToolButton* upArrow_ = nullptr;
   QListWidget* listView1_ = nullptr;
   TBatchConvertOk* batchConvertOk_ = nullptr;
+  TAboutus* aboutBox_ = nullptr;
 };
 
 }  // namespace quillane

@@ -9,6 +9,7 @@
 #include <QImageReader>
 #include <QLabel>
 #include <QMessageBox>
+#include <QPrintDialog>
 #include <QUrl>
 
 namespace quillane {
@@ -138,6 +139,15 @@ std::optional<std::uint32_t> QtPlatformServices::ChooseColor(std::uint32_t initi
 
 void QtPlatformServices::OpenFolder(const QString& folder) {
   QDesktopServices::openUrl(QUrl::fromLocalFile(folder));
+}
+
+bool QtPlatformServices::PrintDialog(QPrinter& printer) {
+  QPrintDialog dialog(&printer, DialogOwner());
+  return dialog.exec() == QDialog::Accepted;
+}
+
+bool QtPlatformServices::OpenWithDefaultProgram(const QString& path) {
+  return QDesktopServices::openUrl(QUrl::fromLocalFile(path));
 }
 
 }  // namespace quillane

@@ -17,6 +17,8 @@ class QtPlatformServices : public PlatformServices {
   std::optional<QString> BrowseFolder(const QString& title, const QString& startFolder) override;
   std::optional<std::uint32_t> ChooseColor(std::uint32_t initial) override;
   void OpenFolder(const QString& folder) override;
+  bool PrintDialog(QPrinter& printer) override;
+  bool OpenWithDefaultProgram(const QString& path) override;
 };
 
 // "name|mask|name|mask" as QFileDialog name filters, one per pair. A name that repeats its mask

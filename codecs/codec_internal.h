@@ -67,6 +67,7 @@ TBitmap32 DecodeWindowsMetafile(Bytes data, std::int64_t maxPixels = TBitmap32::
 // Encoders. quality is clamped to 1..100.
 std::vector<std::uint8_t> EncodeJpeg(const TBitmap32& picture, int quality);
 void EncodeBitmap24(const TBitmap32& picture, ByteSink& sink);
+void EncodeBitmap32(const TBitmap32& picture, ByteSink& sink);
 void EncodeEnhancedMetafile(const TBitmap32& picture, ByteSink& sink);
 std::vector<std::uint8_t> EncodePng(const TBitmap32& picture);
 

@@ -141,6 +141,39 @@ void EncodeBitmap24(const TBitmap32& picture, ByteSink& sink) {
   WriteDib24(picture, sink);
 }
 
+// The same file with 32 bits per pixel: rows are the picture's own B, G, R, A bytes, never
+// padded, still bottom-up and uncompressed (BI_RGB), as the desktop's wallpaper readers expect.
+void EncodeBitmap32(const TBitmap32& picture, ByteSink& sink) {
+  if (picture.Empty()) throw PictureFileError("There is no picture to save");
+  constexpr std::uint32_t kFileHeaderSize = 14;
+  const std::uint64_t bitsSize = static_cast<std::uint64_t>(picture.Width()) * 4 *
+                                 static_cast<std::uint64_t>(picture.Height());
+  const std::uint64_t fileSize = kFileHeaderSize + kDibInfoHeaderSize + bitsSize;
+  if (fileSize > 0xFFFFFFFFull) throw PictureFileError("The picture is too large for a bitmap");
+
+  std::uint8_t header[kFileHeaderSize + kDibInfoHeaderSize] = {};
+  std::uint8_t* at = header;
+  *at++ = 'B';
+  *at++ = 'M';
+  Put32(at, static_cast<std::uint32_t>(fileSize));
+  Put32(at, 0);
+  Put32(at, kFileHeaderSize + kDibInfoHeaderSize);
+  Put32(at, kDibInfoHeaderSize);
+  Put32(at, static_cast<std::uint32_t>(picture.Width()));
+  Put32(at, static_cast<std::uint32_t>(picture.Height()));  // positive: bottom-up
+  Put16(at, 1);
+  Put16(at, 32);
+  Put32(at, 0);  // BI_RGB
+  Put32(at, static_cast<std::uint32_t>(bitsSize));
+  Put32(at, 3780);  // 96 dpi in pixels per metre
+  Put32(at, 3780);
+  Put32(at, 0);
+  Put32(at, 0);
+  sink.Write(header, sizeof header);
+  const std::size_t rowBytes = static_cast<std::size_t>(picture.Width()) * sizeof(Pixel);
+  for (int y = picture.Height(); y-- > 0;) sink.Write(picture.ScanLine(y), rowBytes);
+}
+
 }  // namespace codecs
 
 namespace {
@@ -232,6 +265,11 @@ void SaveJpeg(const TBitmap32& picture, const std::string& path, int quality) {
 void SaveBitmap24(const TBitmap32& picture, const std::string& path) {
   SaveAtomically(picture, path,
                  [&](codecs::ByteSink& sink) { codecs::EncodeBitmap24(picture, sink); });
+}
+
+void SaveBitmap32(const TBitmap32& picture, const std::string& path) {
+  SaveAtomically(picture, path,
+                 [&](codecs::ByteSink& sink) { codecs::EncodeBitmap32(picture, sink); });
 }
 
 void SaveMetafile(const TBitmap32& picture, const std::string& path) {

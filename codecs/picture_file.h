@@ -44,6 +44,7 @@ std::optional<TBitmap32> LoadPng(const std::string& path);
 // write leaves any existing file as it was. They throw PictureFileError.
 void SaveJpeg(const TBitmap32& picture, const std::string& path, int quality = 90);
 void SaveBitmap24(const TBitmap32& picture, const std::string& path);
+void SaveBitmap32(const TBitmap32& picture, const std::string& path);  // B, G, R, A as held
 void SaveMetafile(const TBitmap32& picture, const std::string& path);
 void SavePng(const TBitmap32& picture, const std::string& path);  // keeps the alpha byte
 

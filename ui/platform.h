@@ -8,6 +8,8 @@
 #include <cstdint>
 #include <optional>
 
+class QPrinter;
+
 namespace quillane {
 
 // A file chosen in the open or save dialog, with the filter the user had selected (1-based, in
@@ -45,6 +47,14 @@ class PlatformServices {
 
   // Shows folder in the desktop's file manager.
   virtual void OpenFolder(const QString& folder) = 0;
+
+  // The print dialog for printer: false when the user cancels; otherwise the chosen printer,
+  // page and resolution are set in printer.
+  virtual bool PrintDialog(QPrinter& printer) = 0;
+
+  // Opens a local file with the desktop's default program for its type; false when no program
+  // could be started.
+  virtual bool OpenWithDefaultProgram(const QString& path) = 0;
 };
 
 }  // namespace quillane

@@ -4,6 +4,7 @@
 
 #include <QString>
 #include <deque>
+#include <functional>
 #include <optional>
 #include <string>
 #include <vector>
@@ -32,11 +33,16 @@ class ScriptedPlatform : public PlatformServices {
   std::vector<FolderRequest> folderRequests;
   std::vector<std::uint32_t> colorRequests;
   std::vector<QString> openedFolders;
+  int printDialogs = 0;
+  std::vector<QString> openedFiles;
 
   std::deque<std::optional<FileChoice>> openAnswers;
   std::deque<std::optional<FileChoice>> saveAnswers;
   std::deque<std::optional<QString>> folderAnswers;
   std::deque<std::optional<std::uint32_t>> colorAnswers;
+  // Each sets up the printer as a user would in the dialog; an empty queue cancels.
+  std::deque<std::function<void(QPrinter&)>> printAnswers;
+  bool defaultProgramStarts = true;
 
   void ShowMessage(const QString& caption, const QString& text) override {
     messages.push_back({caption, text});
@@ -59,6 +65,18 @@ class ScriptedPlatform : public PlatformServices {
     return Next(colorAnswers);
   }
   void OpenFolder(const QString& folder) override { openedFolders.push_back(folder); }
+  bool PrintDialog(QPrinter& printer) override {
+    ++printDialogs;
+    if (printAnswers.empty()) return false;
+    const std::function<void(QPrinter&)> answer = std::move(printAnswers.front());
+    printAnswers.pop_front();
+    answer(printer);
+    return true;
+  }
+  bool OpenWithDefaultProgram(const QString& path) override {
+    openedFiles.push_back(path);
+    return defaultProgramStarts;
+  }
 
  private:
   template <typename T>

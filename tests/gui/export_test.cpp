@@ -1,0 +1,238 @@
+// Print, wallpaper, mail and Help. The desktop's programs are stand-in scripts put first on
+// PATH that record their arguments and answer as told; the print goes into a real PDF.
+#include <QAction>
+#include <QDir>
+#include <QLabel>
+#include <QPlainTextEdit>
+#include <QPrinter>
+#include <QProcess>
+#include <QStandardPaths>
+#include <QToolButton>
+
+#include "app/about_box.h"
+#include "app/export_rules.h"
+#include "codecs/picture_file.h"
+#include "tests/gui/temp_folder.h"
+
+namespace quillane {
+namespace {
+
+using Message = ScriptedPlatform::Message;
+
+TEST(ExportRules, PrintRectanglesDesktopsQuotingAndMail) {
+  const QRect cases[][2] = {
+      {{0, 0, 521, 346}, {396, 2123, 4168, 2768}},
+      {{0, 0, 3000, 4000}, {980, 1507, 3000, 4000}},   // already over half the height
+      {{0, 0, 6000, 8000}, {-520, -492, 6000, 8000}},  // cut by the page edges
+      {{0, 0, 0, 0}, {2480, 3507, 0, 0}},              // ends rather than doubling nothing for ever
+  };
+  for (const auto& [picture, expected] : cases)
+    EXPECT_EQ(PrintRectangle(picture.width(), picture.height(), 4960, 7015), expected);
+  EXPECT_EQ(DesktopFromXdg("ubuntu:GNOME"), Desktop::kGnome);
+  EXPECT_EQ(DesktopFromXdg("kde"), Desktop::kKde);
+  EXPECT_EQ(DesktopFromXdg("X-Cinnamon"), Desktop::kOther);
+  EXPECT_EQ(GVariantString("/a/it's\\b"), "'/a/it\\'s\\\\b'");
+  EXPECT_EQ(MailBody("https://example.org/q"),
+            "Hello!\r\n\r\nAttachment is my great work. It is made by Ardelon.\r\nThis is a good "
+            "software. The download link is folows:\r\nhttps://example.org/q\r\n\r\nPlease try "
+            "it. It would give you happiness!\r\nGood luck!");
+}
+
+class Export : public FileGuiTest {
+ protected:
+  void SetUp() override {
+    FileGuiTest::SetUp();
+    for (const char* name : {"PATH", "XDG_DATA_HOME", "XDG_CURRENT_DESKTOP"})
+      saved_.push_back({name, qgetenv(name)});
+    qputenv("PATH", (Path("bin") + ":" + qgetenv("PATH")).toLocal8Bit());
+    qputenv("XDG_DATA_HOME", Path("data").toLocal8Bit());
+  }
+  void TearDown() override {
+    for (const auto& [name, value] : saved_) qputenv(name, value);
+    FileGuiTest::TearDown();
+  }
+
+  // Records each call's arguments (each ended by NUL, each call by 036), prints output and
+  // error, ends with exitCode.
+  void StandIn(const QString& name, int exitCode = 0, const QString& output = "",
+               const QString& error = "") {
+    std::filesystem::create_directories(LocalPath("bin"));
+    WriteBytes(LocalPath("bin/" + name),
+               "#!/bin/sh\nprintf '%s\\0' \"$@\" >> \"$0.calls\"\nprintf '\\036' >> "
+               "\"$0.calls\"\nprintf '" +
+                   output.toStdString() + "'\nprintf '" + error.toStdString() + "' >&2\nexit " +
+                   std::to_string(exitCode) + "\n");
+    QFile(Path("bin/" + name)).setPermissions(QFile::ReadOwner | QFile::ExeOwner);
+  }
+  std::vector<QStringList> Calls(const QString& name) const {
+    const std::vector<std::uint8_t> bytes = ReadBytes(LocalPath("bin/" + name + ".calls"));
+    std::vector<QStringList> calls;
+    for (const QByteArray& call : QByteArray(reinterpret_cast<const char*>(bytes.data()),
+                                             static_cast<qsizetype>(bytes.size()))
+                                      .split('\036'))
+      if (!call.isEmpty()) calls.push_back(QString::fromLocal8Bit(call.chopped(1)).split(QChar(0)));
+    return calls;
+  }
+  static QString DataFile(const QString& name) {
+    return QDir(QStandardPaths::writableLocation(QStandardPaths::AppDataLocation)).filePath(name);
+  }
+  void Click(const char* name) { MainChild<QToolButton>(name)->click(); }
+
+  std::vector<std::pair<const char*, QByteArray>> saved_;
+};
+
+// The box of the dark pixels of a PDF's page rendered at dpi.
+QRect DarkBox(const QString& pdf, int dpi, const QString& folder) {
+  QProcess::execute("pdftoppm",
+                    {"-r", QString::number(dpi), "-gray", "-singlefile", pdf, folder + "/page"});
+  QFile file(folder + "/page.pgm");
+  if (!file.open(QIODevice::ReadOnly) || file.readLine() != "P5\n") return {};
+  const QList<QByteArray> size = file.readLine().trimmed().split(' ');
+  file.readLine();
+  const QByteArray pixels = file.readAll();
+  const int w = size.value(0).toInt(), h = size.value(1).toInt();
+  QRect box;
+  for (int y = 0; y < h && pixels.size() == qsizetype{w} * h; ++y)
+    for (int x = 0; x < w; ++x)
+      if (static_cast<unsigned char>(pixels[y * w + x]) < 128) box |= QRect(x, y, 1, 1);
+  return box;
+}
+
+TEST_F(Export, PrintPlacesTheDoubledPictureCentredOnOnePage) {
+  if (QStandardPaths::findExecutable("pdftoppm").isEmpty())
+    GTEST_SKIP() << "pdftoppm (poppler-utils) is needed to read the page back";
+  Main().SetWorkingPicture(TBitmap32(521, 346, Pixel{40, 40, 40, 255}), false);
+  // The 4960 x 7015 dot page of the example. The PDF writer keeps page sizes in whole points,
+  // so it is 992 x 1403 points at 360 dots per inch rather than A4 at 600.
+  auto pdfIn = [](QString path) {
+    return [path](QPrinter& printer) {
+      printer.setOutputFormat(QPrinter::PdfFormat);
+      printer.setOutputFileName(path);
+      printer.setResolution(360);
+      printer.setPageSize(QPageSize(QSize(992, 1403), "", QPageSize::ExactMatch));
+      printer.setFullPage(true);
+    };
+  };
+  platform_.printAnswers = {pdfIn(Path("page.pdf")), pdfIn(Path("missing/page.pdf"))};
+  Click("SpeedButton10");
+  ASSERT_TRUE(platform_.messages.empty() && platform_.errors.empty());
+  const QRect box = DarkBox(Path("page.pdf"), 360, folder_.path());
+  EXPECT_EQ(box.topLeft(), QPoint(396, 2123));
+  // The renderer may cover the last partly touched row and column.
+  EXPECT_NEAR(box.width(), 4168, 1);
+  EXPECT_NEAR(box.height(), 2768, 1);
+
+  // A printer that cannot start the job; a cancelled dialog; an empty picture, refused first.
+  Click("SpeedButton10");
+  EXPECT_EQ(platform_.errors, std::vector<QString>{"The printer could not start the print job"});
+  Click("SpeedButton10");
+  Main().SetWorkingPicture(TBitmap32(), false);
+  Click("SpeedButton10");
+  EXPECT_EQ(platform_.printDialogs, 3);
+  EXPECT_EQ(platform_.messages, (std::vector<Message>{{"Sorry", "There is no picture to print"}}));
+}
+
+TEST_F(Export, ASecondWallpaperNamesANewFileSoTheDesktopReallyChanges) {
+  qputenv("XDG_CURRENT_DESKTOP", "ubuntu:GNOME");
+  StandIn("gsettings");
+  const TBitmap32 first(30, 20, Pixel{1, 2, 3, 255}), second(20, 30, Pixel{9, 8, 7, 255});
+  Main().SetWorkingPicture(first, false);
+  Click("SpeedButton9");
+  Main().SetWorkingPicture(second, false);
+  Click("SpeedButton9");
+
+  const std::vector<QStringList> calls = Calls("gsettings");
+  ASSERT_EQ(calls.size(), 4u);
+  std::vector<QString> files;
+  for (int i = 0; i < 4; ++i) {
+    const char* key = i % 2 ? "picture-uri-dark" : "picture-uri";
+    EXPECT_EQ(calls[i].mid(0, 3), QStringList({"set", "org.gnome.desktop.background", key}));
+    files.push_back(QUrl(calls[i].value(3).mid(1).chopped(1)).toLocalFile());  // in quotes
+  }
+  EXPECT_TRUE(files[0] == files[1] && files[2] == files[3] && files[0] != files[2]);
+  EXPECT_FALSE(QFile::exists(files[0]));  // the first name is gone once the second is set
+  EXPECT_EQ(LoadPictureFile(files[2].toStdString()), second);
+  EXPECT_EQ(platform_.messages, std::vector<Message>(2, {"ok!", "Set as wallpaper successful!"}));
+}
+
+TEST_F(Export, EachDesktopIsToldInItsOwnWayAndAFailureSaysWhyAndWhere) {
+  struct Case {
+    const char *desktop, *program;
+    int exitCode, calls;
+    QString output, error, reason;
+  } const cases[] = {
+      {"KDE", "plasma-apply-wallpaperimage", 0, 1},
+      {"XFCE", "xfconf-query", 0, 3,
+       "/backdrop/screen0/monitor0/workspace0/last-image\\n/a/b\\n"
+       "/backdrop/screen0/monitorHDMI-1/workspace1/last-image\\n"},
+      {"", "gdbus", 1, 1, "", "Error: no portal",
+       "the desktop portal did not take it: gdbus ended with code 1 (Error: no portal)"},
+  };
+  for (const Case& c : cases) {
+    SCOPED_TRACE(c.program);
+    std::filesystem::remove_all(LocalPath("bin"));
+    qputenv("XDG_CURRENT_DESKTOP", c.desktop);
+    StandIn(c.program, c.exitCode, c.output, c.error);
+    platform_.messages.clear();
+    Click("SpeedButton9");
+    EXPECT_EQ(Calls(c.program).size(), std::size_t(c.calls));
+    const QString file = DataFile("wallpaper.bmp");
+    EXPECT_EQ(LoadPictureFile(file.toStdString()), Main().Document().Working());
+    const Message expected = c.reason.isEmpty()
+                                 ? Message{"ok!", "Set as wallpaper successful!"}
+                                 : Message{"Sorry", "The wallpaper could not be set: " + c.reason +
+                                                        ".\nThe picture was saved as " + file};
+    EXPECT_EQ(platform_.messages, std::vector<Message>{expected});
+    // Only the name a desktop took last stays; one refused is not left behind.
+    EXPECT_EQ(QDir(DataFile("")).entryList({"wallpaper-*"}, QDir::Files).size(), 1);
+  }
+}
+
+TEST_F(Export, MailHandsThePictureToTheMailProgramOrSaysWhereItIs) {
+  StandIn("xdg-email");
+  Click("SpeedButton11");
+  const QString attachment = DataFile("mywork.jpg");
+  EXPECT_EQ(Calls("xdg-email"), std::vector<QStringList>({{"--subject", kMailSubject, "--body",
+                                                           MailBody("Quillane " QUILLANE_VERSION),
+                                                           "--attach", attachment}}));
+  EXPECT_EQ(LoadPictureFile(attachment.toStdString())->Width(), 24);
+  EXPECT_TRUE(platform_.messages.empty());
+
+  StandIn("xdg-email", 3, "", "xdg-email: no method available for opening mailto:");
+  Click("SpeedButton11");
+  qputenv("PATH", Path("nowhere").toLocal8Bit());
+  Click("SpeedButton11");
+  const QString start = "No mail program could be started: xdg-email ";
+  const QString where = ".\nThe picture was saved as " + attachment;
+  EXPECT_EQ(platform_.messages,
+            (std::vector<Message>{{"Sorry", start +
+                                                "ended with code 3 (xdg-email: no method "
+                                                "available for opening mailto:)" +
+                                                where},
+                                  {"Sorry", start + "was not found" + where}}));
+}
+
+TEST_F(Export, HelpOpensTheReadmeAndShowsTheAboutBox) {
+  MenuAction("Online1")->trigger();
+  platform_.defaultProgramStarts = false;
+  MenuAction("Online1")->trigger();
+  const QString readme = QDir::cleanPath(QUILLANE_SOURCE_DIR "/README.md");
+  EXPECT_EQ(platform_.openedFiles, std::vector<QString>(2, readme));
+  EXPECT_EQ(platform_.messages,
+            (std::vector<Message>{{"Sorry", "No program could be started to show " + readme}}));
+
+  QPixmap icon(32, 32);
+  icon.fill(Qt::red);
+  QApplication::setWindowIcon(QIcon(icon));
+  MenuAction("About1")->trigger();
+  auto* about = Main().findChild<TAboutus*>("TAboutus");
+  ASSERT_NE(about, nullptr);
+  EXPECT_TRUE(about->isVisible() && !about->isModal());
+  EXPECT_TRUE(about->findChild<QPlainTextEdit*>("Memo1")->toPlainText().startsWith(
+      "Name: Quillane\n\nVersion: " QUILLANE_VERSION "\n\nRelease time: 08/27/2007\n"));
+  EXPECT_FALSE(about->findChild<QLabel*>("Image1")->pixmap().isNull());
+  QApplication::setWindowIcon(QIcon());
+}
+
+}  // namespace
+}  // namespace quillane
