@@ -26,15 +26,20 @@ inline QApplication& Application() {
   return app;
 }
 
-// A left click on a control that reacts to the mouse itself (colour panels, thumbnails, tiles).
-inline void ClickOn(QWidget* control) {
-  // One device of the tests' own for the whole program: the toolkit's default one outlives the
-  // application object, and a second static one crashes when the program exits.
+// One device of the tests' own for every synthesized mouse event of the program: the
+// toolkit's default one outlives the application object, and a second static one crashes when
+// the program exits.
+inline const QPointingDevice& TestMouse() {
   static const QPointingDevice mouse("test mouse", 1, QInputDevice::DeviceType::Mouse,
                                      QPointingDevice::PointerType::Generic,
                                      QInputDevice::Capability::Position, 1, 3);
+  return mouse;
+}
+
+// A left click on a control that reacts to the mouse itself (colour panels, thumbnails, tiles).
+inline void ClickOn(QWidget* control) {
   QMouseEvent release(QEvent::MouseButtonRelease, QPointF(4, 4), QPointF(4, 4), QPointF(4, 4),
-                      Qt::LeftButton, Qt::NoButton, Qt::NoModifier, &mouse);
+                      Qt::LeftButton, Qt::NoButton, Qt::NoModifier, &TestMouse());
   QCoreApplication::sendEvent(control, &release);
 }
 
