@@ -4,6 +4,7 @@
 #include <QMenu>
 #include <QScrollArea>
 #include <QScrollBar>
+#include <QTest>
 #include <QToolButton>
 #include <QWheelEvent>
 
@@ -177,6 +178,27 @@ TEST_F(View, RotationTurnsBothPicturesAndResetsTheHistory) {
   EXPECT_EQ(Main().Document().Working(), TBitmap32(2, 1, Pixel{1, 1, 1, 255}));
   ASSERT_EQ(platform_.messages.size(), 1u);
   EXPECT_EQ(platform_.messages[0].caption, "Sorry");
+}
+
+TEST_F(View, TheViewMenuZoomsFromTheKeyboard) {
+  QStringList menus;
+  for (QAction* a : Main().menuBar()->actions()) menus << a->text();
+  EXPECT_EQ(menus, QStringList({" File", " Edit", " View", " B&&W", " Color", " ColorAdjust",
+                                " Veins", " Help"}));
+  Main().activateWindow();
+  ASSERT_TRUE(QTest::qWaitForWindowActive(&Main()));
+  struct Key {
+    QKeyCombination key;
+    const char* label;
+  };
+  const Key keys[] = {{Qt::CTRL | Qt::Key_Plus, "125.0%"},
+                      {Qt::CTRL | Qt::Key_Equal, "156.3%"},
+                      {Qt::CTRL | Qt::Key_Minus, "125.0%"},
+                      {Qt::CTRL | Qt::Key_0, "100.0%"}};
+  for (const Key& k : keys) {
+    QTest::keyClick(Image1(), k.key.key(), k.key.keyboardModifiers());
+    EXPECT_EQ(ZoomLabel(), k.label);
+  }
 }
 
 }  // namespace
