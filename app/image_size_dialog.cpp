@@ -193,6 +193,9 @@ void TImage_size::Button1Click() {
   ResizeResult result = ResizeResult::TooSmall;
   try {
     result = resize_(w, h);
+  } catch (const NotEnoughMemory& e) {
+    platform_.ShowError(QString::fromStdString(e.what()));
+    return;
   } catch (const std::bad_alloc&) {
     platform_.ShowError(QStringLiteral("A picture of %1 by %2 pixels ").arg(w).arg(h) +
                         QString::fromStdString(MemoryNeedText(OperationBytes(w, h))));

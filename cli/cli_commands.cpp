@@ -172,6 +172,9 @@ int PictureCommand(const Options& o, std::ostream& out, std::ostream& err) {
     if (o.output != "-")
       out << ShownName(o.output) << ": " << document.Working().Width() << " by "
           << document.Working().Height() << " pixels\n";
+  } catch (const NotEnoughMemory& e) {
+    err << "quillane-cli: " << verb << ": " << ShownName(e.what()) << "\n";
+    return kExitFailed;
   } catch (const std::bad_alloc&) {
     err << "quillane-cli: " << verb << ": " << ShownName(name) << " "
         << MemoryNeedText(OperationBytes(width, height)) << "\n";

@@ -3,6 +3,7 @@
 #include <optional>
 #include <utility>
 
+#include "imaging/memory_budget.h"
 #include "imaging/numeric.h"
 
 namespace quillane {
@@ -43,6 +44,8 @@ ResizeResult ResizeDocument(PictureDocument& document, int w, int h) {
     if (newW > TBitmap32::kMaxPixels / newH) result = ResizeResult::TooLarge;
   }
   if (result != ResizeResult::Resized) return result;
+  CheckMemoryFor(ResampledSide(working.Width(), f.width), ResampledSide(working.Height(), f.height),
+                 "The resized picture");
 
   TBitmap32 newWorking = working;
   ZoomInandOut(newWorking, f.height, f.width);

@@ -36,7 +36,8 @@ enum class ResizeResult {
 // Resamples the working and then the source picture with ZoomInandOut by the factors for w by h
 // taken from the working picture's size (the source picture may differ in size), then takes the
 // history step. Anything but Resized leaves the document unchanged; so does a failed
-// allocation, which passes on.
+// allocation, which passes on: NotEnoughMemory, with a sentence for the user, when the new
+// size will not fit in the memory left.
 ResizeResult ResizeDocument(PictureDocument& document, int w, int h);
 
 }  // namespace quillane

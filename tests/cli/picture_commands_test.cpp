@@ -45,9 +45,9 @@ class PictureCommands : public ::testing::Test {
 
   // Runs quillane-cli with arguments, names in the test's folder; its exit code, with err_
   // holding what it printed there.
-  int Run(const std::string& arguments) {
-    const std::string command = "cd '" + dir_ + "' && '" + QUILLANE_CLI_PATH + "' " + arguments +
-                                " >stdout.txt 2>stderr.txt";
+  int Run(const std::string& arguments, const std::string& shellPrefix = "") {
+    const std::string command = shellPrefix + "cd '" + dir_ + "' && '" + QUILLANE_CLI_PATH + "' " +
+                                arguments + " >stdout.txt 2>stderr.txt";
     const int status = std::system(command.c_str());
     err_ = ReadText(Path("stderr.txt"));
     return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
@@ -112,6 +112,16 @@ TEST_F(PictureCommands, RefusalsSayWhyAndLeaveTheOutputAlone) {
     EXPECT_NE(err_.find(c.message), std::string::npos) << c.arguments << ": " << err_;
     EXPECT_EQ(ReadText(Path("out.png")), "kept") << c.arguments;
   }
+}
+
+TEST_F(PictureCommands, AResizeBeyondTheMemoryLeftIsRefusedBeforeAllocating) {
+#if defined(__SANITIZE_ADDRESS__)
+  GTEST_SKIP() << "no address-space limit under ASan";
+#endif
+  EXPECT_EQ(Run("resize 16000 16000 in.bmp -o big.png", "ulimit -v 3000000 && "), 1);
+  EXPECT_NE(err_.find("The resized picture of 15999 by 16000 pixels needs"), std::string::npos)
+      << err_;
+  EXPECT_FALSE(fs::exists(Path("big.png")));
 }
 
 }  // namespace
