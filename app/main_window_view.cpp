@@ -161,6 +161,7 @@ bool TMyPicture::eventFilter(QObject* watched, QEvent* event) {
       if (WheelZoom(watched, static_cast<QWheelEvent*>(event))) return true;
       break;
     case QEvent::MouseButtonPress:
+    case QEvent::MouseButtonDblClick:  // the second press of a double click
       if (watched == image1_) Image1MouseDown(static_cast<QMouseEvent*>(event));
       break;
     case QEvent::MouseMove:
