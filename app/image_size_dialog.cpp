@@ -8,6 +8,7 @@
 #include <QLineEdit>
 #include <QLocale>
 #include <QPushButton>
+#include <QShowEvent>
 #include <QToolButton>
 #include <QVBoxLayout>
 #include <cmath>
@@ -131,10 +132,14 @@ TImage_size::TImage_size(PlatformServices& platform, std::function<QSize()> pict
 }
 
 void TImage_size::showEvent(QShowEvent* event) {
-  const QSize size = pictureSize_();
-  edit1_->setText(QString::number(size.width()));
-  edit2_->setText(QString::number(size.height()));
-  edited1_ = edited2_ = false;
+  // Shown by the program, not shown again by the desktop (another workspace and back), which
+  // must not wipe what was typed.
+  if (!event->spontaneous()) {
+    const QSize size = pictureSize_();
+    edit1_->setText(QString::number(size.width()));
+    edit2_->setText(QString::number(size.height()));
+    edited1_ = edited2_ = false;
+  }
   QDialog::showEvent(event);
 }
 
