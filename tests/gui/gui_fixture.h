@@ -22,6 +22,10 @@ inline QApplication& Application() {
   static int argc = 1;
   static char name[] = "gui_tests";
   static char* argv[] = {name, nullptr};
+  // The toolkit's list of input devices, made before the application object so that it is
+  // gone only after it: the default keyboard and mouse that key clicks and menus create belong
+  // to the application and take themselves off that list when it is destroyed at exit.
+  QInputDevice::devices();
   static QApplication app(argc, argv);
   return app;
 }
