@@ -105,6 +105,7 @@ TMyPicture::TMyPicture(PlatformServices& platform, TBitmap32 picture)
       platform_, [this] { return outputFolder_; }, this);
   batchConvertOk_->hide();
   ConnectExportCommands();
+  BuildViewControls();
 
   ShowWorking(zoomPercent_);
   UpdateHistoryControls();
@@ -255,9 +256,8 @@ void TMyPicture::BuildView(QWidget* central) {
   image1_ = new PictureView;
   image1_->setObjectName("Image1");
   image1_->setToolTip("scroll the mouse-wheel to zoom out or zoom in");
-  image1_->setContextMenuPolicy(Qt::CustomContextMenu);
-  connect(image1_, &QWidget::customContextMenuRequested, this,
-          [this](const QPoint& pos) { popupMenu_->popup(image1_->mapToGlobal(pos)); });
+  // The context menu opens on the release of a right click that did not pan the view.
+  image1_->setContextMenuPolicy(Qt::PreventContextMenu);
   scrollBox_->setWidget(image1_);
 }
 

@@ -6,6 +6,7 @@
 #pragma once
 
 #include <QMainWindow>
+#include <QPoint>
 #include <QRect>
 #include <QString>
 #include <QStringList>
@@ -14,6 +15,7 @@
 
 #include "document/document.h"
 #include "effects/registry.h"
+#include "imaging/rotate.h"
 #include "ui/tool_host.h"
 
 class QAction;
@@ -23,6 +25,8 @@ class QScrollArea;
 class QToolButton;
 class QFrame;
 class QListWidget;
+class QMouseEvent;
+class QWheelEvent;
 
 namespace quillane {
 
@@ -30,6 +34,7 @@ class PictureView;
 class PlatformServices;
 class TAboutus;
 class TBatchConvertOk;
+class TImage_size;
 class ToolWindow;
 struct BatchResult;
 
@@ -68,8 +73,20 @@ class TMyPicture : public QMainWindow, public ToolHost {
   double ZoomPercent() const { return zoomPercent_; }
   // The number the zoom label shows (its caption without the "%").
   double ZoomFromLabel() const;
-  // Size of Image1 for the working picture at zoom: Round(w * zoom / 100) by Round(h * ...).
+  // Size of Image1 for the working picture at zoom: Round(w * zoom / 100) by Round(h * ...),
+  // each side kept within 1 and QWIDGETSIZE_MAX.
   void SetDisplaySize(double zoom);
+  // One zoom step (times 1.25 or 0.8): the label and the display size follow. A step is not
+  // taken when it would make a side of the display larger than QWIDGETSIZE_MAX (zooming in) or
+  // smaller than one pixel (zooming out).
+  void imgzoomin();
+  void imgzoomout();
+  // Back to 100 %.
+  void ZoomToActualSize();
+  // The zoom label's text for zoom: one decimal in the user's locale, then "%".
+  static QString ZoomLabelText(double zoom);
+  // The image size dialog, created hidden with the main window.
+  TImage_size& ImageSize() { return *imageSize_; }
 
   // --- Tool windows -------------------------------------------------------------------------
 
@@ -128,6 +145,11 @@ class TMyPicture : public QMainWindow, public ToolHost {
   void Online1Click();        // the program's documentation
   void About1Click();
   void Exit1Click();
+  void SpeedButton5Click();   // zoom out
+  void SpeedButton6Click();   // zoom in
+  void SpeedButton12Click();  // rotate clockwise
+  void SpeedButton8Click();   // rotate anticlockwise
+  void Imagesize1Click();     // show the image size dialog
 
  signals:
   // The main window has closed: the program ends.
@@ -136,6 +158,8 @@ class TMyPicture : public QMainWindow, public ToolHost {
  protected:
   void resizeEvent(QResizeEvent* event) override;
   void closeEvent(QCloseEvent* event) override;
+  // Installed on the application: the mouse wheel over the picture, and the mouse on Image1.
+  bool eventFilter(QObject* watched, QEvent* event) override;
 
  private:
   void BuildMenus();
@@ -151,6 +175,14 @@ class TMyPicture : public QMainWindow, public ToolHost {
   void UpdateHistoryControls();
   // Print, wallpaper, mail and Help: connected, and the About box created hidden.
   void ConnectExportCommands();
+  // The zoom buttons, rotation, panning, the wheel, the View menu and the image size dialog.
+  void BuildViewControls();
+  void SetZoom(double zoom);
+  bool WheelZoom(QObject* watched, QWheelEvent* event);
+  void Image1MouseDown(QMouseEvent* event);
+  void Image1MouseMove(QMouseEvent* event);
+  void Image1MouseUp(QMouseEvent* event);
+  void Rotate(QuarterTurn turn);
 
   PlatformServices& platform_;
   PictureDocument document_;
@@ -178,6 +210,17 @@ class TMyPicture : public QMainWindow, public ToolHost {
   QListWidget* listView1_ = nullptr;
   TBatchConvertOk* batchConvertOk_ = nullptr;
   TAboutus* aboutBox_ = nullptr;
+  TImage_size* imageSize_ = nullptr;
+
+  // Panning with the right mouse button, from a press on Image1 to its release.
+  struct Panning {
+    bool dragging = false;
+    bool unmoved = true;
+    QPoint press;  // in Image1's coordinates
+    int horizontal = 0;
+    int vertical = 0;
+  } panning_;
+  int ctrlWheelRest_ = 0;  // Ctrl+wheel turn not yet a whole notch
 };
 
 }  // namespace quillane

@@ -1,13 +1,91 @@
-// The view of the working picture: its display size at a zoom, the zoom label, and the
-// thumbnail fitting the tool windows use.
+// The view of the working picture: its display size at a zoom, the zoom steps from the
+// buttons, the keyboard and the mouse wheel, panning with the right mouse button, the quarter
+// turns, the image size dialog, and the thumbnail fitting the tool windows use.
+#include <QAction>
+#include <QApplication>
+#include <QKeySequence>
 #include <QLabel>
 #include <QLocale>
+#include <QMenu>
+#include <QMenuBar>
+#include <QMouseEvent>
+#include <QScrollArea>
+#include <QScrollBar>
+#include <QToolButton>
+#include <QWheelEvent>
+#include <cmath>
+#include <exception>
+#include <new>
 
+#include "app/image_size_dialog.h"
 #include "app/main_window.h"
+#include "document/reshape.h"
+#include "imaging/memory_budget.h"
 #include "imaging/numeric.h"
 #include "ui/picture_view.h"
+#include "ui/platform.h"
 
 namespace quillane {
+namespace {
+
+constexpr Extended kZoomInFactor = 1.25L;
+constexpr Extended kZoomOutFactor = 0.8L;
+constexpr int kWheelNotch = 120;  // one notch of an ordinary mouse wheel, in eighths of a degree
+
+// Round(side * zoom / 100), as a 64-bit count so that no zoom overflows it.
+std::int64_t DisplaySide(int side, double zoom) {
+  const Extended v = static_cast<Extended>(side) * static_cast<Extended>(zoom) / 100;
+  if (!(v < 1e18L)) return INT64_MAX;
+  return static_cast<std::int64_t>(std::nearbyintl(v));
+}
+
+}  // namespace
+
+void TMyPicture::BuildViewControls() {
+  auto button = [this](const char* name) { return findChild<QToolButton*>(name); };
+  connect(button("SpeedButton5"), &QToolButton::clicked, this, &TMyPicture::SpeedButton5Click);
+  connect(button("SpeedButton6"), &QToolButton::clicked, this, &TMyPicture::SpeedButton6Click);
+  connect(button("SpeedButton12"), &QToolButton::clicked, this, &TMyPicture::SpeedButton12Click);
+  connect(button("SpeedButton8"), &QToolButton::clicked, this, &TMyPicture::SpeedButton8Click);
+  connect(button("SpeedButton4"), &QToolButton::clicked, this, &TMyPicture::Imagesize1Click);
+  for (const char* name : {"Imagesize1", "Imagesize2"})
+    connect(findChild<QAction*>(name), &QAction::triggered, this, &TMyPicture::Imagesize1Click);
+
+  // The zoom where a desktop user looks for it, with the usual keys.
+  auto* view = new QMenu(" View", menuBar());
+  view->setObjectName("View1");
+  const QList<QAction*> menus = menuBar()->actions();
+  menuBar()->insertMenu(menus.size() > 2 ? menus[2] : nullptr, view);
+  auto addEntry = [view](const QString& caption, const char* name,
+                         const QList<QKeySequence>& keys) {
+    QAction* action = view->addAction(caption);
+    action->setObjectName(name);
+    action->setShortcuts(keys);
+    return action;
+  };
+  connect(addEntry("Zoom in", "ZoomIn1",
+                   {QKeySequence::ZoomIn, QKeySequence(Qt::CTRL | Qt::Key_Equal)}),
+          &QAction::triggered, this, &TMyPicture::imgzoomin);
+  connect(addEntry("Zoom out", "ZoomOut1", {QKeySequence::ZoomOut}), &QAction::triggered, this,
+          &TMyPicture::imgzoomout);
+  connect(addEntry("Actual size", "ActualSize1", {QKeySequence(Qt::CTRL | Qt::Key_0)}),
+          &QAction::triggered, this, &TMyPicture::ZoomToActualSize);
+
+  imageSize_ = new TImage_size(
+      platform_,
+      [this] { return QSize(document_.Working().Width(), document_.Working().Height()); },
+      [this](int w, int h) {
+        const ResizeResult result = ResizeDocument(document_, w, h);
+        if (result == ResizeResult::Resized) ShowWorkingChanged();
+        return result;
+      },
+      this);
+  imageSize_->hide();
+
+  qApp->installEventFilter(this);
+}
+
+// --- Zoom ----------------------------------------------------------------------------------
 
 void TMyPicture::ShowWorking(double zoom) {
   image1_->SetPicture(document_.Working());
@@ -16,8 +94,18 @@ void TMyPicture::ShowWorking(double zoom) {
 
 void TMyPicture::SetDisplaySize(double zoom) {
   const TBitmap32& picture = document_.Working();
-  const Extended z = zoom;
-  image1_->resize(Round(picture.Width() * z / 100), Round(picture.Height() * z / 100));
+  // A picture opened or resized at a zoom meant for another one may come out of range: it is
+  // shown at least one pixel and at most the largest widget in each direction.
+  const auto side = [zoom](int s) {
+    return static_cast<int>(std::clamp<std::int64_t>(DisplaySide(s, zoom), 1, QWIDGETSIZE_MAX));
+  };
+  image1_->resize(side(picture.Width()), side(picture.Height()));
+}
+
+QString TMyPicture::ZoomLabelText(double zoom) {
+  QLocale locale;
+  locale.setNumberOptions(QLocale::OmitGroupSeparator);
+  return locale.toString(zoom, 'f', 1) + "%";
 }
 
 double TMyPicture::ZoomFromLabel() const {
@@ -31,6 +119,156 @@ double TMyPicture::ZoomFromLabel() const {
   const double c = QLocale::c().toDouble(number, &ok);
   return ok ? c : zoomPercent_;
 }
+
+void TMyPicture::SetZoom(double zoom) {
+  zoomPercent_ = zoom;
+  zoomLabel_->setText(ZoomLabelText(zoom));
+  SetDisplaySize(zoom);
+}
+
+void TMyPicture::imgzoomin() {
+  const double zoom = static_cast<double>(zoomPercent_ * kZoomInFactor);
+  const TBitmap32& p = document_.Working();
+  if (std::max(DisplaySide(p.Width(), zoom), DisplaySide(p.Height(), zoom)) > QWIDGETSIZE_MAX)
+    return;
+  SetZoom(zoom);
+}
+
+void TMyPicture::imgzoomout() {
+  const double zoom = static_cast<double>(zoomPercent_ * kZoomOutFactor);
+  const TBitmap32& p = document_.Working();
+  if (std::min(DisplaySide(p.Width(), zoom), DisplaySide(p.Height(), zoom)) < 1) return;
+  SetZoom(zoom);
+}
+
+void TMyPicture::ZoomToActualSize() {
+  SetZoom(100.0);
+}
+
+void TMyPicture::SpeedButton5Click() {
+  imgzoomout();
+}
+
+void TMyPicture::SpeedButton6Click() {
+  imgzoomin();
+}
+
+// --- The application-wide filter -----------------------------------------------------------
+
+bool TMyPicture::eventFilter(QObject* watched, QEvent* event) {
+  switch (event->type()) {
+    case QEvent::Wheel:
+      if (WheelZoom(watched, static_cast<QWheelEvent*>(event))) return true;
+      break;
+    case QEvent::MouseButtonPress:
+    case QEvent::MouseButtonDblClick:  // the second press of a double click
+      if (watched == image1_) Image1MouseDown(static_cast<QMouseEvent*>(event));
+      break;
+    case QEvent::MouseMove:
+      if (watched == image1_) Image1MouseMove(static_cast<QMouseEvent*>(event));
+      break;
+    case QEvent::MouseButtonRelease:
+      if (watched == image1_) Image1MouseUp(static_cast<QMouseEvent*>(event));
+      break;
+    default:
+      break;
+  }
+  return QMainWindow::eventFilter(watched, event);
+}
+
+bool TMyPicture::WheelZoom(QObject* watched, QWheelEvent* event) {
+  auto* widget = qobject_cast<QWidget*>(watched);
+  if (widget == nullptr || widget->window() != this) return false;
+  const int turn = event->angleDelta().y();
+  if (event->modifiers() & Qt::ControlModifier) {
+    // Ctrl+wheel anywhere in the window zooms as elsewhere on the desktop: turning the wheel
+    // away from the user zooms in, one step per notch however finely the wheel reports.
+    if ((turn > 0) != (ctrlWheelRest_ > 0)) ctrlWheelRest_ = 0;
+    ctrlWheelRest_ += turn;
+    for (; ctrlWheelRest_ >= kWheelNotch; ctrlWheelRest_ -= kWheelNotch) imgzoomin();
+    for (; ctrlWheelRest_ <= -kWheelNotch; ctrlWheelRest_ += kWheelNotch) imgzoomout();
+    return true;
+  }
+  // Over the picture or its scroll box, every wheel message is one step: towards the user in,
+  // away from the user out; the scroll box does not scroll.
+  if (turn == 0 || !(widget == scrollBox_ || scrollBox_->isAncestorOf(widget))) return false;
+  if (turn < 0)
+    imgzoomin();
+  else
+    imgzoomout();
+  return true;
+}
+
+// --- Panning -------------------------------------------------------------------------------
+
+void TMyPicture::Image1MouseDown(QMouseEvent* event) {
+  panning_ =
+      Panning{true, true, event->position().toPoint(), scrollBox_->horizontalScrollBar()->value(),
+              scrollBox_->verticalScrollBar()->value()};
+  if (event->button() == Qt::RightButton) image1_->setCursor(Qt::ClosedHandCursor);
+}
+
+void TMyPicture::Image1MouseMove(QMouseEvent* event) {
+  if (!(event->buttons() & Qt::RightButton) || !panning_.dragging) return;
+  // The picture moves with the scroll, so the point under the mouse stays under it.
+  const QPoint moved = panning_.press - event->position().toPoint();
+  QScrollBar* h = scrollBox_->horizontalScrollBar();
+  QScrollBar* v = scrollBox_->verticalScrollBar();
+  h->setValue(h->value() + moved.x());
+  v->setValue(v->value() + moved.y());
+  if (h->value() != panning_.horizontal || v->value() != panning_.vertical)
+    panning_.unmoved = false;
+}
+
+void TMyPicture::Image1MouseUp(QMouseEvent* event) {
+  panning_.dragging = false;
+  image1_->unsetCursor();
+  if (event->button() == Qt::RightButton && panning_.unmoved)
+    popupMenu_->popup(event->globalPosition().toPoint());
+}
+
+// --- Rotation and image size ---------------------------------------------------------------
+
+void TMyPicture::Rotate(QuarterTurn turn) {
+  const TBitmap32& working = document_.Working();
+  const int width = working.Width(), height = working.Height();
+  bool turned = false;
+  try {
+    turned = RotateDocument(document_, turn);
+  } catch (const std::bad_alloc&) {
+    platform_.ShowError(
+        QStringLiteral("Turning the picture of %1 by %2 pixels ").arg(width).arg(height) +
+        QString::fromStdString(MemoryNeedText(OperationBytes(width, height))));
+    return;
+  } catch (const std::exception& e) {
+    platform_.ShowError(QString::fromStdString(e.what()));
+    return;
+  }
+  if (!turned) {
+    platform_.ShowMessage("Sorry", QStringLiteral("A picture of %1 by %2 pixels is too small to "
+                                                  "turn; it is left as it is.")
+                                       .arg(width)
+                                       .arg(height));
+    return;
+  }
+  ShowLoadedPicture(false);
+}
+
+void TMyPicture::SpeedButton12Click() {
+  Rotate(QuarterTurn::Clockwise);
+}
+
+void TMyPicture::SpeedButton8Click() {
+  Rotate(QuarterTurn::Anticlockwise);
+}
+
+void TMyPicture::Imagesize1Click() {
+  imageSize_->show();
+  imageSize_->raise();
+  imageSize_->activateWindow();
+}
+
+// --- Thumbnails ----------------------------------------------------------------------------
 
 QRect TMyPicture::DisplayImageGeometry(int pictureWidth, int pictureHeight) {
   if (pictureWidth < 1 || pictureHeight < 1) return QRect(2, 2, 0, 0);

@@ -70,6 +70,8 @@ class NoPlatform : public PlatformServices {
   std::optional<QString> BrowseFolder(const QString&, const QString&) override { return {}; }
   std::optional<std::uint32_t> ChooseColor(std::uint32_t) override { return {}; }
   void OpenFolder(const QString&) override {}
+  bool PrintDialog(QPrinter&) override { return false; }
+  bool OpenWithDefaultProgram(const QString&) override { return false; }
 };
 
 // One mouse move with the brush held down, delivered to the work area and painted.

@@ -29,6 +29,7 @@
 #include "effects/surface/stria.h"
 #include "effects/surface/texture.h"
 #include "imaging/edge_map.h"
+#include "imaging/rotate.h"
 #include "imaging/tone.h"
 
 namespace quillane {
@@ -283,6 +284,27 @@ QUILLANE_EFFECT_BENCH(BM_HslAdjust, HslAdjust(Photo(), 240, 130, 90));
 QUILLANE_EFFECT_BENCH(BM_Stria,
                       stria(Photo(), kWidth, kHeight, StriaDirection::Vertical, 1, 2, 128, 0));
 QUILLANE_EFFECT_BENCH(BM_Texture, texture(Photo(), TextureTile(4), 50));
+
+// A quarter turn, as the rotation buttons make it, and the nearest-pixel resample of the image
+// size dialog (400 / 521 of each side), against the fresh copy above.
+void BM_RotatePicture(benchmark::State& state) {
+  const auto turn = state.range(0) ? QuarterTurn::Clockwise : QuarterTurn::Anticlockwise;
+  for (auto _ : state)
+    benchmark::DoNotOptimize(
+        RotatePicture(Photo(), RotationCentre(kWidth), RotationCentre(kHeight), turn)->Data());
+  SetBytes(state);
+}
+BENCHMARK(BM_RotatePicture)
+    ->Arg(1)
+    ->Arg(0)
+    ->Unit(benchmark::kMillisecond)
+    ->MeasureProcessCPUTime()
+    ->UseRealTime();
+
+void BM_ZoomInandOut(benchmark::State& state) {
+  InPlace(state, Photo(), [](TBitmap32& b) { ZoomInandOut(b, 400.0L / 521, 400.0L / 521); });
+}
+BENCHMARK(BM_ZoomInandOut)->Unit(benchmark::kMillisecond)->MeasureProcessCPUTime()->UseRealTime();
 
 }  // namespace
 }  // namespace quillane

@@ -15,6 +15,7 @@
 #include "batch/batch_convert.h"
 #include "codecs/picture_file.h"
 #include "data/startup_picture.h"
+#include "document/reshape.h"
 #include "document/run_effect.h"
 #include "imaging/memory_budget.h"
 
@@ -124,6 +125,61 @@ int ApplyCommand(const Options& o, std::ostream& out, std::ostream& err) {
     return kExitFailed;
   }
   if (o.output != "-") out << ShownName(o.output) << "\n";
+  return kExitOk;
+}
+
+// rotate, resize and convert: the picture opened as the program opens it (alpha 255), turned or
+// resampled as the program does it, and written in the type the output names.
+int PictureCommand(const Options& o, std::ostream& out, std::ostream& err) {
+  std::optional<TBitmap32> picture = InputOrBuiltInPicture(o, err);
+  if (!picture) return kExitFailed;
+  const std::string name = o.input == "-" ? std::string("standard input") : o.input;
+  const int width = picture->Width(), height = picture->Height();
+  const std::string verb = o.command == Command::Rotate   ? "rotate"
+                           : o.command == Command::Resize ? "resize"
+                                                          : "convert";
+  try {
+    PictureDocument document(std::move(*picture));
+    if (o.command == Command::Rotate && !RotateDocument(document, o.turn)) {
+      err << "quillane-cli: rotate: " << ShownName(name) << " (" << width << " by " << height
+          << " pixels) is too small to turn\n";
+      return kExitFailed;
+    }
+    if (o.command == Command::Resize) {
+      const ResizeResult result = ResizeDocument(document, o.width, o.height);
+      if (result == ResizeResult::TooSmall) {
+        const SizeFactors f = ImageSizeFactors(o.width, o.height, width, height);
+        err << "quillane-cli: resize: " << o.width << " by " << o.height << " would make the "
+            << width << " by " << height << " picture " << ResampledSide(width, f.width) << " by "
+            << ResampledSide(height, f.height) << " pixels\n";
+        return kExitUsage;
+      }
+      if (result == ResizeResult::TooLarge) {
+        err << "quillane-cli: resize: " << o.width << " by " << o.height
+            << " pixels is larger than the " << TBitmap32::kMaxPixels
+            << " pixels a picture may have\n";
+        return kExitUsage;
+      }
+    }
+    try {
+      WriteOutput(document.Working(), o, out);
+    } catch (const std::exception& e) {
+      err << "quillane-cli: cannot write "
+          << (o.output == "-" ? std::string("to standard output") : ShownName(o.output)) << ": "
+          << ShownName(e.what()) << "\n";
+      return kExitFailed;
+    }
+    if (o.output != "-")
+      out << ShownName(o.output) << ": " << document.Working().Width() << " by "
+          << document.Working().Height() << " pixels\n";
+  } catch (const NotEnoughMemory& e) {
+    err << "quillane-cli: " << verb << ": " << ShownName(e.what()) << "\n";
+    return kExitFailed;
+  } catch (const std::bad_alloc&) {
+    err << "quillane-cli: " << verb << ": " << ShownName(name) << " "
+        << MemoryNeedText(OperationBytes(width, height)) << "\n";
+    return kExitFailed;
+  }
   return kExitOk;
 }
 
@@ -475,6 +531,10 @@ int RunCommand(const Options& options, std::ostream& out, std::ostream& err, boo
       return BatchCommand(options, out, err, terminal);
     case Command::Gallery:
       return GalleryCommand(options, out, err);
+    case Command::Rotate:
+    case Command::Resize:
+    case Command::Convert:
+      return PictureCommand(options, out, err);
   }
   return kExitUsage;
 }

@@ -84,6 +84,104 @@ std::string Selectors(const EffectSpec& effect, const std::string& name) {
   return selectors;
 }
 
+// The output of a command that writes one picture: "-" is standard output (PNG unless --format
+// says otherwise), a file's type is its extension. An empty result when it will do.
+std::string CheckOutputFile(const std::string& verb, Options& o) {
+  if (o.output == "-") {
+    if (o.format.empty()) o.format = "png";
+    return {};
+  }
+  if (!o.format.empty()) return "--format is for -o -; a file's type is its extension";
+  std::error_code ec;
+  if (std::filesystem::is_directory(o.output, ec))
+    return verb + ": " + o.output + " is a folder; name the file to write in it";
+  if (OutputTypeFor(o.output) == OutputType::Unknown)
+    return verb + ": cannot tell the output type of '" + o.output +
+           "'; end it in .jpg, .jpeg, .bmp, .wmf, .emf or .png";
+  return {};
+}
+
+// A side for resize: digits only, from 1 to the largest 32-bit integer.
+std::optional<int> SideValue(const std::string& text) {
+  int value = 0;
+  const char* end = text.data() + text.size();
+  if (text.empty() || text.find_first_not_of("0123456789") != std::string::npos) return {};
+  const auto read = std::from_chars(text.data(), end, value);
+  if (read.ec != std::errc() || read.ptr != end || value < 1) return {};
+  return value;
+}
+
+// "rotate cw|ccw INPUT", "resize WIDTH HEIGHT INPUT", "convert INPUT"; each with -o OUTPUT.
+ParseResult ParsePictureCommand(Command command, const std::vector<std::string>& args) {
+  const std::string& verb = args[0];
+  const std::string usage = command == Command::Rotate   ? "rotate cw|ccw INPUT -o OUTPUT"
+                            : command == Command::Resize ? "resize WIDTH HEIGHT INPUT -o OUTPUT"
+                                                         : "convert INPUT -o OUTPUT";
+  ParseResult result;
+  Options& o = result.options;
+  o.command = command;
+  std::vector<std::string> positional;
+  bool haveOutput = false;
+  bool optionsEnded = false;
+  ArgumentWalker walker(args, 1);
+  while (!walker.Done()) {
+    const std::string arg = optionsEnded ? walker.TakeRaw() : walker.Take();
+    if (!optionsEnded && arg == "--") {
+      optionsEnded = true;
+      continue;
+    }
+    if (optionsEnded || !IsOption(arg) || arg == "-") {
+      positional.push_back(arg);
+      continue;
+    }
+    const bool isOutput = arg == "-o" || arg == "--output";
+    if (!isOutput && arg != "--format")
+      return Fail("unknown option " + arg + " for " + verb + " (usage: quillane-cli " + usage +
+                  ")");
+    const std::optional<std::string> value = walker.TakeValue();
+    if (!value || value->empty())
+      return Fail(arg + " needs a " + (isOutput ? "file name" : "type: jpg, bmp, wmf or png"));
+    if (isOutput) {
+      if (haveOutput) return Fail(arg + " given twice");
+      o.output = *value;
+      haveOutput = true;
+    } else {
+      if (!o.format.empty()) return Fail("--format given twice");
+      o.format = AsciiLower(*value);
+      if (OutputTypeFor("x." + o.format) == OutputType::Unknown)
+        return Fail("--format must be jpg, jpeg, bmp, wmf, emf or png, not '" + *value + "'");
+    }
+  }
+
+  const std::size_t wanted = command == Command::Rotate ? 2 : command == Command::Resize ? 3 : 1;
+  if (positional.size() != wanted)
+    return Fail(verb + ": expected quillane-cli " + usage + ", got " +
+                std::to_string(positional.size()) +
+                (positional.size() == 1 ? " argument" : " arguments") + " besides the options");
+  if (command == Command::Rotate) {
+    if (positional[0] != "cw" && positional[0] != "ccw")
+      return Fail("rotate: the turn is cw (clockwise) or ccw (anticlockwise), not '" +
+                  positional[0] + "'");
+    o.turn = positional[0] == "cw" ? QuarterTurn::Clockwise : QuarterTurn::Anticlockwise;
+  }
+  if (command == Command::Resize) {
+    const std::optional<int> w = SideValue(positional[0]);
+    const std::optional<int> h = SideValue(positional[1]);
+    if (!w || !h)
+      return Fail(
+          "resize: WIDTH and HEIGHT are whole numbers of pixels from 1 to 2147483647, "
+          "not '" +
+          positional[w ? 1 : 0] + "'");
+    o.width = *w;
+    o.height = *h;
+  }
+  o.input = positional.back();
+  if (o.input.empty()) return Fail(verb + ": the input picture's name is empty");
+  if (!haveOutput) return Fail(verb + ": say where to write the result with -o OUTPUT");
+  if (std::string error = CheckOutputFile(verb, o); !error.empty()) return Fail(error);
+  return result;
+}
+
 // "apply", "batch": EFFECT first, then options and positional arguments.
 ParseResult ParseEffectCommand(Command command, const std::vector<std::string>& args) {
   const std::string& verb = args[0];
@@ -196,17 +294,7 @@ ParseResult ParseEffectCommand(Command command, const std::vector<std::string>& 
 
   if (command == Command::Apply) {
     if (!haveOutput) return Fail("apply: say where to write the result with -o OUTPUT");
-    if (o.output == "-") {
-      if (o.format.empty()) o.format = "png";
-    } else {
-      if (!o.format.empty()) return Fail("--format is for -o -; a file's type is its extension");
-      std::error_code ec;
-      if (std::filesystem::is_directory(o.output, ec))
-        return Fail("apply: " + o.output + " is a folder; name the file to write in it");
-      if (OutputTypeFor(o.output) == OutputType::Unknown)
-        return Fail("apply: cannot tell the output type of '" + o.output +
-                    "'; end it in .jpg, .jpeg, .bmp, .wmf, .emf or .png");
-    }
+    if (std::string error = CheckOutputFile(verb, o); !error.empty()) return Fail(error);
   } else {
     if (!haveInput) return Fail("batch: name the input folder with --input DIR");
     if (!haveOutput) return Fail("batch: name the output folder with --output DIR");
@@ -273,6 +361,9 @@ ParseResult ParseCommandLine(const std::vector<std::string>& args) {
   if (verb == "apply") return ParseEffectCommand(Command::Apply, args);
   if (verb == "batch") return ParseEffectCommand(Command::Batch, args);
   if (verb == "gallery") return ParseGallery(args);
+  if (verb == "rotate") return ParsePictureCommand(Command::Rotate, args);
+  if (verb == "resize") return ParsePictureCommand(Command::Resize, args);
+  if (verb == "convert") return ParsePictureCommand(Command::Convert, args);
   return Fail("unknown command '" + verb + "' (quillane-cli --help shows the usage)");
 }
 
@@ -286,6 +377,9 @@ std::string UsageText() {
   quillane-cli apply EFFECT [--PARAM VALUE ...] [--seed N] [INPUT] -o OUTPUT [--format TYPE]
   quillane-cli batch EFFECT [--PARAM VALUE ...] [--seed N] --input DIR --output DIR
   quillane-cli gallery DIR [--input FILE]
+  quillane-cli rotate cw|ccw INPUT -o OUTPUT
+  quillane-cli resize WIDTH HEIGHT INPUT -o OUTPUT
+  quillane-cli convert INPUT -o OUTPUT
   quillane-cli --help | --version
 
 Turns photographs into artwork with the effects of Quillane, without a window.
@@ -301,6 +395,12 @@ Turns photographs into artwork with the effects of Quillane, without a window.
            NAME-Tag.jpg into the output folder, which is created when missing
   gallery  the built-in picture (or FILE) through every effect with its defaults: one
            PNG per effect, the original, and index.html to look at them side by side
+  rotate   a quarter turn clockwise (cw) or anticlockwise (ccw), as the program's
+           toolbar buttons turn a picture
+  resize   to WIDTH by HEIGHT pixels with the program's image size arithmetic and
+           nearest-pixel resampling (a side can come out one pixel short: 400 of 521
+           gives 399)
+  convert  the picture saved in the type OUTPUT's extension names
 
 INPUT may be a .jpg, .jpeg, .bmp, .ico, .gif, .wmf, .emf or .png file. Parameters take
 the values "list" shows (whole numbers within their ranges, words, lists, colours);
@@ -317,6 +417,8 @@ Examples:
   quillane-cli apply realism --kernel 1,2,1,0,1,0,-1,-2,-1 photo.jpg -o realism.png
   quillane-cli apply brume --scope 6 --seed 42 photo.jpg -o misty.jpg
   quillane-cli gallery gallery/
+  quillane-cli rotate cw photo.jpg -o upright.jpg
+  quillane-cli resize 400 266 photo.jpg -o small.png
 
 Exit status: 0 done; 1 an input could not be read, an output could not be written,
 or a batch skipped or failed pictures; 2 the command line was wrong (unknown command,

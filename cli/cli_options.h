@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "effects/registry.h"
+#include "imaging/rotate.h"
 
 namespace quillane::cli {
 
@@ -17,7 +18,7 @@ enum ExitCode {
   kExitUsage = 2,   // unknown command, effect or option; a bad or out-of-range value
 };
 
-enum class Command { Help, Version, List, Apply, Batch, Gallery };
+enum class Command { Help, Version, List, Apply, Batch, Gallery, Rotate, Resize, Convert };
 
 struct Options {
   Command command = Command::Help;
@@ -34,6 +35,10 @@ struct Options {
   // Apply and Batch: the random generator's state when the run starts (--seed), as the program
   // has it when it starts: 0. Effects that draw (brume) continue it from picture to picture.
   std::uint32_t seed = 0;
+  // Rotate: the quarter turn. Resize: the width and height as the image size dialog takes them.
+  QuarterTurn turn = QuarterTurn::Clockwise;
+  int width = 0;
+  int height = 0;
 };
 
 struct ParseResult {

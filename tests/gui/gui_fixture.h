@@ -22,12 +22,17 @@ inline QApplication& Application() {
   static int argc = 1;
   static char name[] = "gui_tests";
   static char* argv[] = {name, nullptr};
+  // The toolkit's list of input devices, made before the application object so that it is
+  // gone only after it: the default keyboard and mouse that key clicks and menus create belong
+  // to the application and take themselves off that list when it is destroyed at exit.
+  QInputDevice::devices();
   static QApplication app(argc, argv);
   return app;
 }
 
-// One device of the tests' own for the whole program: the toolkit's default one outlives the
-// application object, and a second static one crashes when the program exits.
+// One device of the tests' own for every synthesized mouse event of the program: the
+// toolkit's default one outlives the application object, and a second static one crashes when
+// the program exits.
 inline const QPointingDevice& TestMouse() {
   static const QPointingDevice mouse("test mouse", 1, QInputDevice::DeviceType::Mouse,
                                      QPointingDevice::PointerType::Generic,

@@ -1,0 +1,99 @@
+// quillane-cli rotate, resize and convert, run as built on real files and checked against the
+// routines run here.
+#include <gtest/gtest.h>
+#include <stdlib.h>
+#include <sys/wait.h>
+
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+#include <string>
+
+#include "codecs/picture_file.h"
+#include "document/reshape.h"
+#include "tests/imaging/random_picture.h"
+
+namespace quillane {
+namespace {
+
+namespace fs = std::filesystem;
+
+class PictureCommands : public ::testing::Test {
+ protected:
+  void SetUp() override {
+    std::string pattern = (fs::temp_directory_path() / "quillane-cli-XXXXXX").string();
+    ASSERT_NE(mkdtemp(pattern.data()), nullptr);
+    dir_ = pattern;
+    opened_ = RandomPicture(521, 346, 5);
+    SetAlphaChannel(opened_, 255);  // as the program opens the bitmap
+    SaveBitmap24(opened_, Path("in.bmp"));
+    SaveBitmap24(TBitmap32(2, 1), Path("thin.bmp"));
+  }
+  void TearDown() override { fs::remove_all(dir_); }
+
+  std::string Path(const std::string& name) const { return dir_ + "/" + name; }
+  std::string Read(const std::string& name) const {
+    std::ifstream in(Path(name), std::ios::binary);
+    return {std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
+  }
+  // Runs quillane-cli in the test's folder; its exit code, with what it said in err_.
+  int Run(const std::string& arguments, const std::string& shellPrefix = "") {
+    const int status = std::system((shellPrefix + "cd '" + dir_ + "' && '" + QUILLANE_CLI_PATH +
+                                    "' " + arguments + " >out.txt 2>err.txt")
+                                       .c_str());
+    err_ = Read("err.txt");
+    return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+  }
+
+  std::string dir_;
+  std::string err_;
+  TBitmap32 opened_;
+};
+
+TEST_F(PictureCommands, WriteWhatTheProgramMakes) {
+  TBitmap32 resized = opened_;
+  const SizeFactors f = ImageSizeFactors(400, 266, 521, 346);
+  ZoomInandOut(resized, f.height, f.width);
+  const struct {
+    std::string arguments;
+    TBitmap32 expected;
+  } cases[] = {
+      {"rotate cw in.bmp -o out.png", *RotatePicture(opened_, 260, 173, QuarterTurn::Clockwise)},
+      {"resize 400 266 in.bmp -o out.png", resized},
+      {"convert in.bmp -o out.png", opened_},
+  };
+  for (const auto& c : cases) {
+    ASSERT_EQ(Run(c.arguments), 0) << c.arguments << ": " << err_;
+    EXPECT_TRUE(LoadPng(Path("out.png")) == c.expected) << c.arguments;
+  }
+  EXPECT_EQ(resized.Width(), 399);
+  ASSERT_EQ(Run("convert in.bmp -o out.jpg"), 0) << err_;
+  EXPECT_EQ(Read("out.jpg").substr(0, 3), "\xFF\xD8\xFF");
+}
+
+TEST_F(PictureCommands, RefusalsSayWhyAndLeaveTheOutputAlone) {
+  const struct {
+    std::string arguments;
+    int exitCode;
+    std::string message;
+  } cases[] = {
+      {"rotate cw thin.bmp -o out.png", 1, "thin.bmp (2 by 1 pixels) is too small to turn"},
+      {"resize 1 346 in.bmp -o out.png", 2, "would make the 521 by 346 picture 0 by 346 pixels"},
+      {"resize 30000 20000 in.bmp -o out.png", 2, "larger than the 268435456 pixels"},
+      {"rotate left in.bmp -o out.png", 2, "cw (clockwise) or ccw (anticlockwise)"},
+      {"convert missing.bmp -o out.png", 1, "missing.bmp: no such file"},
+  };
+  std::ofstream(Path("out.png")) << "kept";
+  for (const auto& c : cases) {
+    EXPECT_EQ(Run(c.arguments), c.exitCode) << c.arguments;
+    EXPECT_NE(err_.find(c.message), std::string::npos) << c.arguments << ": " << err_;
+    EXPECT_EQ(Read("out.png"), "kept") << c.arguments;
+  }
+#if !defined(__SANITIZE_ADDRESS__)  // no address-space limit under ASan
+  EXPECT_EQ(Run("resize 16000 16000 in.bmp -o out.png", "ulimit -v 3000000 && "), 1);
+  EXPECT_NE(err_.find("The resized picture of 15999 by 16000 pixels needs"), std::string::npos);
+#endif
+}
+
+}  // namespace
+}  // namespace quillane

@@ -1,0 +1,162 @@
+// Zoom, the mouse wheel, panning and the quarter turns of the main window.
+#include <QLabel>
+#include <QLocale>
+#include <QMenu>
+#include <QScrollArea>
+#include <QScrollBar>
+#include <QTest>
+#include <QToolButton>
+#include <QWheelEvent>
+
+#include "tests/gui/gui_fixture.h"
+#include "ui/picture_view.h"
+
+namespace quillane {
+namespace {
+
+class View : public GuiTest {
+ protected:
+  QSize Display() { return MainChild<PictureView>("Image1")->size(); }
+  QString ZoomLabel() { return MainChild<QLabel>("Label5")->text(); }
+  void Click(const char* button, int times = 1) {
+    for (int i = 0; i < times; ++i) MainChild<QToolButton>(button)->click();
+  }
+  QScrollBar* Bar(Qt::Orientation o) {
+    auto* box = MainChild<QScrollArea>("ScrollBox1");
+    return o == Qt::Horizontal ? box->horizontalScrollBar() : box->verticalScrollBar();
+  }
+  void Mouse(QEvent::Type type, QPoint at, Qt::MouseButton button, Qt::MouseButtons held) {
+    auto* image1 = MainChild<PictureView>("Image1");
+    QMouseEvent event(type, at, image1->mapToGlobal(at), button, held, Qt::NoModifier,
+                      &TestMouse());
+    QApplication::sendEvent(image1, &event);
+  }
+};
+
+TEST_F(View, ZoomStepsSetTheLabelAndTheDisplaySize) {
+  const struct {
+    const char* button;
+    const char* label;
+    QSize display;  // of the 24 by 16 test picture
+  } steps[] = {{"SpeedButton6", "125.0%", {30, 20}},
+               {"SpeedButton6", "156.3%", {38, 25}},
+               {"SpeedButton6", "195.3%", {47, 31}},
+               {"SpeedButton5", "156.3%", {38, 25}}};
+  EXPECT_EQ(ZoomLabel(), "100%");
+  for (const auto& s : steps) {
+    Click(s.button);
+    EXPECT_EQ(ZoomLabel(), s.label);
+    EXPECT_EQ(Display(), s.display) << s.label;
+  }
+  // Undo sizes by the label: 41.0 % at a zoom of 40.96 %.
+  Main().SetWorkingPicture(TBitmap32(100, 50), true);
+  Click("SpeedButton5", 6);
+  EXPECT_EQ(Display(), QSize(41, 20));
+  Main().SpeedButton3Click();
+  EXPECT_EQ(Display(), QSize(10, 7));
+  // The user's decimal separator, and no group separator.
+  const QLocale previous;
+  QLocale::setDefault(QLocale(QLocale::German));
+  EXPECT_EQ(TMyPicture::ZoomLabelText(1455.19), "1455,2%");
+  QLocale::setDefault(previous);
+}
+
+TEST_F(View, ZoomStopsBeforeTheDisplayLeavesTheWidgetRange) {
+  Click("SpeedButton5", 20);  // 0.8^15 is the last step at which 16 rows still show as one
+  EXPECT_EQ(ZoomLabel(), "3.5%");
+  EXPECT_EQ(Display(), QSize(1, 1));
+  Main().ZoomToActualSize();
+  Main().ShowNewPicture(TBitmap32(1000000, 1), true);
+  Click("SpeedButton6", 15);  // 1.25^12 is the last step below the widget limit
+  EXPECT_EQ(Display(), QSize(14551915, 15));
+  // A wider picture opened at that zoom is held at the limit.
+  Main().ShowNewPicture(TBitmap32(2000000, 1), true);
+  EXPECT_EQ(Display(), QSize(QWIDGETSIZE_MAX, 15));
+}
+
+TEST_F(View, TheWheelZoomsOverThePictureOnlyAndCtrlWheelAnywhere) {
+  Main().ShowNewPicture(TBitmap32(2000, 1500), true);
+  const struct {
+    const char* widget;
+    int turn;  // positive: away from the user
+    Qt::KeyboardModifiers modifiers;
+    const char* label;
+  } cases[] = {
+      {"SpeedButton1", -120, Qt::NoModifier, "100%"},        // over the toolbar: nothing
+      {"Image1", -120, Qt::NoModifier, "125.0%"},            // towards the user: in
+      {"Image1", -1, Qt::NoModifier, "156.3%"},              // a step per message, however short
+      {"ScrollBox1", 240, Qt::NoModifier, "125.0%"},         // away from the user: out
+      {"SpeedButton1", 120, Qt::ControlModifier, "156.3%"},  // with Ctrl, away is in
+      {"Image1", 60, Qt::ControlModifier, "156.3%"},         // half a notch waits for
+      {"Image1", 60, Qt::ControlModifier, "195.3%"},         // the other half
+  };
+  for (const auto& c : cases) {
+    QWidget* widget = MainChild<QWidget>(c.widget);
+    QWheelEvent event(QPointF(5, 5), widget->mapToGlobal(QPointF(5, 5)), QPoint(),
+                      QPoint(0, c.turn), Qt::NoButton, c.modifiers, Qt::NoScrollPhase, false,
+                      Qt::MouseEventNotSynthesized, &TestMouse());
+    QApplication::sendEvent(widget, &event);
+    EXPECT_EQ(ZoomLabel(), c.label) << c.widget << " " << c.turn;
+    EXPECT_EQ(Bar(Qt::Vertical)->value(), 0) << "the scroll box does not scroll";
+  }
+  // The keys of the View menu.
+  ASSERT_TRUE(QTest::qWaitForWindowActive(&Main()));
+  for (auto [key, label] : {std::pair{Qt::Key_Minus, "156.3%"},
+                            {Qt::Key_Plus, "195.3%"},
+                            {Qt::Key_Equal, "244.1%"},
+                            {Qt::Key_0, "100.0%"}}) {
+    QTest::keyClick(&Main(), key, Qt::ControlModifier);
+    EXPECT_EQ(ZoomLabel(), label);
+  }
+}
+
+TEST_F(View, RightDragPansAndOnlyAStillRightClickOpensTheContextMenu) {
+  const struct {
+    QSize picture;
+    Qt::MouseButton button;
+    QPoint to;
+    QPoint scrolled;
+    bool menu;
+  } cases[] = {
+      {{2000, 1500}, Qt::RightButton, {100, 100}, {0, 0}, true},   // a click
+      {{2000, 1500}, Qt::RightButton, {60, 70}, {40, 30}, false},  // a drag that scrolls
+      {{24, 16}, Qt::RightButton, {60, 70}, {0, 0}, true},         // the picture fits
+      {{2000, 1500}, Qt::LeftButton, {60, 70}, {0, 0}, false},     // left does neither
+  };
+  auto* menu = Main().findChild<QMenu*>("PopupMenu1");
+  auto* image1 = MainChild<PictureView>("Image1");
+  for (const auto& c : cases) {
+    Main().ShowNewPicture(TBitmap32(c.picture.width(), c.picture.height()), true);
+    Mouse(QEvent::MouseButtonPress, {100, 100}, c.button, c.button);
+    EXPECT_EQ(image1->cursor().shape(),
+              c.button == Qt::RightButton ? Qt::ClosedHandCursor : Qt::ArrowCursor);
+    Mouse(QEvent::MouseMove, c.to, Qt::NoButton, c.button);
+    Mouse(QEvent::MouseButtonRelease, c.to, c.button, Qt::NoButton);
+    EXPECT_EQ(QPoint(Bar(Qt::Horizontal)->value(), Bar(Qt::Vertical)->value()), c.scrolled);
+    EXPECT_EQ(menu->isVisible(), c.menu) << c.to.x();
+    EXPECT_EQ(image1->cursor().shape(), Qt::ArrowCursor);
+    menu->hide();
+  }
+}
+
+TEST_F(View, RotationTurnsBothPicturesAndResetsTheHistory) {
+  Main().ShowNewPicture(TBitmap32(640, 480, Pixel{9, 9, 9, 255}), true);
+  Main().SetWorkingPicture(TBitmap32(640, 480, Pixel{5, 5, 5, 255}), true);
+  Click("SpeedButton6");
+  Bar(Qt::Horizontal)->setValue(50);
+  Click("SpeedButton12");
+  EXPECT_EQ(Main().Document().Working(), TBitmap32(478, 640, Pixel{5, 5, 5, 255}));
+  EXPECT_EQ(Main().Document().Source(), TBitmap32(478, 640, Pixel{9, 9, 9, 255}));
+  EXPECT_EQ(Main().Document().Opened(), TBitmap32(640, 480, Pixel{9, 9, 9, 255}));
+  EXPECT_FALSE(MainChild<QToolButton>("SpeedButton3")->isEnabled());
+  EXPECT_EQ(Display(), QSize(598, 800));
+  EXPECT_EQ(Bar(Qt::Horizontal)->value(), 0);
+  // Too thin to turn: said so, and nothing changes.
+  Main().ShowNewPicture(TBitmap32(2, 1, Pixel{1, 1, 1, 255}), true);
+  Click("SpeedButton12");
+  EXPECT_EQ(Main().Document().Working(), TBitmap32(2, 1, Pixel{1, 1, 1, 255}));
+  EXPECT_EQ(platform_.messages.size(), 1u);
+}
+
+}  // namespace
+}  // namespace quillane
