@@ -145,6 +145,11 @@ void PictureDocument::Load(TBitmap32 picture) {
   working_ = source_ = opened_ = Share(std::move(picture));
 }
 
+void PictureDocument::Load(std::shared_ptr<TBitmap32> picture) {
+  spare_.storage = TBitmap32();
+  working_ = source_ = opened_ = std::move(picture);
+}
+
 void PictureDocument::Backup() {
   spare_.storage = TBitmap32();
   currentSlot_ = currentSlot_ % kSlots + 1;

@@ -43,6 +43,8 @@ class PictureDocument {
   // Makes picture (alpha set to 255) the working, source and opened picture, as loading a file
   // does. The history is left alone; opening a file follows this with ResetHistory.
   void Load(TBitmap32 picture);
+  // The same for a picture whose alpha is 255 already, taken over without a copy.
+  void Load(std::shared_ptr<TBitmap32> picture);
 
   // The history step: the next slot (21 wraps to 1) takes the working picture; the undo count
   // grows up to 20, the redo count becomes 0.
