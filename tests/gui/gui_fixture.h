@@ -22,6 +22,10 @@ inline QApplication& Application() {
   static int argc = 1;
   static char name[] = "gui_tests";
   static char* argv[] = {name, nullptr};
+  // The toolkit's list of input devices must outlive the application object, which deletes the
+  // devices it made (an effect's wait loop makes the default mouse) when the program exits.
+  static const bool devicesFirst = !QInputDevice::devices().isEmpty();
+  static_cast<void>(devicesFirst);
   static QApplication app(argc, argv);
   return app;
 }
