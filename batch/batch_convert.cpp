@@ -149,6 +149,13 @@ Decoded DecodeApart(const std::string& path) {
   return decoded;
 }
 
+// JPEG files are read by libjpeg alone. The toolkit's decoders are kept to the thread that
+// drives the loop: the toolkit takes the first thread that uses it for its main thread.
+bool ReadableOnAnyThread(const std::string& name) {
+  const std::string key = AsciiLower(name.size() > 4 ? name.substr(name.size() - 4) : name);
+  return key == ".jpg" || key == "jpeg";
+}
+
 // What was done ahead for one entry while the entries before it were still being finished.
 struct Prepared {
   std::optional<Decoded> decoded;
@@ -198,6 +205,7 @@ class BatchLoop {
         if (readsAnOutput[static_cast<std::size_t>(i - 1)] && !FinishWrite()) return result_;
         prepared = Prepare(i);
         if (i < count_ && !readsAnOutput[static_cast<std::size_t>(i)] &&
+            ReadableOnAnyThread(job_.files[static_cast<std::size_t>(i)]) &&
             !writtenFor_.count(OutputPath(i + 1)) && OutputPath(i + 1) != OutputPath(i))
           ahead_ = {i + 1, std::async(std::launch::async, DecodeApart, InputPath(i + 1))};
         if (prepared.decoded && prepared.decoded->picture) {
