@@ -79,6 +79,7 @@ BENCHMARK(BM_BatchPencilSketch)
     ->Arg(1)
     ->Iterations(1)
     ->Unit(benchmark::kSecond)
+    ->MeasureProcessCPUTime()
     ->UseRealTime();
 
 // What the conversion cannot go below on one thread: the same files decoded and written back
@@ -98,7 +99,11 @@ void BM_DecodeAndEncodeAlone(benchmark::State& state) {
     }
   }
 }
-BENCHMARK(BM_DecodeAndEncodeAlone)->Iterations(1)->Unit(benchmark::kSecond)->UseRealTime();
+BENCHMARK(BM_DecodeAndEncodeAlone)
+    ->Iterations(1)
+    ->Unit(benchmark::kSecond)
+    ->MeasureProcessCPUTime()
+    ->UseRealTime();
 
 }  // namespace
 }  // namespace quillane
