@@ -12,7 +12,7 @@ JOBS ?= $(shell nproc)
 PACKAGES := build-essential cmake pkg-config clang libclang-rt-14-dev clang-format \
 	qt6-base-dev qt6-svg-dev qt6-qpa-plugins libgl-dev fonts-dejavu-core \
 	libjpeg62-turbo-dev libpng-dev libgtest-dev libgmock-dev libbenchmark-dev libwmf-dev libemf2svg-dev \
-	xdg-utils
+	xdg-utils libzstd-dev
 
 .PHONY: all deps build run test test-asan fuzz bench format clean
 

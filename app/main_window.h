@@ -60,6 +60,8 @@ class TMyPicture : public QMainWindow, public ToolHost {
 
   bool ApplyEffect(const EffectSpec& effect, const EffectParams& params,
                    bool recordHistory) override;
+  // True while ApplyEffect waits for its routine; a second apply meanwhile is ignored.
+  bool EffectRunning() const { return effectRunning_; }
   void SetWorkingPicture(TBitmap32 picture, bool recordHistory) override;
 
   // The history step after a tool has written the working picture.
@@ -183,6 +185,9 @@ class TMyPicture : public QMainWindow, public ToolHost {
   void Image1MouseMove(QMouseEvent* event);
   void Image1MouseUp(QMouseEvent* event);
   void Rotate(QuarterTurn turn);
+  // Runs work on a thread of its own while this thread keeps the windows painted, with a busy
+  // cursor and what runs in the status bar; input to the windows is ignored until it ends.
+  void RunWhileWindowsWait(const QString& what, const std::function<void()>& work);
 
   PlatformServices& platform_;
   PictureDocument document_;
@@ -191,6 +196,7 @@ class TMyPicture : public QMainWindow, public ToolHost {
   QString inputFolder_;
   QString outputFolder_;
   bool lineArt_ = false;
+  bool effectRunning_ = false;
   std::vector<ToolWindow*> toolWindows_;  // owned as child widgets
 
   QFrame* controlBar_ = nullptr;

@@ -1,13 +1,17 @@
 // The document's actions: effects and results written into the working picture, the history
 // step, Undo, Redo and Renew, and the status line.
 #include <QAction>
+#include <QApplication>
+#include <QEventLoop>
 #include <QLabel>
 #include <QScrollArea>
 #include <QScrollBar>
+#include <QStatusBar>
 #include <QToolButton>
 #include <exception>
 #include <new>
 #include <string>
+#include <thread>
 
 #include "app/main_window.h"
 #include "document/run_effect.h"
@@ -29,10 +33,79 @@ void TMyPicture::ShowLoadedPicture(bool resetHistory) {
   UpdateHistoryControls();
 }
 
+namespace {
+
+// Swallows what the user does with mouse, keys and window close boxes while an effect runs;
+// painting, moving and resizing the windows go on.
+class IgnoreInput : public QObject {
+ public:
+  IgnoreInput() { QCoreApplication::instance()->installEventFilter(this); }
+  ~IgnoreInput() override { QCoreApplication::instance()->removeEventFilter(this); }
+
+ protected:
+  bool eventFilter(QObject*, QEvent* event) override {
+    switch (event->type()) {
+      case QEvent::MouseButtonPress:
+      case QEvent::MouseButtonRelease:
+      case QEvent::MouseButtonDblClick:
+      case QEvent::Wheel:
+      case QEvent::KeyPress:
+      case QEvent::KeyRelease:
+      case QEvent::ShortcutOverride:
+      case QEvent::Shortcut:
+      case QEvent::ContextMenu:
+      case QEvent::TouchBegin:
+      case QEvent::TouchUpdate:
+      case QEvent::TouchEnd:
+      case QEvent::Close:
+        return event->spontaneous();
+      default:
+        return false;
+    }
+  }
+};
+
+}  // namespace
+
+void TMyPicture::RunWhileWindowsWait(const QString& what, const std::function<void()>& work) {
+  effectRunning_ = true;
+  QApplication::setOverrideCursor(Qt::WaitCursor);
+  statusBar()->showMessage(what);
+  {
+    const IgnoreInput ignoreInput;
+    QEventLoop loop;
+    std::thread worker([&work, &loop] {
+      work();
+      QMetaObject::invokeMethod(&loop, &QEventLoop::quit, Qt::QueuedConnection);
+    });
+    loop.exec();
+    worker.join();
+  }
+  statusBar()->clearMessage();
+  QApplication::restoreOverrideCursor();
+  effectRunning_ = false;
+}
+
 bool TMyPicture::ApplyEffect(const EffectSpec& effect, const EffectParams& params,
                              bool recordHistory) {
+  // The picture a second apply would start from is still being made.
+  if (effectRunning_) return false;
   try {
-    RunEffect(document_, effect, params, recordHistory);
+    // The routine runs apart from the document and lands on it only once it is done, so the
+    // windows can be painted meanwhile and nothing ever sees a half-made picture.
+    EffectRun run(document_, effect, params);
+    std::exception_ptr failure;
+    QString what = QString::fromStdString(effect.menuEntry).replace("&&", "&");
+    if (what.isEmpty()) what = QString::fromStdString(effect.statusText);
+    RunWhileWindowsWait(what + QStringLiteral("..."), [&run, &failure] {
+      try {
+        run.Compute();
+      } catch (...) {
+        failure = std::current_exception();
+      }
+    });
+    if (failure) std::rethrow_exception(failure);
+    run.Land(document_, recordHistory);
   } catch (const std::bad_alloc&) {
     const TBitmap32& source = document_.Source();
     platform_.ShowError(QString::fromStdString(

@@ -5,12 +5,15 @@
 #include <algorithm>
 #include <exception>
 #include <filesystem>
+#include <future>
 #include <map>
+#include <memory>
 #include <optional>
 #include <set>
 #include <stdexcept>
 #include <system_error>
 #include <utility>
+#include <vector>
 
 #include "codecs/picture_file.h"
 #include "document/run_effect.h"
@@ -114,6 +117,286 @@ std::string BatchOutputName(const std::string& outputFolder, const std::string& 
   return JoinPath(outputFolder, stem + "-" + tag + ".jpg");
 }
 
+namespace {
+
+// A listed picture read apart from the document, with the notices the loader gave meanwhile.
+struct Decoded {
+  std::shared_ptr<TBitmap32> picture;  // alpha 255 already; null when reason says why not
+  std::string reason;
+  bool outOfMemory = false;  // worth another try once nothing else holds memory
+  std::vector<std::pair<std::string, std::string>> notices;
+};
+
+Decoded DecodeApart(const std::string& path) {
+  Decoded decoded;
+  try {
+    std::optional<TBitmap32> picture =
+        LoadPictureFile(path, [&decoded](const std::string& caption, const std::string& text) {
+          decoded.notices.emplace_back(caption, text);
+        });
+    if (!picture || picture->Width() < 1) {
+      decoded.reason = NotValidFormat(path);
+    } else {
+      SetAlphaChannel(*picture, 255);
+      decoded.picture = std::make_shared<TBitmap32>(std::move(*picture));
+    }
+  } catch (const std::bad_alloc&) {
+    decoded = Decoded();
+    decoded.outOfMemory = true;
+  } catch (const std::exception& e) {
+    decoded.reason = NamingTheFile(path, e.what());
+  }
+  return decoded;
+}
+
+// JPEG files are read by libjpeg alone. The toolkit's decoders are kept to the thread that
+// drives the loop: the toolkit takes the first thread that uses it for its main thread.
+bool ReadableOnAnyThread(const std::string& name) {
+  const std::string key = AsciiLower(name.size() > 4 ? name.substr(name.size() - 4) : name);
+  return key == ".jpg" || key == "jpeg";
+}
+
+// What was done ahead for one entry while the entries before it were still being finished.
+struct Prepared {
+  std::optional<Decoded> decoded;
+  std::optional<EffectRun> run;
+  std::exception_ptr effectError;  // what the routine threw, if it did
+};
+
+// The loop of ConvertBatch. With overlap, the picture after the current one is decoded and the
+// one before it encoded while the effect runs; the document, the observer and the result still
+// see every entry one at a time, in list order, exactly as without. Work done ahead is only
+// taken when it is what the one-at-a-time loop would have computed: the effect ran from the
+// random state the document has when the entry's turn comes, and an entry whose input is an
+// output of this run is read only after that output is written. Work that failed for want of
+// memory is done again at the entry's turn, with nothing else going on.
+class BatchLoop {
+ public:
+  BatchLoop(PictureDocument& document, const EffectSpec& effect, const EffectParams& params,
+            const BatchJob& job, const BatchObserver& observer, std::string inputFolder,
+            std::string outputFolder)
+      : document_(document),
+        effect_(effect),
+        params_(params),
+        job_(job),
+        observer_(observer),
+        inputFolder_(std::move(inputFolder)),
+        outputFolder_(std::move(outputFolder)),
+        count_(static_cast<int>(job.files.size())) {
+    // Names of different inputs can lead to one output ("a.jpg", "a.JPG" and "a.bmp"), and with
+    // the output folder the input folder an output can be an input ("x-Tag.jpg" beside
+    // "x.jpg"): neither is ever overwritten.
+    for (const std::string& name : job.files)
+      if (const auto id = IdOf(JoinPath(inputFolder_, name))) inputs_.insert(*id);
+  }
+
+  BatchResult Run() {
+    std::vector<bool> readsAnOutput(static_cast<std::size_t>(count_));
+    if (job_.overlapStages) {
+      std::set<std::string> outputs;
+      for (int i = 1; i <= count_; ++i) {
+        readsAnOutput[static_cast<std::size_t>(i - 1)] = outputs.count(Canonical(InputPath(i))) > 0;
+        outputs.insert(Canonical(OutputPath(i)));
+      }
+    }
+    for (int i = 1; i <= count_; ++i) {
+      Prepared prepared;
+      if (job_.overlapStages) {
+        if (readsAnOutput[static_cast<std::size_t>(i - 1)] && !FinishWrite()) return result_;
+        prepared = Prepare(i);
+        if (i < count_ && !readsAnOutput[static_cast<std::size_t>(i)] &&
+            ReadableOnAnyThread(job_.files[static_cast<std::size_t>(i)]) &&
+            !writtenFor_.count(OutputPath(i + 1)) && OutputPath(i + 1) != OutputPath(i))
+          ahead_ = {i + 1, std::async(std::launch::async, DecodeApart, InputPath(i + 1))};
+        if (prepared.decoded && prepared.decoded->picture) {
+          prepared.run.emplace(prepared.decoded->picture, document_.RandomState(), effect_,
+                               params_);
+          try {
+            prepared.run->Compute();
+          } catch (...) {
+            prepared.effectError = std::current_exception();
+          }
+        }
+      }
+      if (!FinishWrite() || !Convert(i, std::move(prepared))) return result_;
+    }
+    FinishWrite();
+    return result_;
+  }
+
+ private:
+  std::string InputPath(int i) const {
+    return JoinPath(inputFolder_, job_.files[static_cast<std::size_t>(i - 1)]);
+  }
+  std::string OutputPath(int i) const {
+    return BatchOutputName(outputFolder_, job_.files[static_cast<std::size_t>(i - 1)],
+                           effect_.batchTag);
+  }
+  static std::string Canonical(const std::string& path) {
+    std::error_code ec;
+    const fs::path canonical = fs::weakly_canonical(path, ec);
+    return ec ? path : canonical.string();
+  }
+
+  // The decoded picture of entry i when it can be had ahead of its turn.
+  Prepared Prepare(int i) {
+    Prepared prepared;
+    if (writtenFor_.count(OutputPath(i))) return prepared;  // skipped at its turn
+    if (ahead_.index == i && ahead_.decoded.valid()) {
+      prepared.decoded = ahead_.decoded.get();
+    } else {
+      prepared.decoded = DecodeApart(InputPath(i));
+    }
+    ahead_ = {};
+    if (prepared.decoded->outOfMemory) prepared.decoded.reset();
+    return prepared;
+  }
+
+  void Report(BatchProgress& progress, BatchProgress::Step step) {
+    progress.step = step;
+    if (observer_.progress) observer_.progress(progress);
+  }
+
+  bool Stop(std::string error) {
+    result_.end = BatchResult::End::Stopped;
+    result_.error = std::move(error);
+    return false;
+  }
+
+  // Entry i's turn: the document, the observer and the result see it as the one-at-a-time loop
+  // has them see it. False when the loop stops.
+  bool Convert(int i, Prepared prepared) {
+    BatchProgress progress;
+    progress.index = i;
+    progress.count = count_;
+    progress.name = job_.files[static_cast<std::size_t>(i - 1)];
+    progress.outputPath = OutputPath(i);
+    Report(progress, BatchProgress::Step::Loading);
+
+    auto skip = [&](std::string reason) {
+      result_.skipped.push_back({progress.name, reason});
+      progress.reason = std::move(reason);
+      Report(progress, BatchProgress::Step::Skipped);
+      return true;
+    };
+    const std::string path = InputPath(i);
+    if (const auto taken = writtenFor_.find(progress.outputPath); taken != writtenFor_.end())
+      return skip(path + " was not converted: its output " + progress.outputPath +
+                  " was already written for " + taken->second);
+    if (const auto id = IdOf(progress.outputPath); id && inputs_.count(*id))
+      return skip(path + " was not converted: its output " + progress.outputPath +
+                  " is one of the pictures being converted");
+
+    // Loaded into a bitmap of its own first: an entry that cannot be read must leave the
+    // document, and with it the previous result, untouched and write no file.
+    if (prepared.decoded) {
+      for (const auto& [caption, text] : prepared.decoded->notices)
+        if (observer_.message) observer_.message(caption, text);
+      if (!prepared.decoded->picture) return skip(prepared.decoded->reason);
+      document_.Load(std::move(prepared.decoded->picture));
+    } else {
+      ahead_ = {};  // read now as the one-at-a-time loop does, alone
+      std::optional<TBitmap32> picture;
+      std::string reason;
+      try {
+        picture = LoadPictureFile(path, observer_.message);
+        if (!picture || picture->Width() < 1) reason = NotValidFormat(path);
+      } catch (const std::exception& e) {
+        reason = NamingTheFile(path, e.what());
+      }
+      if (!reason.empty()) return skip(std::move(reason));
+      const int width = picture->Width(), height = picture->Height();
+      try {
+        document_.Load(std::move(*picture));
+      } catch (const std::bad_alloc&) {
+        return skip(path + " " + MemoryNeedText(OperationBytes(width, height)));
+      }
+    }
+    Report(progress, BatchProgress::Step::Loaded);
+
+    const bool aheadValid = prepared.run && prepared.run->StartState() == document_.RandomState();
+    bool retry = !aheadValid;
+    if (aheadValid && prepared.effectError) {
+      try {
+        std::rethrow_exception(prepared.effectError);
+      } catch (const std::bad_alloc&) {
+        retry = true;  // it may well fit now that nothing else is going on
+      } catch (const std::exception& e) {
+        return Stop(NamingTheFile(path, e.what()));
+      }
+    }
+    try {
+      if (retry) {
+        prepared.run.reset();
+        ahead_ = {};
+        RunEffect(document_, effect_, params_, effect_.batchPushesHistory);
+      } else {
+        prepared.run->Land(document_, effect_.batchPushesHistory);
+      }
+    } catch (const std::bad_alloc&) {
+      // Too large for what is left of memory: this picture only; the next may well fit.
+      return skip(
+          path + " " +
+          MemoryNeedText(OperationBytes(document_.Source().Width(), document_.Source().Height())));
+    } catch (const std::exception& e) {
+      return Stop(NamingTheFile(path, e.what()));
+    }
+    if (observer_.afterEffect) observer_.afterEffect(progress, document_);
+    Report(progress, BatchProgress::Step::Converted);
+
+    writtenFor_.emplace(progress.outputPath, progress.name);
+    pendingWrite_ = progress;
+    if (job_.overlapStages) {
+      write_ = std::async(std::launch::async,
+                          [picture = document_.SharedWorking(), outputPath = progress.outputPath] {
+                            SaveJpeg(*picture, outputPath, 90);
+                          });
+      return true;
+    }
+    return FinishWrite(true);
+  }
+
+  // The write of the last converted entry, waited for (or done now, without overlap) and
+  // reported. False when it failed and the loop stops.
+  bool FinishWrite(bool now = false) {
+    if (!pendingWrite_) return true;
+    BatchProgress progress = std::move(*pendingWrite_);
+    pendingWrite_.reset();
+    try {
+      if (now) {
+        SaveJpeg(document_.Working(), progress.outputPath, 90);
+      } else {
+        write_.get();
+      }
+    } catch (const std::exception& e) {
+      return Stop("Cannot write " + progress.outputPath + ": " + e.what());
+    }
+    result_.outputs.push_back(progress.outputPath);
+    Report(progress, BatchProgress::Step::Written);
+    return true;
+  }
+
+  PictureDocument& document_;
+  const EffectSpec& effect_;
+  const EffectParams& params_;
+  const BatchJob& job_;
+  const BatchObserver& observer_;
+  const std::string inputFolder_;
+  const std::string outputFolder_;
+  const int count_;
+  std::set<FileId> inputs_;
+  std::map<std::string, std::string> writtenFor_;  // output path -> the entry that wrote it
+  BatchResult result_;
+  std::optional<BatchProgress> pendingWrite_;
+  std::future<void> write_;
+  struct Ahead {
+    int index = 0;
+    std::future<Decoded> decoded;
+  } ahead_;
+};
+
+}  // namespace
+
 BatchResult ConvertBatch(PictureDocument& document, const EffectSpec& effect,
                          const EffectParams& params, const BatchJob& job,
                          const BatchObserver& observer) {
@@ -147,92 +430,7 @@ BatchResult ConvertBatch(PictureDocument& document, const EffectSpec& effect,
       return stop("Cannot create the output folder " + outputFolder +
                   (ec ? ": " + ec.message() : std::string(": a file of that name exists")));
   }
-
-  const int count = static_cast<int>(job.files.size());
-  const LoaderNotice notice = observer.message;
-  // Names of different inputs can lead to one output ("a.jpg", "a.JPG" and "a.bmp"), and with
-  // the output folder the input folder an output can be an input ("x-Tag.jpg" beside "x.jpg"):
-  // neither is ever overwritten.
-  std::set<FileId> inputs;
-  for (const std::string& name : job.files)
-    if (const auto id = IdOf(JoinPath(inputFolder, name))) inputs.insert(*id);
-  std::map<std::string, std::string> writtenFor;  // output path -> the entry that wrote it
-  for (int i = 1; i <= count; ++i) {
-    BatchProgress progress;
-    progress.index = i;
-    progress.count = count;
-    progress.name = job.files[static_cast<std::size_t>(i - 1)];
-    progress.outputPath = BatchOutputName(outputFolder, progress.name, effect.batchTag);
-    auto report = [&](BatchProgress::Step step) {
-      progress.step = step;
-      if (observer.progress) observer.progress(progress);
-    };
-    report(BatchProgress::Step::Loading);
-
-    auto skip = [&](std::string reason) {
-      result.skipped.push_back({progress.name, reason});
-      progress.reason = std::move(reason);
-      report(BatchProgress::Step::Skipped);
-    };
-    const std::string path = JoinPath(inputFolder, progress.name);
-    if (const auto taken = writtenFor.find(progress.outputPath); taken != writtenFor.end()) {
-      skip(path + " was not converted: its output " + progress.outputPath +
-           " was already written for " + taken->second);
-      continue;
-    }
-    if (const auto id = IdOf(progress.outputPath); id && inputs.count(*id)) {
-      skip(path + " was not converted: its output " + progress.outputPath +
-           " is one of the pictures being converted");
-      continue;
-    }
-
-    // Loaded into a bitmap of its own first: an entry that cannot be read must leave the
-    // document, and with it the previous result, untouched and write no file.
-    std::optional<TBitmap32> picture;
-    std::string reason;
-    try {
-      picture = LoadPictureFile(path, notice);
-      if (!picture || picture->Width() < 1) reason = NotValidFormat(path);
-    } catch (const std::exception& e) {
-      reason = NamingTheFile(path, e.what());
-    }
-    if (!reason.empty()) {
-      skip(std::move(reason));
-      continue;
-    }
-    const int width = picture->Width(), height = picture->Height();
-    try {
-      document.Load(std::move(*picture));
-    } catch (const std::bad_alloc&) {
-      skip(path + " " + MemoryNeedText(OperationBytes(width, height)));
-      continue;
-    }
-    picture.reset();
-    report(BatchProgress::Step::Loaded);
-
-    try {
-      RunEffect(document, effect, params, effect.batchPushesHistory);
-    } catch (const std::bad_alloc&) {
-      // Too large for what is left of memory: this picture only; the next may well fit.
-      skip(path + " " +
-           MemoryNeedText(OperationBytes(document.Source().Width(), document.Source().Height())));
-      continue;
-    } catch (const std::exception& e) {
-      return stop(NamingTheFile(path, e.what()));
-    }
-    if (observer.afterEffect) observer.afterEffect(progress, document);
-    report(BatchProgress::Step::Converted);
-
-    try {
-      SaveJpeg(document.Working(), progress.outputPath, 90);
-    } catch (const std::exception& e) {
-      return stop("Cannot write " + progress.outputPath + ": " + e.what());
-    }
-    result.outputs.push_back(progress.outputPath);
-    writtenFor.emplace(progress.outputPath, progress.name);
-    report(BatchProgress::Step::Written);
-  }
-  return result;
+  return BatchLoop(document, effect, params, job, observer, inputFolder, outputFolder).Run();
 }
 
 }  // namespace quillane

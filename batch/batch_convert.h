@@ -79,6 +79,9 @@ struct BatchJob {
   std::string inputFolder;         // as typed; blanks around it are ignored
   std::string outputFolder;        // as typed; blanks around it are ignored; created if missing
   std::vector<std::string> files;  // bare names, as ScanBatchFolder gave them
+  // The next picture is decoded and the previous one encoded while the effect runs; the
+  // document, the observer and the result see exactly what they see without.
+  bool overlapStages = true;
 };
 
 struct BatchSkipped {

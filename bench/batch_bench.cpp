@@ -4,8 +4,10 @@
 #include <stdlib.h>
 
 #include <filesystem>
+#include <optional>
 #include <stdexcept>
 #include <string>
+#include <vector>
 
 #include "batch/batch_convert.h"
 #include "bench/synthetic_photo.h"
@@ -44,10 +46,17 @@ class BatchFolders {
   fs::path root_;
 };
 
-void BM_BatchPencilSketch(benchmark::State& state) {
+const BatchFolders& Folders() {
   static const BatchFolders folders;
+  return folders;
+}
+
+// Argument 1: the stages overlap (the program's way); 0: one picture at a time.
+void BM_BatchPencilSketch(benchmark::State& state) {
+  const BatchFolders& folders = Folders();
   const EffectSpec& pencil = *FindEffectByCliName("pencil-sketch");
-  const BatchJob job{folders.In(), folders.Out(), ScanBatchFolder(folders.In())};
+  BatchJob job{folders.In(), folders.Out(), ScanBatchFolder(folders.In())};
+  job.overlapStages = state.range(0) != 0;
   if (static_cast<int>(job.files.size()) != kPictures) {
     state.SkipWithError("the input folder is incomplete");
     return;
@@ -65,7 +74,36 @@ void BM_BatchPencilSketch(benchmark::State& state) {
   state.counters["megapixels_per_second"] = benchmark::Counter(
       kPictures * (kWidth * kHeight / 1e6), benchmark::Counter::kIsIterationInvariantRate);
 }
-BENCHMARK(BM_BatchPencilSketch)->Iterations(1)->Unit(benchmark::kSecond)->UseRealTime();
+BENCHMARK(BM_BatchPencilSketch)
+    ->Arg(0)
+    ->Arg(1)
+    ->Iterations(1)
+    ->Unit(benchmark::kSecond)
+    ->MeasureProcessCPUTime()
+    ->UseRealTime();
+
+// What the conversion cannot go below on one thread: the same files decoded and written back
+// without any effect.
+void BM_DecodeAndEncodeAlone(benchmark::State& state) {
+  const BatchFolders& folders = Folders();
+  const std::vector<std::string> files = ScanBatchFolder(folders.In());
+  fs::create_directories(folders.Out());
+  for (auto _ : state) {
+    for (const std::string& name : files) {
+      const std::optional<TBitmap32> picture = LoadPictureFile(folders.In() + "/" + name);
+      if (!picture) {
+        state.SkipWithError("a picture did not load");
+        return;
+      }
+      SaveJpeg(*picture, folders.Out() + "/" + name, 90);
+    }
+  }
+}
+BENCHMARK(BM_DecodeAndEncodeAlone)
+    ->Iterations(1)
+    ->Unit(benchmark::kSecond)
+    ->MeasureProcessCPUTime()
+    ->UseRealTime();
 
 }  // namespace
 }  // namespace quillane

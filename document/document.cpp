@@ -1,28 +1,221 @@
 #include "document/document.h"
 
+#include <condition_variable>
+#include <deque>
+#include <functional>
+#include <mutex>
+#include <thread>
+
+#include "document/packed_picture.h"
+
 namespace quillane {
 
+// One history state. It starts as the recorded picture itself; once packed, only a weak
+// reference to that picture is kept, which finds it again while a document still shows it.
+// Packing is the only change a state ever sees, and it does not change what the state holds.
+struct PictureDocument::SlotState {
+  explicit SlotState(Picture picture) : seen(picture), picture(std::move(picture)) {}
+  std::mutex mutex;
+  std::weak_ptr<const TBitmap32> seen;
+  Picture picture;  // until packed
+  std::shared_ptr<const PackedPicture> packed;
+};
+
+namespace {
+
+// The one background thread that packs history states, in the order they were recorded.
+class HistoryPacker {
+ public:
+  using Job = std::function<void()>;
+
+  static HistoryPacker& Instance() {
+    static HistoryPacker packer;
+    return packer;
+  }
+
+  void Add(Job job) {
+    {
+      std::lock_guard lock(mutex_);
+      if (!thread_.joinable()) thread_ = std::thread([this] { Run(); });
+      jobs_.push_back(std::move(job));
+    }
+    wake_.notify_all();
+  }
+
+  void WaitUntilIdle() {
+    std::unique_lock lock(mutex_);
+    idle_.wait(lock, [this] { return jobs_.empty() && !busy_; });
+  }
+
+  ~HistoryPacker() {
+    {
+      std::lock_guard lock(mutex_);
+      stop_ = true;
+      jobs_.clear();
+    }
+    wake_.notify_all();
+    if (thread_.joinable()) thread_.join();
+  }
+
+ private:
+  HistoryPacker() = default;
+
+  void Run() {
+    std::unique_lock lock(mutex_);
+    for (;;) {
+      wake_.wait(lock, [this] { return stop_ || !jobs_.empty(); });
+      if (stop_) return;
+      Job job = std::move(jobs_.front());
+      jobs_.pop_front();
+      busy_ = true;
+      lock.unlock();
+      job();
+      job = nullptr;
+      lock.lock();
+      busy_ = false;
+      if (jobs_.empty()) idle_.notify_all();
+    }
+  }
+
+  std::mutex mutex_;
+  std::condition_variable wake_;
+  std::condition_variable idle_;
+  std::deque<Job> jobs_;
+  bool busy_ = false;
+  bool stop_ = false;
+  std::thread thread_;
+};
+
+const TBitmap32& EmptyPicture() {
+  static const TBitmap32 empty;
+  return empty;
+}
+
+}  // namespace
+
 PictureDocument::PictureDocument(TBitmap32 picture) {
-  const Picture empty = Share(TBitmap32());
-  slots_.fill(empty);
   Load(std::move(picture));
   ResetHistory();
 }
 
+void PictureDocument::WaitForHistoryPacking() {
+  HistoryPacker::Instance().WaitUntilIdle();
+}
+
+PictureDocument::SlotHandle PictureDocument::Record(Picture picture) {
+  auto slot = std::make_shared<SlotState>(std::move(picture));
+  HistoryPacker::Instance().Add([weak = std::weak_ptr<SlotState>(slot)] {
+    const SlotHandle slot = weak.lock();
+    if (!slot) return;  // overwritten before its turn came
+    Picture picture;
+    {
+      std::lock_guard lock(slot->mutex);
+      picture = slot->picture;
+    }
+    if (!picture) return;
+    std::shared_ptr<const PackedPicture> packed;
+    try {
+      packed = std::make_shared<const PackedPicture>(PackedPicture::Pack(*picture));
+    } catch (const std::exception&) {
+      return;  // short of memory: the state simply stays unpacked
+    }
+    std::lock_guard lock(slot->mutex);
+    slot->packed = std::move(packed);
+    slot->picture.reset();
+  });
+  return slot;
+}
+
+const TBitmap32& PictureDocument::Slot(int slot) const {
+  const SlotHandle& state = slots_.at(static_cast<std::size_t>(slot - 1));
+  if (!state) return EmptyPicture();
+  std::shared_ptr<const PackedPicture> packed;
+  {
+    std::lock_guard lock(state->mutex);
+    slotView_ = state->picture ? state->picture : state->seen.lock();
+    packed = state->packed;
+  }
+  if (!slotView_) slotView_ = Share(packed->Unpack());
+  return *slotView_;
+}
+
 void PictureDocument::Load(TBitmap32 picture) {
+  spare_.storage = TBitmap32();
   SetAlphaChannel(picture, 255);
   working_ = source_ = opened_ = Share(std::move(picture));
 }
 
-void PictureDocument::Backup() {
-  currentSlot_ = currentSlot_ % kSlots + 1;
-  slots_[static_cast<std::size_t>(currentSlot_ - 1)] = working_;
-  if (undoCount_ < kMaxSteps) ++undoCount_;
-  redoCount_ = 0;
+void PictureDocument::Load(std::shared_ptr<TBitmap32> picture) {
+  spare_.storage = TBitmap32();
+  working_ = source_ = opened_ = std::move(picture);
 }
 
-void PictureDocument::RestoreCurrentSlot() {
-  working_ = slots_[static_cast<std::size_t>(currentSlot_ - 1)];
+void PictureDocument::Backup() {
+  spare_.storage = TBitmap32();
+  currentSlot_ = currentSlot_ % kSlots + 1;
+  SlotAt(currentSlot_) = Record(working_);
+  if (undoCount_ < kMaxSteps) ++undoCount_;
+  redoCount_ = 0;
+  LetGoOfUnreachableSlots();
+}
+
+PictureDocument::Picture PictureDocument::TakeSlot(int target, int leaving) {
+  // The picture being left can lend its storage when the slot it came from has it packed and
+  // nothing else holds it: fresh memory costs far more than unpacking.
+  std::shared_ptr<const PackedPicture> leavingPacked;
+  if (const SlotHandle& from = SlotAt(leaving); from && working_.use_count() == 1) {
+    std::lock_guard lock(from->mutex);
+    const bool same = !from->seen.owner_before(working_) && !working_.owner_before(from->seen);
+    if (same && from->packed && !from->picture) leavingPacked = from->packed;
+  }
+  const auto lend = [&](TBitmap32& storage) {
+    storage = std::move(const_cast<TBitmap32&>(*working_));
+    working_.reset();
+  };
+
+  SlotState& state = *SlotAt(target);
+  std::shared_ptr<const PackedPicture> packed;
+  {
+    std::lock_guard lock(state.mutex);
+    Picture shown = state.picture ? state.picture : state.seen.lock();
+    if (shown) {
+      if (leavingPacked) lend(spare_.storage);
+      return shown;
+    }
+    packed = state.packed;
+  }
+
+  TBitmap32 storage;
+  if (leavingPacked) {
+    lend(storage);
+  } else {
+    storage = std::move(spare_.storage);
+    spare_.storage = TBitmap32();
+  }
+  try {
+    packed->UnpackInto(storage);
+  } catch (...) {
+    if (leavingPacked) {
+      // Give the working picture back before reporting the failure.
+      try {
+        leavingPacked->UnpackInto(storage);
+      } catch (...) {
+      }
+      working_ = Share(std::move(storage));
+      std::lock_guard lock(SlotAt(leaving)->mutex);
+      SlotAt(leaving)->seen = working_;
+    }
+    throw;
+  }
+  Picture picture = Share(std::move(storage));
+  std::lock_guard lock(state.mutex);
+  state.seen = picture;
+  return picture;
+}
+
+void PictureDocument::Restore(int target) {
+  working_ = TakeSlot(target, currentSlot_);
+  currentSlot_ = target;
   // Only the widths are compared: a change of height alone leaves the source as it is.
   if (working_->Width() != source_->Width() && !source_->Empty()) {
     const long double heightFactor =
@@ -36,8 +229,7 @@ void PictureDocument::RestoreCurrentSlot() {
 
 bool PictureDocument::Undo() {
   if (undoCount_ == 0) return false;
-  currentSlot_ = currentSlot_ == 1 ? kSlots : currentSlot_ - 1;
-  RestoreCurrentSlot();
+  Restore(currentSlot_ == 1 ? kSlots : currentSlot_ - 1);
   --undoCount_;
   ++redoCount_;
   return true;
@@ -45,8 +237,7 @@ bool PictureDocument::Undo() {
 
 bool PictureDocument::Redo() {
   if (redoCount_ == 0) return false;
-  currentSlot_ = currentSlot_ % kSlots + 1;
-  RestoreCurrentSlot();
+  Restore(currentSlot_ % kSlots + 1);
   ++undoCount_;
   --redoCount_;
   return true;
@@ -62,7 +253,14 @@ void PictureDocument::ResetHistory() {
   currentSlot_ = 1;
   undoCount_ = 0;
   redoCount_ = 0;
-  slots_[0] = working_;
+  SlotAt(1) = Record(working_);
+  LetGoOfUnreachableSlots();
+}
+
+void PictureDocument::LetGoOfUnreachableSlots() {
+  // The reachable slots run from undo count steps back to redo count steps forward.
+  for (int offset = redoCount_ + 1; offset < kSlots - undoCount_; ++offset)
+    SlotAt((currentSlot_ - 1 + offset) % kSlots + 1).reset();
 }
 
 }  // namespace quillane

@@ -5,6 +5,13 @@
 // The pictures are shared, never copied: after opening, the working, source and opened picture
 // and the first history slot are one bitmap in memory, and each history step holds the result
 // it recorded. A picture is only ever replaced as a whole, so sharing is invisible to callers.
+//
+// History states are packed losslessly on a background thread once recorded; a state that no
+// document picture shows any more is then held only packed, so twenty steps of a large picture
+// fit in memory. Undo and Redo unpack into the storage of the picture they leave. States that
+// can no longer be reached by Undo or Redo are let go.
+//
+// A document and the copies made of it are used from one thread at a time.
 #pragma once
 
 #include <array>
@@ -36,6 +43,8 @@ class PictureDocument {
   // Makes picture (alpha set to 255) the working, source and opened picture, as loading a file
   // does. The history is left alone; opening a file follows this with ResetHistory.
   void Load(TBitmap32 picture);
+  // The same for a picture whose alpha is 255 already, taken over without a copy.
+  void Load(std::shared_ptr<TBitmap32> picture);
 
   // The history step: the next slot (21 wraps to 1) takes the working picture; the undo count
   // grows up to 20, the redo count becomes 0.
@@ -55,7 +64,17 @@ class PictureDocument {
   int UndoCount() const { return undoCount_; }
   int RedoCount() const { return redoCount_; }
   int CurrentSlot() const { return currentSlot_; }  // 1..21
-  const TBitmap32& Slot(int slot) const { return *slots_.at(static_cast<std::size_t>(slot - 1)); }
+  // The state held in slot (1..21), unpacked when it is packed; empty for a slot no history
+  // operation can reach. The reference holds until the next call or change of the document.
+  const TBitmap32& Slot(int slot) const;
+
+  // Shared handles on the pictures, for work that runs on another thread while the document
+  // goes on: the pictures themselves never change.
+  std::shared_ptr<const TBitmap32> SharedSource() const { return source_; }
+  std::shared_ptr<const TBitmap32> SharedWorking() const { return working_; }
+
+  // Waits until every history state recorded so far (by any document) is packed.
+  static void WaitForHistoryPacking();
 
   // The random generator state the effects that draw continue: 0 when the document is made,
   // never reseeded by loading or history, so every run follows on from the one before.
@@ -64,15 +83,36 @@ class PictureDocument {
 
  private:
   using Picture = std::shared_ptr<const TBitmap32>;
+  // Made writable, so that a picture nobody else holds can lend its storage to the next one.
   static Picture Share(TBitmap32 picture) {
-    return std::make_shared<const TBitmap32>(std::move(picture));
+    return std::make_shared<TBitmap32>(std::move(picture));
   }
-  void RestoreCurrentSlot();
+  struct SlotState;
+  using SlotHandle = std::shared_ptr<SlotState>;
+  SlotHandle& SlotAt(int slot) { return slots_[static_cast<std::size_t>(slot - 1)]; }
+  const SlotHandle& SlotAt(int slot) const { return slots_[static_cast<std::size_t>(slot - 1)]; }
+  static SlotHandle Record(Picture picture);
+  // The picture of slot target, unpacked into the storage of the working picture when the
+  // working picture is the state of slot leaving and held nowhere else.
+  Picture TakeSlot(int target, int leaving);
+  void Restore(int target);
+  void LetGoOfUnreachableSlots();
+
+  // Storage of a picture Undo or Redo let go of, kept for the next state to be unpacked while
+  // stepping through the history. A copy of the document starts without one.
+  struct Spare {
+    Spare() = default;
+    Spare(const Spare&) {}
+    Spare& operator=(const Spare&) { return *this; }
+    TBitmap32 storage;
+  };
 
   Picture working_;
   Picture source_;
   Picture opened_;
-  std::array<Picture, kSlots> slots_;
+  std::array<SlotHandle, kSlots> slots_;
+  mutable Picture slotView_;
+  Spare spare_;
   int currentSlot_ = 1;
   int undoCount_ = 0;
   int redoCount_ = 0;

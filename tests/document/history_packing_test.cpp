@@ -1,0 +1,79 @@
+#include <gtest/gtest.h>
+
+#include <cstdint>
+#include <random>
+#include <vector>
+
+#include "document/document.h"
+#include "document/packed_picture.h"
+
+namespace quillane {
+namespace {
+
+TBitmap32 Noise(int w, int h, std::uint32_t seed) {
+  std::mt19937 random(seed);
+  TBitmap32 picture(w, h);
+  auto* bytes = reinterpret_cast<std::uint8_t*>(picture.Data());
+  for (std::size_t i = 0; i < picture.PixelCount() * 4; ++i)
+    bytes[i] = static_cast<std::uint8_t>(random() % 7 + (i % 13) * 19);
+  return picture;
+}
+
+TEST(PackedPicture, GivesBackEveryByte) {
+  // Awkward sizes, and one tall enough to be packed in several bands on several threads.
+  const struct { int w, h; } sizes[] = {{0, 0}, {1, 1}, {1, 9}, {9, 1}, {7, 5}, {300, 2000}};
+  for (const auto& size : sizes) {
+    const TBitmap32 picture = Noise(size.w, size.h, 7);
+    const PackedPicture packed = PackedPicture::Pack(picture);
+    EXPECT_EQ(packed.Unpack(), picture) << size.w << "x" << size.h;
+    TBitmap32 reused = Noise(size.w, size.h, 8);  // same size: its storage is overwritten
+    packed.UnpackInto(reused);
+    EXPECT_EQ(reused, picture) << size.w << "x" << size.h;
+  }
+  const TBitmap32 flat(1000, 1000, Pixel{255, 255, 255, 255});
+  EXPECT_LT(PackedPicture::Pack(flat).Bytes(), flat.PixelCount() * 4 / 100);
+}
+
+// Each step has its own size, so undo moves between storage of different sizes as well.
+TEST(PictureDocument, UndoAndRedoAfterPackingGiveBackTheExactStates) {
+  std::vector<TBitmap32> states{Noise(40, 30, 0)};
+  PictureDocument doc(states[0]);
+  for (std::uint32_t i = 1; i <= 24; ++i) {
+    states.push_back(Noise(40 + static_cast<int>(i % 3), 30, i));
+    doc.SetWorking(states.back());
+    doc.Backup();
+  }
+  PictureDocument::WaitForHistoryPacking();
+  const PictureDocument copy = doc;
+  const auto shown = doc.SharedWorking();  // a picture someone still holds must not change
+  for (int i = 23; i >= 4; --i) {
+    ASSERT_TRUE(doc.Undo());
+    EXPECT_EQ(doc.Working(), states[static_cast<std::size_t>(i)]) << i;
+  }
+  EXPECT_FALSE(doc.Undo());
+  EXPECT_EQ(*shown, states[24]);
+  for (int i = 5; i <= 24; ++i) {
+    ASSERT_TRUE(doc.Redo());
+    EXPECT_EQ(doc.Working(), states[static_cast<std::size_t>(i)]) << i;
+  }
+  EXPECT_EQ(copy.Working(), states[24]);
+  EXPECT_EQ(copy.Slot(copy.CurrentSlot() == 1 ? 21 : copy.CurrentSlot() - 1), states[23]);
+}
+
+TEST(PictureDocument, StatesThatCannotBeReachedAreLetGo) {
+  PictureDocument doc(TBitmap32(2, 2, Pixel{1, 1, 1, 255}));
+  for (std::uint8_t v = 2; v <= 4; ++v) {
+    doc.SetWorking(TBitmap32(2, 2, Pixel{v, v, v, 255}));
+    doc.Backup();
+  }
+  doc.Undo();
+  doc.Undo();
+  doc.SetWorking(TBitmap32(2, 2, Pixel{9, 9, 9, 255}));
+  doc.Backup();  // slot 3 now holds 9; slot 4 (state 4) can no longer be reached
+  EXPECT_EQ(doc.Slot(3), TBitmap32(2, 2, Pixel{9, 9, 9, 255}));
+  EXPECT_TRUE(doc.Slot(4).Empty());
+  EXPECT_EQ(doc.Slot(1), TBitmap32(2, 2, Pixel{1, 1, 1, 255}));
+}
+
+}  // namespace
+}  // namespace quillane
