@@ -270,6 +270,10 @@ ParseResult ParseCommandLine(const std::vector<std::string>& args) {
     if (args.size() > 1) return Fail("list takes no arguments");
     return Plain(Command::List);
   }
+  if (verb == "manpage" || verb == "completion") {
+    if (args.size() > 1) return Fail(verb + " takes no arguments");
+    return Plain(verb == "manpage" ? Command::Manpage : Command::Completion);
+  }
   if (verb == "apply") return ParseEffectCommand(Command::Apply, args);
   if (verb == "batch") return ParseEffectCommand(Command::Batch, args);
   if (verb == "gallery") return ParseGallery(args);
@@ -286,6 +290,7 @@ std::string UsageText() {
   quillane-cli apply EFFECT [--PARAM VALUE ...] [--seed N] [INPUT] -o OUTPUT [--format TYPE]
   quillane-cli batch EFFECT [--PARAM VALUE ...] [--seed N] --input DIR --output DIR
   quillane-cli gallery DIR [--input FILE]
+  quillane-cli manpage | completion
   quillane-cli --help | --version
 
 Turns photographs into artwork with the effects of Quillane, without a window.
@@ -301,6 +306,9 @@ Turns photographs into artwork with the effects of Quillane, without a window.
            NAME-Tag.jpg into the output folder, which is created when missing
   gallery  the built-in picture (or FILE) through every effect with its defaults: one
            PNG per effect, the original, and index.html to look at them side by side
+  manpage  this text and the list of effects as a manual page (roff)
+  completion
+           a bash completion script for the commands, effects and options
 
 INPUT may be a .jpg, .jpeg, .bmp, .ico, .gif, .wmf, .emf or .png file. Parameters take
 the values "list" shows (whole numbers within their ranges, words, lists, colours);
