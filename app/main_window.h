@@ -17,6 +17,8 @@
 #include "ui/tool_host.h"
 
 class QAction;
+class QDragEnterEvent;
+class QDropEvent;
 class QLabel;
 class QMenu;
 class QScrollArea;
@@ -55,6 +57,12 @@ class TMyPicture : public QMainWindow, public ToolHost {
   bool ApplyEffect(const EffectSpec& effect, const EffectParams& params,
                    bool recordHistory) override;
   void SetWorkingPicture(TBitmap32 picture, bool recordHistory) override;
+
+  // Opens the picture file at path as File > Open does once a file is chosen (a file that
+  // cannot be read is reported and changes nothing), and puts it first in the recent list.
+  bool OpenPictureFile(const QString& path);
+  // The pictures opened last, most recent first (at most ten), as File > Open Recent lists them.
+  QStringList RecentFiles() const;
 
   // The history step after a tool has written the working picture.
   void backup();
@@ -129,8 +137,18 @@ class TMyPicture : public QMainWindow, public ToolHost {
  protected:
   void resizeEvent(QResizeEvent* event) override;
   void closeEvent(QCloseEvent* event) override;
+  // A single picture file dropped on the window is opened.
+  void dragEnterEvent(QDragEnterEvent* event) override;
+  void dropEvent(QDropEvent* event) override;
 
  private:
+  // The standard shortcuts, Alt-letter menu access, Open Recent and drag and drop.
+  void AddDesktopActions();
+  void FillRecentMenu();
+  void RememberRecent(const QString& path);
+  // A recent-list entry: opened, or taken off the list with a message when it is gone.
+  void OpenRecentFile(const QString& path);
+
   void BuildMenus();
   void BuildToolbar(QWidget* central);
   void BuildView(QWidget* central);
@@ -168,6 +186,7 @@ class TMyPicture : public QMainWindow, public ToolHost {
   QToolButton* upArrow_ = nullptr;
   QListWidget* listView1_ = nullptr;
   TBatchConvertOk* batchConvertOk_ = nullptr;
+  QMenu* recentMenu_ = nullptr;
 };
 
 }  // namespace quillane
