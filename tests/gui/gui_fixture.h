@@ -8,7 +8,9 @@
 #include <QMenuBar>
 #include <QMouseEvent>
 #include <QPointingDevice>
+#include <QSettings>
 #include <QString>
+#include <QTemporaryDir>
 #include <memory>
 
 #include "app/main_window.h"
@@ -22,7 +24,19 @@ inline QApplication& Application() {
   static int argc = 1;
   static char name[] = "gui_tests";
   static char* argv[] = {name, nullptr};
-  static QApplication app(argc, argv);
+  // Never destroyed: the input devices that window activation and key clicks create are
+  // registered in a list of the toolkit's that static destruction removes before a static
+  // application object, whose end would then crash deleting them.
+  static QApplication& app = *new QApplication(argc, argv);
+  // What the windows remember between runs (recent pictures, dialog folders) goes to a folder
+  // of the test program's own, never to the user's settings.
+  static QTemporaryDir settings;
+  static const bool settingsMoved = [] {
+    for (QSettings::Format format : {QSettings::NativeFormat, QSettings::IniFormat})
+      QSettings::setPath(format, QSettings::UserScope, settings.path());
+    return true;
+  }();
+  (void)settingsMoved;
   return app;
 }
 
@@ -30,9 +44,10 @@ inline QApplication& Application() {
 inline void ClickOn(QWidget* control) {
   // One device of the tests' own for the whole program: the toolkit's default one outlives the
   // application object, and a second static one crashes when the program exits.
-  static const QPointingDevice mouse("test mouse", 1, QInputDevice::DeviceType::Mouse,
-                                     QPointingDevice::PointerType::Generic,
-                                     QInputDevice::Capability::Position, 1, 3);
+  // Like the application object, it is never destroyed.
+  static const QPointingDevice& mouse = *new QPointingDevice(
+      "test mouse", 1, QInputDevice::DeviceType::Mouse, QPointingDevice::PointerType::Generic,
+      QInputDevice::Capability::Position, 1, 3);
   QMouseEvent release(QEvent::MouseButtonRelease, QPointF(4, 4), QPointF(4, 4), QPointF(4, 4),
                       Qt::LeftButton, Qt::NoButton, Qt::NoModifier, &mouse);
   QCoreApplication::sendEvent(control, &release);

@@ -32,6 +32,7 @@ class ScriptedPlatform : public PlatformServices {
   std::vector<FolderRequest> folderRequests;
   std::vector<std::uint32_t> colorRequests;
   std::vector<QString> openedFolders;
+  bool fileManagerStarts = true;  // what OpenFolder answers
 
   std::deque<std::optional<FileChoice>> openAnswers;
   std::deque<std::optional<FileChoice>> saveAnswers;
@@ -58,7 +59,10 @@ class ScriptedPlatform : public PlatformServices {
     colorRequests.push_back(initial);
     return Next(colorAnswers);
   }
-  void OpenFolder(const QString& folder) override { openedFolders.push_back(folder); }
+  bool OpenFolder(const QString& folder) override {
+    openedFolders.push_back(folder);
+    return fileManagerStarts;
+  }
 
  private:
   template <typename T>
