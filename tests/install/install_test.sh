@@ -43,12 +43,20 @@ if [ "$gui" = 1 ]; then
   [ -s "$root/share/icons/hicolor/scalable/apps/$id.svg" ] || fail "scalable icon"
 fi
 
-# The installed command line, started from the staging folder: a metafile written and read
-# back, which needs the installed renderer beside it.
+# The installed command line, started from the staging folder, reading a Windows metafile with
+# one rectangle in it: vector content, which only the renderer installed beside it can draw.
 cd "$stage"
 "$root/bin/quillane-cli" --version | grep -q '^quillane-cli [0-9]' || fail "--version"
-"$root/bin/quillane-cli" apply emboss -o "$stage/emboss.wmf" || fail "writing a metafile"
-"$root/bin/quillane-cli" apply emboss "$stage/emboss.wmf" -o "$stage/back.png" ||
-  fail "reading the metafile back"
-[ -s "$stage/back.png" ] || fail "no picture written"
+printf '\xd7\xcd\xc6\x9a\0\0\0\0\0\0\x64\0\x64\0\xa0\x05\0\0\0\0\xb1\x52' >rect.wmf
+printf '\1\0\x09\0\0\x03\x13\0\0\0\0\0\x07\0\0\0\0\0' >>rect.wmf
+printf '\x07\0\0\0\x1b\x04\x5a\0\x5a\0\x0a\0\x0a\0\x03\0\0\0\0\0' >>rect.wmf
+"$root/bin/quillane-cli" apply emboss rect.wmf -o rect.png || fail "reading the metafile"
+[ -s rect.png ] || fail "no picture written"
+# Without the renderer beside it the installed program cannot read it: it does not fall back on
+# the build tree's copy.
+rm "$root/bin/quillane-wmf-render"
+if "$root/bin/quillane-cli" apply emboss rect.wmf -o again.png 2>err; then
+  fail "a metafile was read without the installed renderer"
+fi
+grep -q "not installed" err || { cat err; fail "no clear message"; }
 echo "installed and validated in $stage"
