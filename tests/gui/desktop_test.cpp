@@ -1,6 +1,5 @@
-// The main window as a desktop program: keyboard, menus, drag and drop, the recent list, its
-// tool windows' place among the windows, and the boxes and dialogs of the real platform.
-#include <QDropEvent>
+// The main window as a desktop program: keyboard, menus, drag and drop, the recent list, the
+// place of its tool windows, and the boxes and dialogs of the real platform.
 #include <QFileDialog>
 #include <QHeaderView>
 #include <QLineEdit>
@@ -11,7 +10,6 @@
 #include <QTimer>
 #include <QToolButton>
 #include <QTreeView>
-#include <QUrl>
 #include <functional>
 
 #include "app/qt_messages.h"
@@ -29,20 +27,25 @@ class Desktop : public FileGuiTest {
   void SetUp() override {
     FileGuiTest::SetUp();
     ProgramSettings().clear();
-    Main().activateWindow();
-    ASSERT_TRUE(QTest::qWaitForWindowActive(&Main()));
+    Activate(&Main());
   }
-
-  // A picture file of the given width written into the test's folder.
+  static void Activate(QWidget* window) {
+    window->activateWindow();
+    QCoreApplication::processEvents();
+    ASSERT_EQ(QApplication::activeWindow(), window);
+  }
+  // A bitmap file width pixels wide in the test's folder.
   QString Picture(const QString& name, int width) {
     SaveBitmap24(TestPicture(width, 3), LocalPath(name));
     return Path(name);
   }
-
-  static QStringList RecentMenuTexts(QMenu* menu) {
-    QStringList texts;
-    for (QAction* a : menu->actions()) texts << a->data().toString();
-    return texts;
+  QMenu* RecentMenu(TMyPicture& window) {
+    return window.menuBar()->findChild<QMenu*>("OpenRecent1");
+  }
+  static QStringList Entries(QMenu* menu) {
+    QStringList paths;
+    for (QAction* a : menu->actions()) paths << a->data().toString();
+    return paths;
   }
 };
 
@@ -50,52 +53,36 @@ TEST_F(Desktop, StandardShortcutsRunTheirCommands) {
   ASSERT_TRUE(Main().ApplyEffect(Giving(TestPicture(5, 5), "Effect"), {}, true));
   QSignalSpy print(MainChild<QToolButton>("SpeedButton10"), &QToolButton::clicked);
   QSignalSpy closed(&Main(), &TMyPicture::closed);
-  struct Case {
-    Qt::Key key;
-    Qt::KeyboardModifiers modifiers;
-    std::function<bool()> done;
+  const std::pair<QKeyCombination, std::function<bool()>> cases[] = {
+      {Qt::CTRL | Qt::Key_O, [&] { return platform_.openFilters.size() == 1; }},
+      {Qt::CTRL | Qt::Key_S, [&] { return platform_.saveFilters.size() == 1; }},
+      {Qt::CTRL | Qt::Key_Z, [&] { return Main().StatusText() == "Undo"; }},
+      {Qt::CTRL | Qt::SHIFT | Qt::Key_Z, [&] { return Main().StatusText() == "Redo"; }},
+      {Qt::CTRL | Qt::Key_P, [&] { return print.count() == 1; }},
+      {Qt::CTRL | Qt::Key_Q, [&] { return closed.count() == 1; }},
   };
-  const Case cases[] = {
-      {Qt::Key_O, Qt::ControlModifier, [&] { return platform_.openFilters.size() == 1; }},
-      {Qt::Key_S, Qt::ControlModifier, [&] { return platform_.saveFilters.size() == 1; }},
-      {Qt::Key_Z, Qt::ControlModifier, [&] { return Main().StatusText() == "Undo"; }},
-      {Qt::Key_Z, Qt::ControlModifier | Qt::ShiftModifier,
-       [&] { return Main().StatusText() == "Redo"; }},
-      {Qt::Key_P, Qt::ControlModifier, [&] { return print.count() == 1; }},
-      {Qt::Key_Q, Qt::ControlModifier, [&] { return closed.count() == 1; }},
-  };
-  for (const Case& c : cases) {
-    SCOPED_TRACE(QKeySequence(c.key | c.modifiers).toString().toStdString());
-    EXPECT_FALSE(c.done());
-    QTest::keyClick(&Main(), c.key, c.modifiers);
-    EXPECT_TRUE(c.done());
+  for (const auto& [keys, done] : cases) {
+    SCOPED_TRACE(QKeySequence(keys).toString().toStdString());
+    EXPECT_FALSE(done());
+    QTest::keyClick(&Main(), keys.key(), keys.keyboardModifiers());
+    EXPECT_TRUE(done());
   }
-  // The menus show them beside their entries.
-  EXPECT_EQ(MenuAction("Open1")->shortcut(), QKeySequence(QKeySequence::Open));
-  EXPECT_EQ(MenuAction("Exit1")->shortcut(), QKeySequence(Qt::CTRL | Qt::Key_Q));
+  EXPECT_EQ(MenuAction("Exit1")->shortcut(), QKeySequence(Qt::CTRL | Qt::Key_Q));  // shown
 }
 
 TEST_F(Desktop, MenusOpenWithAltLettersAndShowTheirCaptionsUnchanged) {
-  struct Case {
-    const char* menu;
-    const char* shown;
-    Qt::Key letter;
-  };
-  const Case cases[] = {{"File1", " File", Qt::Key_F},
-                        {"Edit1", " Edit", Qt::Key_E},
-                        {"BW1", " B&W", Qt::Key_B},
-                        {"Color1", " Color", Qt::Key_C},
-                        {"ColorAdjust1", " ColorAdjust", Qt::Key_A},
-                        {"Veins1", " Veins", Qt::Key_V},
-                        {"Help1", " Help", Qt::Key_H}};
-  for (const Case& c : cases) {
-    SCOPED_TRACE(c.menu);
-    auto* menu = Main().menuBar()->findChild<QMenu*>(c.menu);
-    ASSERT_NE(menu, nullptr);
-    EXPECT_EQ(QKeySequence::mnemonic(menu->title()), QKeySequence(Qt::ALT | c.letter));
-    QString shown = menu->title();
-    shown.replace("&&", "\x01").remove('&').replace('\x01', '&');
-    EXPECT_EQ(shown, c.shown);
+  const std::tuple<const char*, QString, Qt::Key> cases[] = {
+      {"File1", " File", Qt::Key_F},
+      {"Edit1", " Edit", Qt::Key_E},
+      {"BW1", " B&W", Qt::Key_B},
+      {"Color1", " Color", Qt::Key_C},
+      {"ColorAdjust1", " ColorAdjust", Qt::Key_A},
+      {"Veins1", " Veins", Qt::Key_V},
+      {"Help1", " Help", Qt::Key_H}};
+  for (const auto& [name, shown, letter] : cases) {
+    const QString title = Main().menuBar()->findChild<QMenu*>(name)->title();
+    EXPECT_EQ(QKeySequence::mnemonic(title), QKeySequence(Qt::ALT | letter)) << name;
+    EXPECT_EQ(QString(title).replace("&&", "\x01").remove('&').replace('\x01', '&'), shown);
   }
 }
 
@@ -111,15 +98,10 @@ TEST_F(Desktop, ADroppedPictureFileOpensAsFileOpenDoes) {
     QCoreApplication::sendEvent(&Main(), &dropped);
     return enter.isAccepted();
   };
-  // Two files, or a file that is not on this computer, are refused and change nothing.
   EXPECT_FALSE(drop({QUrl::fromLocalFile(picture), QUrl::fromLocalFile(picture)}));
-  EXPECT_FALSE(drop({QUrl("https://example.org/dropped.bmp")}));
-  EXPECT_EQ(Main().Document().Working().Width(), 24);
   EXPECT_EQ(Main().ActiveTool(), 15);
-
   EXPECT_TRUE(drop({QUrl::fromLocalFile(picture)}));
-  EXPECT_EQ(Main().Document().Working(), Main().Document().Opened());
-  EXPECT_EQ(Main().Document().Working().Width(), 7);
+  EXPECT_EQ(Main().Document().Opened().Width(), 7);
   EXPECT_EQ(Main().ActiveTool(), 0);
   EXPECT_EQ(Main().RecentFiles(), QStringList{picture});
 }
@@ -133,166 +115,125 @@ TEST_F(Desktop, OpenRecentListsTheLastTenPicturesNewestFirst) {
   ASSERT_TRUE(Main().OpenPictureFile(opened[5]));  // p7 again: back to the top, once
   QStringList expected = opened.mid(0, 10);
   expected.move(5, 0);
-  EXPECT_EQ(Main().RecentFiles(), expected);
-  auto* menu = Main().menuBar()->findChild<QMenu*>("OpenRecent1");
-  ASSERT_NE(menu, nullptr);
-  EXPECT_EQ(RecentMenuTexts(menu), expected);
-
-  // An unreadable picture is not listed.
-  WriteBytes(LocalPath("bad.bmp"), "not a bitmap");
-  EXPECT_FALSE(Main().OpenPictureFile(Path("bad.bmp")));
-  EXPECT_EQ(Main().RecentFiles(), expected);
-
-  // A window started later offers the same list; choosing an entry opens that picture.
+  EXPECT_EQ(Entries(RecentMenu(Main())), expected);
+  // A window started later offers the same list, and an entry opens its picture.
   ScriptedPlatform otherPlatform;
   TMyPicture other(otherPlatform, TestPicture());
-  auto* otherMenu = other.menuBar()->findChild<QMenu*>("OpenRecent1");
-  ASSERT_EQ(RecentMenuTexts(otherMenu), expected);
-  otherMenu->actions()[2]->trigger();
-  EXPECT_EQ(other.Document().Working().Width(), QFileInfo(expected[2]).baseName().mid(1).toInt());
+  ASSERT_EQ(Entries(RecentMenu(other)), expected);
+  RecentMenu(other)->actions()[2]->trigger();
+  EXPECT_EQ(other.Document().Opened().Width(), 11);  // p11.bmp
 }
 
 TEST_F(Desktop, AMissingRecentPictureIsDroppedWithAMessage) {
-  const QString kept = Picture("kept.bmp", 4);
-  const QString gone = Picture("gone.bmp", 6);
+  const QString kept = Picture("kept.bmp", 4), gone = Picture("gone.bmp", 6);
   ASSERT_TRUE(Main().OpenPictureFile(kept));
   ASSERT_TRUE(Main().OpenPictureFile(gone));
   ASSERT_TRUE(QFile::remove(gone));
-
-  auto* menu = Main().menuBar()->findChild<QMenu*>("OpenRecent1");
-  menu->actions()[0]->trigger();
+  RecentMenu(Main())->actions()[0]->trigger();
   EXPECT_EQ(platform_.messages,
             (std::vector<ScriptedPlatform::Message>{
                 {"Sorry", gone + " no longer exists; it was taken off the recent list."}}));
-  EXPECT_EQ(Main().RecentFiles(), QStringList{kept});
-  EXPECT_EQ(RecentMenuTexts(menu), QStringList{kept});
-  EXPECT_EQ(Main().Document().Working().Width(), 6);  // unchanged
+  EXPECT_EQ(Entries(RecentMenu(Main())), QStringList{kept});
+  EXPECT_EQ(Main().Document().Opened().Width(), 6);
 }
 
 TEST_F(Desktop, ToolWindowsFloatAboveTheMainWindowOnly) {
-  for (int number = 1; number <= 17; ++number) {
-    SCOPED_TRACE(number);
-    const Qt::WindowFlags flags = Tool(number).windowFlags();
-    EXPECT_EQ(flags & Qt::WindowType_Mask, Qt::Tool);
-    EXPECT_FALSE(flags.testFlag(Qt::WindowStaysOnTopHint));
-    EXPECT_EQ(Tool(number).parentWidget(), &Main());
+  std::vector<QWidget*> windows{&Main().BatchConvertOk()};
+  for (int number = 1; number <= 17; ++number) windows.push_back(&Tool(number));
+  for (QWidget* window : windows) {
+    SCOPED_TRACE(window->objectName().toStdString());
+    EXPECT_FALSE(window->windowFlags().testFlag(Qt::WindowStaysOnTopHint));
+    EXPECT_EQ(window->parentWidget(), &Main());
   }
-  EXPECT_FALSE(Main().BatchConvertOk().windowFlags().testFlag(Qt::WindowStaysOnTopHint));
-  EXPECT_EQ(Main().BatchConvertOk().parentWidget(), &Main());
+  EXPECT_EQ(Tool(1).windowFlags() & Qt::WindowType_Mask, Qt::Tool);
 }
 
-TEST_F(Desktop, EnterPressesTheToolWindowsOkAndEscapeClosesIt) {
+TEST_F(Desktop, ToolWindowKeysAndBatchFieldTooltips) {
+  Main().SetInputFolder(Path(QString(120, 'x')));
   Main().OpenTool(15);
+  EXPECT_EQ(ToolChild<QLineEdit>(15, "Edit10")->toolTip(), Path(QString(120, 'x')));
   QTest::keyClick(&Tool(15), Qt::Key_Return);
   EXPECT_EQ(Main().StatusText(), "Emboss");
-  EXPECT_TRUE(Main().findChild<QAction*>("Undo1")->isEnabled());
   QTest::keyClick(&Tool(15), Qt::Key_Escape);
   EXPECT_FALSE(Tool(15).isVisible());
   EXPECT_EQ(Main().ActiveTool(), 0);
 }
 
-TEST_F(Desktop, BatchFolderFieldsShowTheWholePathAsTooltip) {
-  const QString longFolder = Path(QString(120, 'x'));
-  Main().SetInputFolder(longFolder);
-  Main().OpenTool(15);
-  auto* field = ToolChild<QLineEdit>(15, Tool(15).Spec().inputField.c_str());
-  ASSERT_NE(field, nullptr);
-  EXPECT_EQ(field->toolTip(), longFolder);
-}
-
 TEST_F(Desktop, GoOutputFolderSaysSoWhenNoFileManagerStarts) {
   Main().SetOutputFolder(Path("out"));
   platform_.fileManagerStarts = false;
-  Main().ShowBatchConvertOk();
-  Main().BatchConvertOk().findChild<QToolButton*>("SpeedButton2")->click();
+  Main().BatchConvertOk().SpeedButton2Click();
   EXPECT_EQ(platform_.openedFolders, std::vector<QString>{Path("out")});
   ASSERT_EQ(platform_.messages.size(), 1u);
   EXPECT_TRUE(platform_.messages[0].text.startsWith("No file manager could be started to show " +
                                                     Path("out")));
-  EXPECT_FALSE(Main().BatchConvertOk().isVisible());
 }
 
-// The real platform: what owns the message box that a call raises, found while it is shown.
-QWidget* OwnerOfMessageBox(const std::function<void()>& raise) {
-  QWidget* owner = nullptr;
-  QTimer::singleShot(0, [&] {
-    if (auto* box = qobject_cast<QMessageBox*>(QApplication::activeModalWidget())) {
-      owner = box->parentWidget();
-      box->done(0);
-    }
-  });
+// Runs raise, which shows a modal dialog of the real platform; answer gets that dialog.
+void WhileModal(const std::function<void()>& raise, const std::function<void(QDialog*)>& answer) {
+  QTimer::singleShot(0, [&] { answer(qobject_cast<QDialog*>(QApplication::activeModalWidget())); });
   raise();
-  return owner;
 }
 
 TEST_F(Desktop, MessageBoxesBelongToTheWindowThatRaisedThem) {
   QtPlatformServices real;
   Main().OpenTool(15);
-  struct Case {
-    QWidget* active;
-    std::function<void()> raise;
-  };
-  const Case cases[] = {
+  const std::pair<QWidget*, std::function<void()>> cases[] = {
       {&Tool(15), [&] { real.ShowMessage("Sorry", "from the tool window"); }},
       {&Tool(15), [&] { real.ShowError("an error in the tool window"); }},
       {&Main(), [&] { real.ShowMessage("Sorry", "from the main window"); }},
   };
-  for (const Case& c : cases) {
-    c.active->activateWindow();
-    QCoreApplication::processEvents();
-    ASSERT_EQ(QApplication::activeWindow(), c.active);
-    EXPECT_EQ(OwnerOfMessageBox(c.raise), c.active);
+  for (const auto& [active, raise] : cases) {
+    Activate(active);
+    QWidget* owner = nullptr;
+    WhileModal(raise, [&](QDialog* box) {
+      owner = box->parentWidget();
+      box->done(0);
+    });
+    EXPECT_EQ(owner, active);
   }
 }
 
 TEST_F(Desktop, OpenAndSaveDialogsRememberTheirOwnFoldersAndShowWholeColumnTitles) {
   QtPlatformServices real;
-  ASSERT_TRUE(QDir(Path("")).mkpath("opened"));
-  ASSERT_TRUE(QDir(Path("")).mkpath("saved"));
+  QDir(Path("")).mkpath("opened");
+  QDir(Path("")).mkpath("saved");
   Picture("opened/a.bmp", 2);
-  // Answers the dialog shown next with path, after noting the folder it opened in and checking
-  // that every column title fits.
-  auto answer = [&](const QString& path, QString& startedIn) {
-    QTimer::singleShot(0, [&, path] {
-      auto* dialog = qobject_cast<QFileDialog*>(QApplication::activeModalWidget());
-      ASSERT_NE(dialog, nullptr);
-      startedIn = dialog->directory().absolutePath();
-      auto* view = dialog->findChild<QTreeView*>("treeView");
-      ASSERT_NE(view, nullptr);
-      QHeaderView* header = view->header();
-      for (int i = 0; i < header->count(); ++i) {
-        const QString title = view->model()->headerData(i, Qt::Horizontal).toString();
-        EXPECT_GT(header->sectionSize(i), header->fontMetrics().horizontalAdvance(title))
-            << title.toStdString();
-      }
-      dialog->selectFile(path);
-      QMetaObject::invokeMethod(dialog, "accept");
-    });
-  };
-  QString startedIn;
-  answer(Path("opened/a.bmp"), startedIn);
-  ASSERT_TRUE(real.OpenPictureDialog("*.bmp|*.bmp"));
-  answer(Path("saved/b.jpg"), startedIn);
-  ASSERT_TRUE(real.SavePictureDialog("*.jpg|*.jpg"));
-  EXPECT_NE(startedIn, Path("opened"));  // the save dialog has a folder of its own
-
-  answer(Path("opened/a.bmp"), startedIn);
-  ASSERT_TRUE(real.OpenPictureDialog("*.bmp|*.bmp"));
-  EXPECT_EQ(startedIn, Path("opened"));
-  answer(Path("saved/c.jpg"), startedIn);
-  ASSERT_TRUE(real.SavePictureDialog("*.jpg|*.jpg"));
-  EXPECT_EQ(startedIn, Path("saved"));
+  const std::tuple<bool, QString, QString> steps[] = {// open?, file chosen, folder shown first
+                                                      {true, "opened/a.bmp", ""},
+                                                      {false, "saved/b.jpg", ""},
+                                                      {true, "opened/a.bmp", "opened"},
+                                                      {false, "saved/c.jpg", "saved"}};
+  for (const auto& [open, file, startsIn] : steps) {
+    WhileModal(
+        [&, open = open] {
+          open ? real.OpenPictureDialog("*.bmp|*.bmp") : real.SavePictureDialog("*.jpg|*.jpg");
+        },
+        [&, file = file, startsIn = startsIn](QDialog* d) {
+          auto* dialog = qobject_cast<QFileDialog*>(d);
+          if (!startsIn.isEmpty()) {
+            EXPECT_EQ(dialog->directory().path(), Path(startsIn));
+          }
+          QHeaderView* header = dialog->findChild<QTreeView*>("treeView")->header();
+          for (int i = 0; i < header->count(); ++i)
+            EXPECT_GT(header->sectionSize(i),
+                      header->fontMetrics().horizontalAdvance(
+                          header->model()->headerData(i, Qt::Horizontal).toString()));
+          dialog->selectFile(Path(file));
+          QMetaObject::invokeMethod(dialog, "accept");
+        });
+  }
+  EXPECT_EQ(ProgramSettings().value("dialogs/saveFolder").toString(), Path("saved"));
 }
 
 TEST(QtMessages, AMessageRepeatedAThousandTimesIsWrittenAFewTimes) {
   static int written = 0;
-  written = 0;
   qInstallMessageHandler([](QtMsgType, const QMessageLogContext&, const QString&) { ++written; });
   LimitRepeatedQtMessages(5);
   for (int i = 0; i < 1000; ++i) qWarning("QBuffer::seek: Invalid pos: %d", 100000 + i);
   qWarning("another kind of message");
   qInstallMessageHandler(nullptr);
-  EXPECT_EQ(written, 5 + 1 + 1);  // five, the line saying the rest is not shown, the other one
+  EXPECT_EQ(written, 5 + 1 + 1);  // five, the line saying the rest are not shown, the other one
 }
 
 }  // namespace
