@@ -41,6 +41,8 @@ if [ "$gui" = 1 ]; then
     [ -s "$root/share/icons/hicolor/${size}x${size}/apps/$id.png" ] || fail "icon ${size}"
   done
   [ -s "$root/share/icons/hicolor/scalable/apps/$id.svg" ] || fail "scalable icon"
+  QT_QPA_PLATFORM=offscreen "$root/bin/quillane" --version | grep -q '^Quillane [0-9]' ||
+    fail "the installed quillane does not start"
 fi
 
 # The installed command line, started from the staging folder, reading a Windows metafile with
