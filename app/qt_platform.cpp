@@ -13,9 +13,9 @@
 #include <QMessageBox>
 #include <QProcess>
 #include <QStandardPaths>
-#include <QStyle>
 #include <QTreeView>
 #include <QUrl>
+#include <algorithm>
 
 #include "app/settings.h"
 
@@ -57,16 +57,10 @@ void ShowWholeColumnTitles(QFileDialog& dialog) {
   dialog.resize(dialog.size().expandedTo(QSize(800, 500)));
   auto* view = dialog.findChild<QTreeView*>("treeView");
   if (view == nullptr || view->model() == nullptr) return;
+  // Each column at least as wide as its title with its margins and sort arrow needs.
   QHeaderView* header = view->header();
-  const QStyle* style = header->style();
-  // Room for the margins either side of the text and the sort arrow.
-  const int room = 2 * style->pixelMetric(QStyle::PM_HeaderMargin, nullptr, header) +
-                   style->pixelMetric(QStyle::PM_HeaderMarkSize, nullptr, header) + 8;
-  for (int i = 0; i < header->count(); ++i) {
-    const QString title = view->model()->headerData(i, Qt::Horizontal).toString();
-    const int needed = header->fontMetrics().horizontalAdvance(title) + room;
-    if (header->sectionSize(i) < needed) header->resizeSection(i, needed);
-  }
+  for (int i = 0; i < header->count(); ++i)
+    header->resizeSection(i, std::max(header->sectionSize(i), header->sectionSizeHint(i)));
 }
 
 // The open dialog shows a small preview of the file under the cursor, as the picture dialogs of
