@@ -8,13 +8,14 @@ FUZZ_BUILD ?= build-fuzz
 FUZZ_SECONDS ?= 20
 GALLERY ?= gallery
 JOBS ?= $(shell nproc)
+PREFIX ?= /usr/local
 
 PACKAGES := build-essential cmake pkg-config clang libclang-rt-14-dev clang-format \
 	qt6-base-dev qt6-svg-dev qt6-qpa-plugins libgl-dev fonts-dejavu-core \
 	libjpeg62-turbo-dev libpng-dev libgtest-dev libgmock-dev libbenchmark-dev libwmf-dev libemf2svg-dev \
 	xdg-utils libzstd-dev
 
-.PHONY: all deps build run test test-asan fuzz bench format clean
+.PHONY: all deps build run install test test-asan fuzz bench format clean
 
 all: build
 
@@ -39,9 +40,12 @@ run: build
 	  exec $(BUILD)/app/quillane; \
 	else \
 	  echo "No display found: writing the built-in picture through every effect into $(GALLERY)/"; \
-	  $(BUILD)/cli/quillane-cli gallery $(GALLERY) && \
-	  echo "Open $(GALLERY)/index.html in a browser to see them side by side."; \
+	  $(BUILD)/cli/quillane-cli gallery $(GALLERY); \
 	fi
+
+# Into PREFIX (/usr/local unless given); DESTDIR=/some/stage stages it there instead.
+install: build
+	DESTDIR="$(DESTDIR)" cmake --install $(BUILD) --prefix $(PREFIX)
 
 test: build
 	cd $(BUILD) && ctest --output-on-failure -j $(JOBS)

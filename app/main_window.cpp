@@ -12,6 +12,7 @@
 #include <QToolButton>
 #include <iterator>
 
+#include "app/app_icon.h"
 #include "batch/batch_convert_ok.h"
 #include "data/startup_picture.h"
 #include "ui/glyphs.h"
@@ -68,6 +69,7 @@ TMyPicture::TMyPicture(PlatformServices& platform, TBitmap32 picture)
     : platform_(platform), document_(std::move(picture)), toolWindows_(Effects().size() + 1) {
   setObjectName("TMyPicture");
   setWindowTitle("Quillane v" QUILLANE_VERSION);
+  setWindowIcon(ApplicationIcon());
 
   auto* central = new QWidget(this);
   central->setObjectName("centralWidget");
@@ -75,6 +77,7 @@ TMyPicture::TMyPicture(PlatformServices& platform, TBitmap32 picture)
   BuildMenus();
   BuildToolbar(central);
   BuildView(central);
+  AddDesktopActions();
 
   statusLine_ = new QLabel("New picture", central);
   statusLine_->setObjectName("Label1");

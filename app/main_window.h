@@ -19,6 +19,8 @@
 #include "ui/tool_host.h"
 
 class QAction;
+class QDragEnterEvent;
+class QDropEvent;
 class QLabel;
 class QMenu;
 class QScrollArea;
@@ -63,6 +65,12 @@ class TMyPicture : public QMainWindow, public ToolHost {
   // True while ApplyEffect waits for its routine; a second apply meanwhile is ignored.
   bool EffectRunning() const { return effectRunning_; }
   void SetWorkingPicture(TBitmap32 picture, bool recordHistory) override;
+
+  // Opens the picture file at path as File > Open does once a file is chosen (a file that
+  // cannot be read is reported and changes nothing), and puts it first in the recent list.
+  bool OpenPictureFile(const QString& path);
+  // The pictures opened last, most recent first (at most ten), as File > Open Recent lists them.
+  QStringList RecentFiles() const;
 
   // The history step after a tool has written the working picture.
   void backup();
@@ -162,8 +170,18 @@ class TMyPicture : public QMainWindow, public ToolHost {
   void closeEvent(QCloseEvent* event) override;
   // Installed on the application: the mouse wheel over the picture, and the mouse on Image1.
   bool eventFilter(QObject* watched, QEvent* event) override;
+  // A single picture file dropped on the window is opened.
+  void dragEnterEvent(QDragEnterEvent* event) override;
+  void dropEvent(QDropEvent* event) override;
 
  private:
+  // The standard shortcuts, Alt-letter menu access, Open Recent and drag and drop.
+  void AddDesktopActions();
+  void FillRecentMenu();
+  void RememberRecent(const QString& path);
+  // A recent-list entry: opened, or taken off the list with a message when it is gone.
+  void OpenRecentFile(const QString& path);
+
   void BuildMenus();
   void BuildToolbar(QWidget* central);
   void BuildView(QWidget* central);
@@ -227,6 +245,7 @@ class TMyPicture : public QMainWindow, public ToolHost {
     int vertical = 0;
   } panning_;
   int ctrlWheelRest_ = 0;  // Ctrl+wheel turn not yet a whole notch
+  QMenu* recentMenu_ = nullptr;
 };
 
 }  // namespace quillane

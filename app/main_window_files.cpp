@@ -22,30 +22,36 @@ void TMyPicture::SpeedButton1Click() {
   closetool();
   const std::optional<FileChoice> choice = platform_.OpenPictureDialog(kOpenFilter);
   if (!choice) return;
+  OpenPictureFile(choice->path);
+}
 
+bool TMyPicture::OpenPictureFile(const QString& path) {
   // Decoded once into a bitmap of its own: a file that cannot be read leaves the document as
   // it was.
   std::optional<TBitmap32> picture;
   try {
     picture = LoadPictureFile(
-        LocalPath(choice->path), [this](const std::string& caption, const std::string& text) {
+        LocalPath(path), [this](const std::string& caption, const std::string& text) {
           platform_.ShowMessage(QString::fromStdString(caption), QString::fromStdString(text));
         });
   } catch (const std::exception& e) {
     platform_.ShowError(QString::fromStdString(e.what()));
-    return;
+    return false;
   }
   if (!picture || picture->Empty()) {
-    platform_.ShowMessage("Sorry", choice->path + " is not a valid format");
-    return;
+    platform_.ShowMessage("Sorry", path + " is not a valid format");
+    return false;
   }
   const int width = picture->Width(), height = picture->Height();
   try {
     ShowNewPicture(std::move(*picture), true);
   } catch (const std::bad_alloc&) {
-    platform_.ShowError(choice->path + " " +
+    platform_.ShowError(path + " " +
                         QString::fromStdString(MemoryNeedText(OperationBytes(width, height))));
+    return false;
   }
+  RememberRecent(path);
+  return true;
 }
 
 void TMyPicture::SpeedButton2Click() {

@@ -6,17 +6,62 @@
 #include <QFileDialog>
 #include <QFileInfo>
 #include <QGridLayout>
+#include <QHeaderView>
 #include <QImageReader>
 #include <QLabel>
+#include <QMainWindow>
 #include <QMessageBox>
 #include <QPrintDialog>
+#include <QProcess>
+#include <QStandardPaths>
+#include <QTreeView>
 #include <QUrl>
+#include <algorithm>
+
+#include "app/settings.h"
 
 namespace quillane {
 namespace {
 
+const QString kOpenFolderKey = QStringLiteral("dialogs/openFolder");
+const QString kSaveFolderKey = QStringLiteral("dialogs/saveFolder");
+
+// A message box or dialog belongs to the window the user is working in (a tool window when its
+// button raised it), so it is centred on that window and kept above it; with no window active
+// (at start-up, or while another program has the focus) it belongs to the main window.
 QWidget* DialogOwner() {
-  return QApplication::activeWindow();
+  if (QWidget* modal = QApplication::activeModalWidget()) return modal;
+  if (QWidget* active = QApplication::activeWindow()) return active;
+  for (QWidget* top : QApplication::topLevelWidgets())
+    if (qobject_cast<QMainWindow*>(top) != nullptr && top->isVisible()) return top;
+  return nullptr;
+}
+
+// Each picture dialog opens in the folder it was last used in, remembered between runs; the
+// first time in the user's pictures folder, or at home.
+void StartInRememberedFolder(QFileDialog& dialog, const QString& key) {
+  QString folder = ProgramSettings().value(key).toString();
+  if (folder.isEmpty() || !QFileInfo(folder).isDir())
+    folder = QStandardPaths::writableLocation(QStandardPaths::PicturesLocation);
+  if (folder.isEmpty() || !QFileInfo(folder).isDir()) folder = QDir::homePath();
+  dialog.setDirectory(folder);
+}
+
+void RememberFolder(const QFileDialog& dialog, const QString& key) {
+  QSettings settings = ProgramSettings();
+  settings.setValue(key, dialog.directory().absolutePath());
+}
+
+// The file list in details, wide enough that no column title is cut short.
+void ShowWholeColumnTitles(QFileDialog& dialog) {
+  dialog.setViewMode(QFileDialog::Detail);
+  dialog.resize(dialog.size().expandedTo(QSize(800, 500)));
+  auto* view = dialog.findChild<QTreeView*>("treeView");
+  if (view == nullptr || view->model() == nullptr) return;
+  // Each column at least as wide as its title with its margins and sort arrow needs.
+  QHeaderView* header = view->header();
+  for (int i = 0; i < header->count(); ++i)
+    header->resizeSection(i, std::max(header->sectionSize(i), header->sectionSizeHint(i)));
 }
 
 // The open dialog shows a small preview of the file under the cursor, as the picture dialogs of
@@ -94,12 +139,15 @@ std::optional<FileChoice> QtPlatformServices::OpenPictureDialog(const QString& f
   dialog.setFileMode(QFileDialog::ExistingFile);
   const QStringList filters = NameFiltersFromPairs(filter);
   dialog.setNameFilters(filters);
+  StartInRememberedFolder(dialog, kOpenFolderKey);
+  ShowWholeColumnTitles(dialog);
   if (auto* grid = qobject_cast<QGridLayout*>(dialog.layout())) {
     auto* preview = new PreviewLabel(&dialog);
     grid->addWidget(preview, 1, grid->columnCount(), 1, 1, Qt::AlignTop);
     QObject::connect(&dialog, &QFileDialog::currentChanged, preview, &PreviewLabel::ShowFile);
   }
   if (dialog.exec() != QDialog::Accepted || dialog.selectedFiles().isEmpty()) return std::nullopt;
+  RememberFolder(dialog, kOpenFolderKey);
   return FileChoice{dialog.selectedFiles().first(),
                     FilterIndexOf(filters, dialog.selectedNameFilter())};
 }
@@ -113,7 +161,10 @@ std::optional<FileChoice> QtPlatformServices::SavePictureDialog(const QString& f
   dialog.setOption(QFileDialog::DontConfirmOverwrite);
   const QStringList filters = NameFiltersFromPairs(filter);
   dialog.setNameFilters(filters);
+  StartInRememberedFolder(dialog, kSaveFolderKey);
+  ShowWholeColumnTitles(dialog);
   if (dialog.exec() != QDialog::Accepted || dialog.selectedFiles().isEmpty()) return std::nullopt;
+  RememberFolder(dialog, kSaveFolderKey);
   return FileChoice{dialog.selectedFiles().first(),
                     FilterIndexOf(filters, dialog.selectedNameFilter())};
 }
@@ -137,8 +188,26 @@ std::optional<std::uint32_t> QtPlatformServices::ChooseColor(std::uint32_t initi
          (static_cast<std::uint32_t>(chosen.blue()) << 16);
 }
 
-void QtPlatformServices::OpenFolder(const QString& folder) {
-  QDesktopServices::openUrl(QUrl::fromLocalFile(folder));
+bool QtPlatformServices::OpenFolder(const QString& folder) {
+  const QString opener = QStandardPaths::findExecutable("xdg-open");
+  if (opener.isEmpty()) return QDesktopServices::openUrl(QUrl::fromLocalFile(folder));
+  // xdg-open answers at once when the desktop has a file manager to hand the folder to, and
+  // fails when it finds none. Without a desktop it may run the file manager itself until that
+  // closes: still running after a moment means it did start one, and it is left running.
+  auto* process = new QProcess;
+  process->setProgram(opener);
+  process->setArguments({folder});
+  process->setStandardOutputFile(QProcess::nullDevice());
+  process->setStandardErrorFile(QProcess::nullDevice());
+  QObject::connect(process, &QProcess::finished, process, &QObject::deleteLater);
+  process->start();
+  if (!process->waitForStarted()) {
+    delete process;
+    return false;
+  }
+  constexpr int kAnswerMilliseconds = 3000;
+  if (!process->waitForFinished(kAnswerMilliseconds)) return true;
+  return process->exitStatus() == QProcess::NormalExit && process->exitCode() == 0;
 }
 
 bool QtPlatformServices::PrintDialog(QPrinter& printer) {

@@ -16,7 +16,7 @@ class QtPlatformServices : public PlatformServices {
   std::optional<FileChoice> SavePictureDialog(const QString& filter) override;
   std::optional<QString> BrowseFolder(const QString& title, const QString& startFolder) override;
   std::optional<std::uint32_t> ChooseColor(std::uint32_t initial) override;
-  void OpenFolder(const QString& folder) override;
+  bool OpenFolder(const QString& folder) override;
   bool PrintDialog(QPrinter& printer) override;
   bool OpenWithDefaultProgram(const QString& path) override;
 };

@@ -12,8 +12,9 @@ namespace quillane {
 
 TBatchConvertOk::TBatchConvertOk(PlatformServices& platform, std::function<QString()> outputFolder,
                                  QWidget* parent)
-    : QDialog(parent, Qt::Dialog | Qt::WindowStaysOnTopHint | Qt::CustomizeWindowHint |
-                          Qt::WindowTitleHint | Qt::WindowCloseButtonHint),
+    // Above its parent, the main window, but not above every other program.
+    : QDialog(parent, Qt::Dialog | Qt::CustomizeWindowHint | Qt::WindowTitleHint |
+                          Qt::WindowCloseButtonHint),
       platform_(platform),
       outputFolder_(std::move(outputFolder)) {
   setObjectName("TBatchConvertOk");
@@ -53,8 +54,11 @@ void TBatchConvertOk::SpeedButton1Click() {
 }
 
 void TBatchConvertOk::SpeedButton2Click() {
-  platform_.OpenFolder(outputFolder_ ? outputFolder_() : QString());
+  const QString folder = outputFolder_ ? outputFolder_() : QString();
   close();
+  if (!platform_.OpenFolder(folder))
+    platform_.ShowMessage("Sorry", "No file manager could be started to show " + folder +
+                                       ". The converted pictures are there.");
 }
 
 }  // namespace quillane

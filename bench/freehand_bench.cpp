@@ -69,7 +69,7 @@ class NoPlatform : public PlatformServices {
   std::optional<FileChoice> SavePictureDialog(const QString&) override { return {}; }
   std::optional<QString> BrowseFolder(const QString&, const QString&) override { return {}; }
   std::optional<std::uint32_t> ChooseColor(std::uint32_t) override { return {}; }
-  void OpenFolder(const QString&) override {}
+  bool OpenFolder(const QString&) override { return false; }
   bool PrintDialog(QPrinter&) override { return false; }
   bool OpenWithDefaultProgram(const QString&) override { return false; }
 };

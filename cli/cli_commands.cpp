@@ -13,6 +13,7 @@
 #include <vector>
 
 #include "batch/batch_convert.h"
+#include "cli/cli_docs.h"
 #include "codecs/picture_file.h"
 #include "data/startup_picture.h"
 #include "document/reshape.h"
@@ -535,6 +536,12 @@ int RunCommand(const Options& options, std::ostream& out, std::ostream& err, boo
     case Command::Resize:
     case Command::Convert:
       return PictureCommand(options, out, err);
+    case Command::Manpage:
+      out << ManPageText();
+      return kExitOk;
+    case Command::Completion:
+      out << BashCompletionText();
+      return kExitOk;
   }
   return kExitUsage;
 }

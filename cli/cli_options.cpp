@@ -358,6 +358,10 @@ ParseResult ParseCommandLine(const std::vector<std::string>& args) {
     if (args.size() > 1) return Fail("list takes no arguments");
     return Plain(Command::List);
   }
+  if (verb == "manpage" || verb == "completion") {
+    if (args.size() > 1) return Fail(verb + " takes no arguments");
+    return Plain(verb == "manpage" ? Command::Manpage : Command::Completion);
+  }
   if (verb == "apply") return ParseEffectCommand(Command::Apply, args);
   if (verb == "batch") return ParseEffectCommand(Command::Batch, args);
   if (verb == "gallery") return ParseGallery(args);
@@ -380,6 +384,7 @@ std::string UsageText() {
   quillane-cli rotate cw|ccw INPUT -o OUTPUT
   quillane-cli resize WIDTH HEIGHT INPUT -o OUTPUT
   quillane-cli convert INPUT -o OUTPUT
+  quillane-cli manpage | completion
   quillane-cli --help | --version
 
 Turns photographs into artwork with the effects of Quillane, without a window.
@@ -401,6 +406,9 @@ Turns photographs into artwork with the effects of Quillane, without a window.
            nearest-pixel resampling (a side can come out one pixel short: 400 of 521
            gives 399)
   convert  the picture saved in the type OUTPUT's extension names
+  manpage  this text and the list of effects as a manual page (roff)
+  completion
+           a bash completion script for the commands, effects and options
 
 INPUT may be a .jpg, .jpeg, .bmp, .ico, .gif, .wmf, .emf or .png file. Parameters take
 the values "list" shows (whole numbers within their ranges, words, lists, colours);

@@ -18,7 +18,11 @@ enum ExitCode {
   kExitUsage = 2,   // unknown command, effect or option; a bad or out-of-range value
 };
 
-enum class Command { Help, Version, List, Apply, Batch, Gallery, Rotate, Resize, Convert };
+// Manpage and Completion write the manual page and the bash completion script, both made from
+// the same effect table as List, so they cannot fall behind it.
+enum class Command {
+  Help, Version, List, Apply, Batch, Gallery, Rotate, Resize, Convert, Manpage, Completion
+};
 
 struct Options {
   Command command = Command::Help;

@@ -97,7 +97,11 @@ std::string FindRenderer(const char* environmentVariable, const char* programNam
     const std::string beside = (self.parent_path() / programName).string();
     if (::access(beside.c_str(), X_OK) == 0) return beside;
   }
-  if (builtPath != nullptr && ::access(builtPath, X_OK) == 0) return builtPath;
+  // The build tree's copy serves only the programs and tests that run from the build tree: an
+  // installed program never reaches back into the folder it was built in.
+  const std::string buildTree = QUILLANE_BUILD_TREE "/";
+  const bool inBuildTree = error || self.string().compare(0, buildTree.size(), buildTree) == 0;
+  if (inBuildTree && builtPath != nullptr && ::access(builtPath, X_OK) == 0) return builtPath;
   return {};
 }
 

@@ -12,7 +12,8 @@
 namespace quillane::codecs {
 
 // The program named by the environment variable when that is set; otherwise the program beside
-// the running one (an installed program), then the copy in the build tree. "" when none can run.
+// the running one (an installed program), then, for a program running from the build tree, the
+// copy built there. "" when none can run.
 std::string FindRenderer(const char* environmentVariable, const char* programName,
                          const char* builtPath);
 

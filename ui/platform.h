@@ -45,8 +45,8 @@ class PlatformServices {
   // The colour dialog, colours as 0x00BBGGRR (red in the lowest byte).
   virtual std::optional<std::uint32_t> ChooseColor(std::uint32_t initial) = 0;
 
-  // Shows folder in the desktop's file manager.
-  virtual void OpenFolder(const QString& folder) = 0;
+  // Shows folder in the desktop's file manager. False when no file manager could be started.
+  virtual bool OpenFolder(const QString& folder) = 0;
 
   // The print dialog for printer: false when the user cancels; otherwise the chosen printer,
   // page and resolution are set in printer.

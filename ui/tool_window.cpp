@@ -3,6 +3,7 @@
 #include <QCloseEvent>
 #include <QGridLayout>
 #include <QHBoxLayout>
+#include <QKeyEvent>
 #include <QLabel>
 #include <QLineEdit>
 #include <QPushButton>
@@ -24,8 +25,10 @@ constexpr int kMinimumHeight = 90;
 }  // namespace
 
 ToolWindow::ToolWindow(const EffectSpec& spec, ToolHost& host, QWidget* parent)
-    : QWidget(parent, Qt::Tool | Qt::WindowStaysOnTopHint | Qt::CustomizeWindowHint |
-                          Qt::WindowTitleHint | Qt::WindowCloseButtonHint),
+    // A tool window of its parent, the main window: it floats above that window only, so the
+    // dialogs of the program and every other program's windows can come on top of it.
+    : QWidget(parent,
+              Qt::Tool | Qt::CustomizeWindowHint | Qt::WindowTitleHint | Qt::WindowCloseButtonHint),
       spec_(spec),
       host_(host) {
   setObjectName(QString::fromStdString(spec.windowClass));
@@ -127,6 +130,9 @@ void ToolWindow::BuildBatchPanel(QBoxLayout* outer) {
       addRow(1, "Label7", "Output:", spec_.outputField.c_str(), "SpeedButton3");
   inputField_ = input;
   outputField_ = output;
+  // A long folder does not fit the field; its tooltip shows the whole of it.
+  for (QLineEdit* field : {input, output})
+    connect(field, &QLineEdit::textChanged, field, &QLineEdit::setToolTip);
   connect(browseIn, &QToolButton::clicked, this, &ToolWindow::SpeedButton2Click);
   connect(browseOut, &QToolButton::clicked, this, &ToolWindow::SpeedButton3Click);
 
@@ -207,6 +213,26 @@ void ToolWindow::showEvent(QShowEvent* event) {
   QWidget::showEvent(event);
   // Only the program's own show counts, not the window system restoring the window.
   if (!event->spontaneous()) FormShow();
+}
+
+void ToolWindow::keyPressEvent(QKeyEvent* event) {
+  // As in a dialog: Enter presses the apply button, Escape closes the window.
+  switch (event->key()) {
+    case Qt::Key_Return:
+    case Qt::Key_Enter:
+      if (auto* apply = findChild<QPushButton*>(QString::fromStdString(spec_.apply.objectName));
+          apply != nullptr && !spec_.apply.objectName.empty() && apply->isEnabled()) {
+        apply->click();
+        return;
+      }
+      break;
+    case Qt::Key_Escape:
+      close();
+      return;
+    default:
+      break;
+  }
+  QWidget::keyPressEvent(event);
 }
 
 void ToolWindow::closeEvent(QCloseEvent* event) {

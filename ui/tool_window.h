@@ -88,6 +88,7 @@ class ToolWindow : public QWidget {
 
   void showEvent(QShowEvent* event) override;
   void closeEvent(QCloseEvent* event) override;
+  void keyPressEvent(QKeyEvent* event) override;
 
  private:
   void BuildButtonRow(QBoxLayout* outer);

@@ -8,7 +8,9 @@
 #include <QMenuBar>
 #include <QMouseEvent>
 #include <QPointingDevice>
+#include <QSettings>
 #include <QString>
+#include <QTemporaryDir>
 #include <memory>
 
 #include "app/main_window.h"
@@ -23,20 +25,31 @@ inline QApplication& Application() {
   static char name[] = "gui_tests";
   static char* argv[] = {name, nullptr};
   // The toolkit's list of input devices, made before the application object so that it is
-  // gone only after it: the default keyboard and mouse that key clicks and menus create belong
-  // to the application and take themselves off that list when it is destroyed at exit.
+  // gone only after it.
   QInputDevice::devices();
-  static QApplication app(argc, argv);
+  // Never destroyed: the input devices that window activation and key clicks create are
+  // registered in a list of the toolkit's that static destruction removes before a static
+  // application object, whose end would then crash deleting them.
+  static QApplication& app = *new QApplication(argc, argv);
+  // What the windows remember between runs (recent pictures, dialog folders) goes to a folder
+  // of the test program's own, never to the user's settings.
+  static QTemporaryDir settings;
+  static const bool settingsMoved = [] {
+    for (QSettings::Format format : {QSettings::NativeFormat, QSettings::IniFormat})
+      QSettings::setPath(format, QSettings::UserScope, settings.path());
+    return true;
+  }();
+  (void)settingsMoved;
   return app;
 }
 
-// One device of the tests' own for every synthesized mouse event of the program: the
-// toolkit's default one outlives the application object, and a second static one crashes when
-// the program exits.
+// One device of the tests' own for every synthesized mouse event of the program. Like the
+// application object it is never destroyed: the toolkit's default one outlives the application
+// object, and a second static one crashes when the program exits.
 inline const QPointingDevice& TestMouse() {
-  static const QPointingDevice mouse("test mouse", 1, QInputDevice::DeviceType::Mouse,
-                                     QPointingDevice::PointerType::Generic,
-                                     QInputDevice::Capability::Position, 1, 3);
+  static const QPointingDevice& mouse = *new QPointingDevice(
+      "test mouse", 1, QInputDevice::DeviceType::Mouse, QPointingDevice::PointerType::Generic,
+      QInputDevice::Capability::Position, 1, 3);
   return mouse;
 }
 

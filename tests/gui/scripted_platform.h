@@ -35,6 +35,7 @@ class ScriptedPlatform : public PlatformServices {
   std::vector<QString> openedFolders;
   int printDialogs = 0;
   std::vector<QString> openedFiles;
+  bool fileManagerStarts = true;  // what OpenFolder answers
 
   std::deque<std::optional<FileChoice>> openAnswers;
   std::deque<std::optional<FileChoice>> saveAnswers;
@@ -64,7 +65,10 @@ class ScriptedPlatform : public PlatformServices {
     colorRequests.push_back(initial);
     return Next(colorAnswers);
   }
-  void OpenFolder(const QString& folder) override { openedFolders.push_back(folder); }
+  bool OpenFolder(const QString& folder) override {
+    openedFolders.push_back(folder);
+    return fileManagerStarts;
+  }
   bool PrintDialog(QPrinter& printer) override {
     ++printDialogs;
     if (printAnswers.empty()) return false;

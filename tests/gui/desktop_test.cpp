@@ -1,0 +1,238 @@
+// The main window as a desktop program: keyboard, menus, drag and drop, the recent list, the
+// place of its tool windows, and the boxes and dialogs of the real platform.
+#include <QFileDialog>
+#include <QHeaderView>
+#include <QLineEdit>
+#include <QMessageBox>
+#include <QMimeData>
+#include <QSignalSpy>
+#include <QTest>
+#include <QTimer>
+#include <QToolButton>
+#include <QTreeView>
+#include <functional>
+
+#include "app/qt_messages.h"
+#include "app/qt_platform.h"
+#include "app/settings.h"
+#include "batch/batch_convert_ok.h"
+#include "codecs/picture_file.h"
+#include "tests/gui/temp_folder.h"
+
+namespace quillane {
+namespace {
+
+class Desktop : public FileGuiTest {
+ protected:
+  void SetUp() override {
+    FileGuiTest::SetUp();
+    ProgramSettings().clear();
+    Activate(&Main());
+  }
+  static void Activate(QWidget* window) {
+    window->activateWindow();
+    QCoreApplication::processEvents();
+    ASSERT_EQ(QApplication::activeWindow(), window);
+  }
+  // A bitmap file width pixels wide in the test's folder.
+  QString Picture(const QString& name, int width) {
+    SaveBitmap24(TestPicture(width, 3), LocalPath(name));
+    return Path(name);
+  }
+  QMenu* RecentMenu(TMyPicture& window) {
+    return window.menuBar()->findChild<QMenu*>("OpenRecent1");
+  }
+  static QStringList Entries(QMenu* menu) {
+    QStringList paths;
+    for (QAction* a : menu->actions()) paths << a->data().toString();
+    return paths;
+  }
+};
+
+TEST_F(Desktop, StandardShortcutsRunTheirCommands) {
+  ASSERT_TRUE(Main().ApplyEffect(Giving(TestPicture(5, 5), "Effect"), {}, true));
+  QSignalSpy print(MainChild<QToolButton>("SpeedButton10"), &QToolButton::clicked);
+  QSignalSpy closed(&Main(), &TMyPicture::closed);
+  const std::pair<QKeyCombination, std::function<bool()>> cases[] = {
+      {Qt::CTRL | Qt::Key_O, [&] { return platform_.openFilters.size() == 1; }},
+      {Qt::CTRL | Qt::Key_S, [&] { return platform_.saveFilters.size() == 1; }},
+      {Qt::CTRL | Qt::Key_Z, [&] { return Main().StatusText() == "Undo"; }},
+      {Qt::CTRL | Qt::SHIFT | Qt::Key_Z, [&] { return Main().StatusText() == "Redo"; }},
+      {Qt::CTRL | Qt::Key_P, [&] { return print.count() == 1; }},
+      {Qt::CTRL | Qt::Key_Q, [&] { return closed.count() == 1; }},
+  };
+  for (const auto& [keys, done] : cases) {
+    SCOPED_TRACE(QKeySequence(keys).toString().toStdString());
+    EXPECT_FALSE(done());
+    QTest::keyClick(&Main(), keys.key(), keys.keyboardModifiers());
+    EXPECT_TRUE(done());
+  }
+  EXPECT_EQ(MenuAction("Exit1")->shortcut(), QKeySequence(Qt::CTRL | Qt::Key_Q));  // shown
+}
+
+TEST_F(Desktop, MenusOpenWithAltLettersAndShowTheirCaptionsUnchanged) {
+  const std::tuple<const char*, QString, Qt::Key> cases[] = {
+      {"File1", " File", Qt::Key_F},
+      {"Edit1", " Edit", Qt::Key_E},
+      {"BW1", " B&W", Qt::Key_B},
+      {"Color1", " Color", Qt::Key_C},
+      {"ColorAdjust1", " ColorAdjust", Qt::Key_A},
+      {"Veins1", " Veins", Qt::Key_V},
+      {"Help1", " Help", Qt::Key_H}};
+  for (const auto& [name, shown, letter] : cases) {
+    const QString title = Main().menuBar()->findChild<QMenu*>(name)->title();
+    EXPECT_EQ(QKeySequence::mnemonic(title), QKeySequence(Qt::ALT | letter)) << name;
+    EXPECT_EQ(QString(title).replace("&&", "\x01").remove('&').replace('\x01', '&'), shown);
+  }
+}
+
+TEST_F(Desktop, ADroppedPictureFileOpensAsFileOpenDoes) {
+  const QString picture = Picture("dropped.bmp", 7);
+  Main().OpenTool(15);
+  auto drop = [&](const QList<QUrl>& urls) {
+    QMimeData data;
+    data.setUrls(urls);
+    QDragEnterEvent enter(QPoint(50, 50), Qt::CopyAction, &data, Qt::LeftButton, Qt::NoModifier);
+    QCoreApplication::sendEvent(&Main(), &enter);
+    QDropEvent dropped(QPointF(50, 50), Qt::CopyAction, &data, Qt::LeftButton, Qt::NoModifier);
+    QCoreApplication::sendEvent(&Main(), &dropped);
+    return enter.isAccepted();
+  };
+  EXPECT_FALSE(drop({QUrl::fromLocalFile(picture), QUrl::fromLocalFile(picture)}));
+  EXPECT_EQ(Main().ActiveTool(), 15);
+  EXPECT_TRUE(drop({QUrl::fromLocalFile(picture)}));
+  EXPECT_EQ(Main().Document().Opened().Width(), 7);
+  EXPECT_EQ(Main().ActiveTool(), 0);
+  EXPECT_EQ(Main().RecentFiles(), QStringList{picture});
+}
+
+TEST_F(Desktop, OpenRecentListsTheLastTenPicturesNewestFirst) {
+  QStringList opened;
+  for (int i = 1; i <= 12; ++i) {
+    opened.prepend(Picture(QString("p%1.bmp").arg(i), i));
+    ASSERT_TRUE(Main().OpenPictureFile(opened.first()));
+  }
+  ASSERT_TRUE(Main().OpenPictureFile(opened[5]));  // p7 again: back to the top, once
+  QStringList expected = opened.mid(0, 10);
+  expected.move(5, 0);
+  EXPECT_EQ(Entries(RecentMenu(Main())), expected);
+  // A window started later offers the same list, and an entry opens its picture.
+  ScriptedPlatform otherPlatform;
+  TMyPicture other(otherPlatform, TestPicture());
+  ASSERT_EQ(Entries(RecentMenu(other)), expected);
+  RecentMenu(other)->actions()[2]->trigger();
+  EXPECT_EQ(other.Document().Opened().Width(), 11);  // p11.bmp
+}
+
+TEST_F(Desktop, AMissingRecentPictureIsDroppedWithAMessage) {
+  const QString kept = Picture("kept.bmp", 4), gone = Picture("gone.bmp", 6);
+  ASSERT_TRUE(Main().OpenPictureFile(kept));
+  ASSERT_TRUE(Main().OpenPictureFile(gone));
+  ASSERT_TRUE(QFile::remove(gone));
+  RecentMenu(Main())->actions()[0]->trigger();
+  EXPECT_EQ(platform_.messages,
+            (std::vector<ScriptedPlatform::Message>{
+                {"Sorry", gone + " no longer exists; it was taken off the recent list."}}));
+  EXPECT_EQ(Entries(RecentMenu(Main())), QStringList{kept});
+  EXPECT_EQ(Main().Document().Opened().Width(), 6);
+}
+
+TEST_F(Desktop, ToolWindowsFloatAboveTheMainWindowOnly) {
+  std::vector<QWidget*> windows{&Main().BatchConvertOk()};
+  for (int number = 1; number <= 17; ++number) windows.push_back(&Tool(number));
+  for (QWidget* window : windows) {
+    SCOPED_TRACE(window->objectName().toStdString());
+    EXPECT_FALSE(window->windowFlags().testFlag(Qt::WindowStaysOnTopHint));
+    EXPECT_EQ(window->parentWidget(), &Main());
+  }
+  EXPECT_EQ(Tool(1).windowFlags() & Qt::WindowType_Mask, Qt::Tool);
+}
+
+TEST_F(Desktop, ToolWindowKeysAndBatchFieldTooltips) {
+  Main().SetInputFolder(Path(QString(120, 'x')));
+  Main().OpenTool(15);
+  EXPECT_EQ(ToolChild<QLineEdit>(15, "Edit10")->toolTip(), Path(QString(120, 'x')));
+  QTest::keyClick(&Tool(15), Qt::Key_Return);
+  EXPECT_EQ(Main().StatusText(), "Emboss");
+  QTest::keyClick(&Tool(15), Qt::Key_Escape);
+  EXPECT_FALSE(Tool(15).isVisible());
+  EXPECT_EQ(Main().ActiveTool(), 0);
+}
+
+TEST_F(Desktop, GoOutputFolderSaysSoWhenNoFileManagerStarts) {
+  Main().SetOutputFolder(Path("out"));
+  platform_.fileManagerStarts = false;
+  Main().BatchConvertOk().SpeedButton2Click();
+  EXPECT_EQ(platform_.openedFolders, std::vector<QString>{Path("out")});
+  ASSERT_EQ(platform_.messages.size(), 1u);
+  EXPECT_TRUE(platform_.messages[0].text.startsWith("No file manager could be started to show " +
+                                                    Path("out")));
+}
+
+// Runs raise, which shows a modal dialog of the real platform; answer gets that dialog.
+void WhileModal(const std::function<void()>& raise, const std::function<void(QDialog*)>& answer) {
+  QTimer::singleShot(0, [&] { answer(qobject_cast<QDialog*>(QApplication::activeModalWidget())); });
+  raise();
+}
+
+TEST_F(Desktop, MessageBoxesBelongToTheWindowThatRaisedThem) {
+  QtPlatformServices real;
+  Main().OpenTool(15);
+  const std::pair<QWidget*, std::function<void()>> cases[] = {
+      {&Tool(15), [&] { real.ShowMessage("Sorry", "from the tool window"); }},
+      {&Tool(15), [&] { real.ShowError("an error in the tool window"); }},
+      {&Main(), [&] { real.ShowMessage("Sorry", "from the main window"); }},
+  };
+  for (const auto& [active, raise] : cases) {
+    Activate(active);
+    QWidget* owner = nullptr;
+    WhileModal(raise, [&](QDialog* box) {
+      owner = box->parentWidget();
+      box->done(0);
+    });
+    EXPECT_EQ(owner, active);
+  }
+}
+
+TEST_F(Desktop, OpenAndSaveDialogsRememberTheirOwnFoldersAndShowWholeColumnTitles) {
+  QtPlatformServices real;
+  QDir(Path("")).mkpath("opened");
+  QDir(Path("")).mkpath("saved");
+  Picture("opened/a.bmp", 2);
+  const std::tuple<bool, QString, QString> steps[] = {// open?, file chosen, folder shown first
+                                                      {true, "opened/a.bmp", ""},
+                                                      {false, "saved/b.jpg", ""},
+                                                      {true, "opened/a.bmp", "opened"},
+                                                      {false, "saved/c.jpg", "saved"}};
+  for (const auto& [open, file, startsIn] : steps) {
+    WhileModal(
+        [&, open = open] {
+          open ? real.OpenPictureDialog("*.bmp|*.bmp") : real.SavePictureDialog("*.jpg|*.jpg");
+        },
+        [&, file = file, startsIn = startsIn](QDialog* d) {
+          auto* dialog = qobject_cast<QFileDialog*>(d);
+          if (!startsIn.isEmpty()) {
+            EXPECT_EQ(dialog->directory().path(), Path(startsIn));
+          }
+          QHeaderView* header = dialog->findChild<QTreeView*>("treeView")->header();
+          for (int i = 0; i < header->count(); ++i)
+            EXPECT_GE(header->sectionSize(i), header->sectionSizeHint(i)) << i;
+          dialog->selectFile(Path(file));
+          QMetaObject::invokeMethod(dialog, "accept");
+        });
+  }
+  EXPECT_EQ(ProgramSettings().value("dialogs/saveFolder").toString(), Path("saved"));
+}
+
+TEST(QtMessages, AMessageRepeatedAThousandTimesIsWrittenAFewTimes) {
+  static int written = 0;
+  qInstallMessageHandler([](QtMsgType, const QMessageLogContext&, const QString&) { ++written; });
+  LimitRepeatedQtMessages(5);
+  for (int i = 0; i < 1000; ++i) qWarning("QBuffer::seek: Invalid pos: %d", 100000 + i);
+  qWarning("another kind of message");
+  qInstallMessageHandler(nullptr);
+  EXPECT_EQ(written, 5 + 1 + 1);  // five, the line saying the rest are not shown, the other one
+}
+
+}  // namespace
+}  // namespace quillane
