@@ -5,6 +5,7 @@
 #include "app/main_window.h"
 #include "app/qt_platform.h"
 #include "app/tool_windows.h"
+#include "imaging/picture_memory.h"
 
 namespace {
 
@@ -34,6 +35,7 @@ class Application : public QApplication {
 }  // namespace
 
 int main(int argc, char* argv[]) {
+  quillane::SetUpPictureMemory();
   quillane::QtPlatformServices platform;
   Application app(argc, argv, platform);
   QApplication::setApplicationName("Quillane");
