@@ -1,5 +1,9 @@
 #include "document/document.h"
 
+#include <algorithm>
+
+#include "imaging/picture_memory.h"
+
 namespace quillane {
 
 PictureDocument::PictureDocument(TBitmap32 picture) {
@@ -62,7 +66,11 @@ void PictureDocument::ResetHistory() {
   currentSlot_ = 1;
   undoCount_ = 0;
   redoCount_ = 0;
+  // No step can reach the other slots any more: their pictures are let go, and the memory
+  // kept for pictures of another size goes back to the system with them.
+  std::fill(slots_.begin(), slots_.end(), Share(TBitmap32()));
   slots_[0] = working_;
+  ReleasePictureMemory(working_->PixelCount() * sizeof(Pixel));
 }
 
 }  // namespace quillane
