@@ -1,0 +1,187 @@
+// Every effect on the 12-megapixel photo, as a multiple of a memcpy of the same picture timed in
+// the same process, on one thread and on all of them, and beside it the OpenCV operation doing
+// comparable work on the same picture on one thread (when OpenCV was found). Google Benchmark
+// times each; the medians of the repetitions make one table at the end.
+#include <benchmark/benchmark.h>
+
+#include <cstdio>
+#include <cstring>
+#include <map>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include "bench/synthetic_photo.h"
+#include "effects/registry.h"
+#include "imaging/parallel.h"
+#include "imaging/picture_memory.h"
+
+#ifdef QUILLANE_HAVE_OPENCV
+#include <opencv2/core.hpp>
+#include <opencv2/imgproc.hpp>
+#endif
+
+namespace quillane {
+namespace {
+
+constexpr int kWidth = 4000;
+constexpr int kHeight = 3000;
+
+const TBitmap32& Photo() {
+  static const TBitmap32 photo = bench::SyntheticPhoto(kWidth, kHeight);
+  return photo;
+}
+
+void Memcpy(benchmark::State& state) {
+  const TBitmap32& photo = Photo();
+  TBitmap32 copy(kWidth, kHeight);
+  for (auto _ : state) {
+    std::memcpy(static_cast<void*>(copy.Data()), photo.Data(), photo.PixelCount() * sizeof(Pixel));
+    benchmark::ClobberMemory();
+  }
+}
+
+// The effect as OK runs it: the routine with its defaults, its result a new picture.
+void Effect(benchmark::State& state, const EffectSpec* effect, int threads) {
+  const EffectParams params = effect->Defaults();
+  std::uint32_t seed = 0;
+  SetRowSplit({threads, kParallelThreshold});
+  for (auto _ : state) {
+    const TBitmap32 result = effect->routine({Photo(), Photo(), params, &seed});
+    benchmark::DoNotOptimize(result.Data());
+  }
+  SetRowSplit({});
+}
+
+// The comparable OpenCV operation for each effect; empty where there is none.
+const std::map<std::string, std::string>& Comparable() {
+  static const std::map<std::string, std::string> table{
+      {"pencil-sketch", "Sobel chain"}, {"pen-sketch", "Sobel chain"},
+      {"vuzorar", "Sobel chain"},       {"pen-and-ink", "Sobel chain"},
+      {"realism", "filter2D 3x3"},      {"abstract", "filter2D 3x3"},
+      {"pop-art", "filter2D 3x3"},      {"emboss", "filter2D 3x3"},
+      {"water-color", "medianBlur 3"},  {"color-pencil", "HLS round trip"},
+      {"hsl-adjust", "HLS round trip"}, {"texture", "HLS round trip"},
+  };
+  return table;
+}
+
+#ifdef QUILLANE_HAVE_OPENCV
+cv::Mat PhotoMat() {
+  const TBitmap32& p = Photo();
+  return cv::Mat(kHeight, kWidth, CV_8UC4, const_cast<Pixel*>(p.Data()));
+}
+
+void OpenCv(benchmark::State& state, const std::string& name) {
+  cv::setNumThreads(1);
+  const cv::Mat src = PhotoMat();
+  const cv::Mat kernel = (cv::Mat_<float>(3, 3) << 1, 2, 1, 0, 0, 0, -1, -1, -1);
+  cv::Mat lut(1, 256, CV_8U);
+  for (int i = 0; i < 256; ++i) lut.at<std::uint8_t>(i) = static_cast<std::uint8_t>(255 - i);
+  for (auto _ : state) {
+    cv::Mat out;
+    if (name == "filter2D 3x3") {
+      cv::filter2D(src, out, -1, kernel);
+    } else if (name == "medianBlur 3") {
+      cv::medianBlur(src, out, 3);
+    } else if (name == "HLS round trip") {
+      cv::Mat hls;
+      cv::cvtColor(src, hls, cv::COLOR_BGR2HLS);
+      cv::cvtColor(hls, out, cv::COLOR_HLS2BGR, 4);
+    } else {
+      cv::Mat gray, gx, gy, ax, ay, edges;
+      cv::cvtColor(src, gray, cv::COLOR_BGRA2GRAY);
+      cv::Sobel(gray, gx, CV_16S, 1, 0);
+      cv::Sobel(gray, gy, CV_16S, 0, 1);
+      cv::convertScaleAbs(gx, ax);
+      cv::convertScaleAbs(gy, ay);
+      cv::max(ax, ay, edges);
+      cv::LUT(edges, lut, out);
+    }
+    benchmark::DoNotOptimize(out.data);
+  }
+}
+#endif
+
+// Keeps the median real time of every benchmark, in milliseconds, for the table.
+class MedianReporter : public benchmark::ConsoleReporter {
+ public:
+  std::map<std::string, double> medians;
+  std::map<std::string, double> spreads;  // coefficient of variation, percent
+
+  void ReportRuns(const std::vector<Run>& runs) override {
+    for (const Run& run : runs) {
+      if (run.run_type != Run::RT_Aggregate) continue;
+      const std::string name = run.run_name.function_name;
+      if (run.aggregate_name == "median") medians[name] = run.GetAdjustedRealTime();
+      if (run.aggregate_name == "cv") spreads[name] = 100 * run.real_accumulated_time;
+    }
+    ConsoleReporter::ReportRuns(runs);
+  }
+};
+
+void PrintTable(const MedianReporter& r) {
+  const auto found = [&](const std::string& name) {
+    const auto it = r.medians.find(name);
+    return it == r.medians.end() ? -1.0 : it->second;
+  };
+  const double floor = found("memcpy");
+  if (floor <= 0) return;
+  const unsigned cores = std::max(1u, std::thread::hardware_concurrency());
+  std::printf("\n12-megapixel photo (%d x %d); memcpy of it %.2f ms = 1x (spread %.0f%%).\n",
+              kWidth, kHeight, floor, r.spreads.count("memcpy") ? r.spreads.at("memcpy") : 0.0);
+  std::printf("Medians of the repetitions; x = multiple of that memcpy.\n\n");
+  std::printf("%-15s %9s %7s %9s %7s   %-15s %9s %7s\n", "effect", "1 thread", "x", "", "x",
+              "OpenCV 1 thread", "ms", "x");
+  std::printf("%-15s %9s %7s %6u thr %7s\n", "", "ms", "", cores, "");
+  for (const EffectSpec* e : Effects()) {
+    if (!e->routine) continue;
+    const double one = found("effect/" + e->cliName + "/1");
+    const double all = found("effect/" + e->cliName + "/all");
+    std::printf("%-15s %9.1f %6.1fx %9.1f %6.1fx", e->cliName.c_str(), one, one / floor, all,
+                all / floor);
+    const auto c = Comparable().find(e->cliName);
+    const double theirs = c == Comparable().end() ? -1 : found("opencv/" + c->second);
+    if (theirs > 0)
+      std::printf("   %-15s %9.1f %6.1fx", c->second.c_str(), theirs, theirs / floor);
+    else if (c != Comparable().end())
+      std::printf("   %-15s %9s %7s", c->second.c_str(), "-", "-");
+    std::printf("\n");
+  }
+#ifndef QUILLANE_HAVE_OPENCV
+  std::printf("\nOpenCV was not found when this was built: `make bench` installs it.\n");
+#endif
+}
+
+}  // namespace
+}  // namespace quillane
+
+int main(int argc, char** argv) {
+  using namespace quillane;
+  // The set-up both programs make at start-up, so that the figures are the programs' own.
+  SetUpPictureMemory();
+  const auto add = [](const std::string& name, auto&& fn) {
+    benchmark::RegisterBenchmark(name.c_str(), fn)
+        ->Unit(benchmark::kMillisecond)
+        ->UseRealTime()
+        ->Repetitions(5)
+        ->ReportAggregatesOnly(true);
+  };
+  add("memcpy", Memcpy);
+  for (const EffectSpec* e : Effects()) {
+    if (!e->routine) continue;
+    add("effect/" + e->cliName + "/1", [e](benchmark::State& s) { Effect(s, e, 1); });
+    add("effect/" + e->cliName + "/all", [e](benchmark::State& s) { Effect(s, e, 0); });
+  }
+#ifdef QUILLANE_HAVE_OPENCV
+  for (const char* op : {"Sobel chain", "filter2D 3x3", "medianBlur 3", "HLS round trip"})
+    add(std::string("opencv/") + op, [op](benchmark::State& s) { OpenCv(s, op); });
+#endif
+  benchmark::Initialize(&argc, argv);
+  if (benchmark::ReportUnrecognizedArguments(argc, argv)) return 1;
+  MedianReporter reporter;
+  benchmark::RunSpecifiedBenchmarks(&reporter);
+  PrintTable(reporter);
+  benchmark::Shutdown();
+  return 0;
+}
