@@ -28,6 +28,12 @@ TBitmap32::TBitmap32(int width, int height, Pixel fill) {
 TBitmap32 TBitmap32::ForOverwrite(int width, int height) {
   TBitmap32 b;
   b.Allocate(width, height);
+#ifndef NDEBUG
+  // A pixel a routine forgets to write shows as this, not as the zeros fresh memory happens
+  // to hold, so that the tests of the debug build find it.
+  if (b.pixels_.size() != 0)
+    std::memset(static_cast<void*>(b.pixels_.data()), 0xA5, b.pixels_.size() * sizeof(Pixel));
+#endif
   return b;
 }
 
