@@ -15,7 +15,7 @@ PACKAGES := build-essential cmake pkg-config clang libclang-rt-14-dev clang-form
 	libjpeg62-turbo-dev libpng-dev libgtest-dev libgmock-dev libbenchmark-dev libwmf-dev libemf2svg-dev \
 	xdg-utils libzstd-dev
 
-.PHONY: all deps build run install test test-asan fuzz bench format clean
+.PHONY: all deps build run install test test-asan fuzz bench bench-all format clean
 
 all: build
 
@@ -65,7 +65,14 @@ test-asan: deps
 fuzz: deps
 	fuzz/run.sh $(FUZZ_SECONDS) $(CURDIR)/$(FUZZ_BUILD)
 
-bench: build
+# Every effect beside a memcpy and the comparable OpenCV operations, in one table. OpenCV is
+# used by this benchmark only, so only this target installs it.
+bench:
+	$(MAKE) build PACKAGES="$(PACKAGES) libopencv-dev"
+	$(BUILD)/bench/side_by_side_bench
+
+# Every benchmark program, the table's included.
+bench-all: build
 	@for b in $(BUILD)/bench/*_bench; do echo "== $$b"; $$b; done
 
 format:

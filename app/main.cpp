@@ -10,6 +10,7 @@
 #include "app/qt_messages.h"
 #include "app/qt_platform.h"
 #include "app/tool_windows.h"
+#include "imaging/picture_memory.h"
 
 namespace {
 
@@ -40,6 +41,7 @@ class Application : public QApplication {
 
 int main(int argc, char* argv[]) {
   quillane::LimitRepeatedQtMessages();
+  quillane::SetUpPictureMemory();
   quillane::QtPlatformServices platform;
   Application app(argc, argv, platform);
   QApplication::setApplicationName("Quillane");

@@ -6,10 +6,6 @@
 #include <cmath>
 #include <cstring>
 
-#ifdef __GLIBC__
-#include <malloc.h>
-#endif
-
 #include "bench/synthetic_photo.h"
 #include "data/texture_tiles.h"
 #include "effects/adjust/color_filter.h"
@@ -29,6 +25,7 @@
 #include "effects/surface/stria.h"
 #include "effects/surface/texture.h"
 #include "imaging/edge_map.h"
+#include "imaging/picture_memory.h"
 #include "imaging/rotate.h"
 #include "imaging/tone.h"
 
@@ -310,14 +307,8 @@ BENCHMARK(BM_ZoomInandOut)->Unit(benchmark::kMillisecond)->MeasureProcessCPUTime
 }  // namespace quillane
 
 int main(int argc, char** argv) {
-#ifdef __GLIBC__
-  // Every routine returns a new 48 MB picture. glibc maps blocks that large afresh each time,
-  // and first touches of fresh pages can cost far more than the routine itself (about 40 times
-  // the memcpy on some virtual machines). Keeping freed memory in the heap, as a long-running
-  // program's history does, lets the figures show the routines' own work.
-  mallopt(M_MMAP_THRESHOLD, 1 << 30);
-  mallopt(M_TRIM_THRESHOLD, 1 << 30);
-#endif
+  // The set-up both programs make at start-up, so that the figures are the programs' own.
+  quillane::SetUpPictureMemory();
   benchmark::Initialize(&argc, argv);
   if (benchmark::ReportUnrecognizedArguments(argc, argv)) return 1;
   benchmark::RunSpecifiedBenchmarks();

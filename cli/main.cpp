@@ -8,6 +8,7 @@
 
 #include "cli/cli_commands.h"
 #include "cli/cli_options.h"
+#include "imaging/picture_memory.h"
 
 namespace {
 
@@ -24,6 +25,7 @@ void QuietQtMessages(QtMsgType type, const QMessageLogContext& context, const QS
 }  // namespace
 
 int main(int argc, char** argv) {
+  quillane::SetUpPictureMemory();
   qtDefaultHandler = qInstallMessageHandler(QuietQtMessages);
   using namespace quillane::cli;
   const std::vector<std::string> args(argv + 1, argv + argc);

@@ -1,5 +1,6 @@
 #include "document/document.h"
 
+#include <algorithm>
 #include <condition_variable>
 #include <deque>
 #include <functional>
@@ -7,6 +8,7 @@
 #include <thread>
 
 #include "document/packed_picture.h"
+#include "imaging/picture_memory.h"
 
 namespace quillane {
 
@@ -255,6 +257,8 @@ void PictureDocument::ResetHistory() {
   redoCount_ = 0;
   SlotAt(1) = Record(working_);
   LetGoOfUnreachableSlots();
+  // The memory kept for pictures of another size goes back to the system with the slots let go.
+  ReleasePictureMemory(working_->PixelCount() * sizeof(Pixel));
 }
 
 void PictureDocument::LetGoOfUnreachableSlots() {

@@ -2,17 +2,42 @@
 
 #include <algorithm>
 #include <cmath>
+#include <cstring>
+#include <vector>
 
 #include "imaging/numeric.h"
 
 namespace quillane {
 
-TBitmap32::TBitmap32(int width, int height, Pixel fill) {
-  SetSize(width, height);
-  std::fill(pixels_.begin(), pixels_.end(), fill);
+TBitmap32::Store::Store(const Store& other) : Store(other.count_) {
+  if (count_ != 0) std::memcpy(data_, other.data_, count_ * sizeof(Pixel));
 }
 
-void TBitmap32::SetSize(int width, int height) {
+TBitmap32::Store& TBitmap32::Store::operator=(const Store& other) {
+  if (this == &other) return *this;
+  if (count_ != other.count_) return *this = Store(other);
+  if (count_ != 0) std::memcpy(data_, other.data_, count_ * sizeof(Pixel));
+  return *this;
+}
+
+TBitmap32::TBitmap32(int width, int height, Pixel fill) {
+  Allocate(width, height);
+  std::fill(pixels_.data(), pixels_.data() + pixels_.size(), fill);
+}
+
+TBitmap32 TBitmap32::ForOverwrite(int width, int height) {
+  TBitmap32 b;
+  b.Allocate(width, height);
+#ifndef NDEBUG
+  // A pixel a routine forgets to write shows as this, not as the zeros fresh memory happens
+  // to hold, so that the tests of the debug build find it.
+  if (b.pixels_.size() != 0)
+    std::memset(static_cast<void*>(b.pixels_.data()), 0xA5, b.pixels_.size() * sizeof(Pixel));
+#endif
+  return b;
+}
+
+void TBitmap32::Allocate(int width, int height) {
   if (width <= 0 || height <= 0) {
     width = 0;
     height = 0;
@@ -20,11 +45,24 @@ void TBitmap32::SetSize(int width, int height) {
   const std::int64_t count = static_cast<std::int64_t>(width) * height;
   if (count > kMaxPixels) throw std::length_error("Picture too large");
   // Release first, so that a large picture is never held twice during a resize.
-  pixels_.clear();
-  pixels_.shrink_to_fit();
-  pixels_.resize(static_cast<std::size_t>(count));
+  pixels_ = Store();
+  width_ = 0;
+  height_ = 0;
+  pixels_ = Store(static_cast<std::size_t>(count));
   width_ = width;
   height_ = height;
+}
+
+void TBitmap32::SetSize(int width, int height) {
+  Allocate(width, height);
+  if (pixels_.size() != 0)
+    std::memset(static_cast<void*>(pixels_.data()), 0, pixels_.size() * sizeof(Pixel));
+}
+
+bool operator==(const TBitmap32& a, const TBitmap32& b) {
+  return a.width_ == b.width_ && a.height_ == b.height_ &&
+         (a.pixels_.size() == 0 ||
+          std::memcmp(a.Data(), b.Data(), a.pixels_.size() * sizeof(Pixel)) == 0);
 }
 
 void TBitmap32::DrawOver(int x, int y, TBitmap32& target) const {

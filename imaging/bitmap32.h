@@ -5,7 +5,10 @@
 #include <cstddef>
 #include <cstdint>
 #include <stdexcept>
+#include <utility>
 #include <vector>
+
+#include "imaging/picture_memory.h"
 
 namespace quillane {
 
@@ -50,6 +53,27 @@ class TBitmap32 {
   TBitmap32(int width, int height) { SetSize(width, height); }
   // A bitmap of the given size filled with one pixel.
   TBitmap32(int width, int height, Pixel fill);
+  // A bitmap of the given size whose bytes are left as the memory holds them, for routines
+  // that write every pixel anyway (saving a pass over the whole picture).
+  static TBitmap32 ForOverwrite(int width, int height);
+
+  TBitmap32(const TBitmap32&) = default;
+  TBitmap32& operator=(const TBitmap32& other) {
+    pixels_ = other.pixels_;  // first: if it throws, this bitmap stays as it was
+    width_ = other.width_;
+    height_ = other.height_;
+    return *this;
+  }
+  TBitmap32(TBitmap32&& other) noexcept
+      : width_(std::exchange(other.width_, 0)),
+        height_(std::exchange(other.height_, 0)),
+        pixels_(std::move(other.pixels_)) {}
+  TBitmap32& operator=(TBitmap32&& other) noexcept {
+    width_ = std::exchange(other.width_, 0);
+    height_ = std::exchange(other.height_, 0);
+    pixels_ = std::move(other.pixels_);
+    return *this;
+  }
 
   int Width() const { return width_; }
   int Height() const { return height_; }
@@ -77,7 +101,7 @@ class TBitmap32 {
   Pixel& At(int x, int y) { return ScanLine(y)[CheckedColumn(x)]; }
   const Pixel& At(int x, int y) const { return ScanLine(y)[CheckedColumn(x)]; }
 
-  friend bool operator==(const TBitmap32&, const TBitmap32&) = default;
+  friend bool operator==(const TBitmap32& a, const TBitmap32& b);
 
   // Composites this bitmap (the overlay), its top-left pixel placed at (x, y) of target, over
   // target, in place. Per pixel with target alpha at and overlay alpha ao:
@@ -98,9 +122,40 @@ class TBitmap32 {
     return x;
   }
 
+  // The pixels, in picture memory. Copies reuse the block when the size is the same.
+  class Store {
+   public:
+    Store() = default;
+    explicit Store(std::size_t count)
+        : data_(count == 0 ? nullptr
+                           : static_cast<Pixel*>(AllocatePictureBytes(count * sizeof(Pixel)))),
+          count_(count) {}
+    Store(const Store& other);
+    Store& operator=(const Store& other);
+    Store(Store&& other) noexcept
+        : data_(std::exchange(other.data_, nullptr)), count_(std::exchange(other.count_, 0)) {}
+    Store& operator=(Store&& other) noexcept {
+      std::swap(data_, other.data_);
+      std::swap(count_, other.count_);
+      return *this;
+    }
+    ~Store() { FreePictureBytes(data_, count_ * sizeof(Pixel)); }
+
+    Pixel* data() { return data_; }
+    const Pixel* data() const { return data_; }
+    std::size_t size() const { return count_; }
+
+   private:
+    Pixel* data_ = nullptr;
+    std::size_t count_ = 0;
+  };
+
+  // Sets the size without touching the new pixels.
+  void Allocate(int width, int height);
+
   int width_ = 0;
   int height_ = 0;
-  std::vector<Pixel> pixels_;
+  Store pixels_;
 };
 
 // Sets the alpha byte of every pixel to value; colour bytes are untouched.

@@ -84,8 +84,7 @@ void picsobel(TBitmap32& bitmap) {
   // A band's first and last rows read rows that neighbouring bands rewrite, so those two rows
   // of each band are kept before any band starts.
   const int interior = h - 2;
-  const int bands =
-      std::min(interior, static_cast<int>(std::max(1u, std::thread::hardware_concurrency())));
+  const int bands = RowBands(interior, static_cast<std::size_t>(w) * 9);
   const auto bandStart = [&](int i) {
     return 1 + static_cast<int>(static_cast<long long>(interior) * i / bands);
   };

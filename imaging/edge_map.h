@@ -1,6 +1,9 @@
 // The edge map that every drawing effect starts from.
 #pragma once
 
+#include <array>
+#include <cstdint>
+
 #include "imaging/bitmap32.h"
 
 namespace quillane {
@@ -16,6 +19,12 @@ namespace quillane {
 // caller. A picture too small for a neighbour on one side repeats what it has: 1 wide or 1 high
 // gives the inverted input along that direction, 2 gives both lines the inverted second line.
 void picsobel(TBitmap32& bitmap);
+
+// A new picture whose every pixel is levels[gray value of the edge map's pixel] in B, G and R,
+// alpha 255: what picsobel on a copy of source, then ConvertToGray and a per-level table give,
+// in one pass over rows that stay in cache, without the edge map as a picture. source is not
+// changed.
+TBitmap32 GrayEdgeLevels(const TBitmap32& source, const std::array<std::uint8_t, 256>& levels);
 
 // The same edge map computed the plain way, pixel by pixel and channel by channel from a
 // snapshot, border columns, border rows, then the inversion. picsobel must equal it byte for

@@ -9,6 +9,8 @@
 #include <limits>
 #include <sstream>
 
+#include "imaging/picture_memory.h"
+
 namespace quillane {
 namespace {
 
@@ -83,6 +85,9 @@ std::int64_t OperationBytes(std::int64_t width, std::int64_t height, int extraBy
 void CheckMemoryFor(std::int64_t width, std::int64_t height, const std::string& what,
                     int extraBytesPerPixel) {
   const std::int64_t needed = OperationBytes(width, height, extraBytesPerPixel);
+  if (needed <= AvailableMemory()) return;
+  // Memory kept for reuse counts as taken; give it back before refusing.
+  ReleasePictureMemory();
   if (needed <= AvailableMemory()) return;
   throw NotEnoughMemory(what + " of " + std::to_string(width) + " by " + std::to_string(height) +
                         " pixels " + MemoryNeedText(needed));

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <algorithm>
+#include <atomic>
 #include <cstddef>
 #include <exception>
 #include <thread>
@@ -13,6 +14,35 @@ namespace quillane {
 // Below this much work (in pixel-operations) a second thread costs more than it saves.
 inline constexpr std::size_t kParallelThreshold = 1u << 18;
 
+// How row passes split their work: into at most `threads` bands (0: one per processor), and
+// into one band per `minimumWork` pixel-operations at most. The bytes never depend on it; the
+// benchmarks pin one thread, and the tests force many bands onto small pictures.
+struct RowSplit {
+  int threads = 0;
+  std::size_t minimumWork = kParallelThreshold;
+};
+namespace detail {
+inline std::atomic<int> rowThreads{0};
+inline std::atomic<std::size_t> rowMinimumWork{kParallelThreshold};
+}  // namespace detail
+inline void SetRowSplit(RowSplit split) {
+  detail::rowThreads = split.threads;
+  detail::rowMinimumWork = split.minimumWork;
+}
+inline RowSplit CurrentRowSplit() {
+  return {detail::rowThreads.load(), detail::rowMinimumWork.load()};
+}
+// The number of bands a pass of rows rows at workPerRow each is split into.
+inline int RowBands(int rows, std::size_t workPerRow) {
+  if (rows <= 0) return 0;
+  const RowSplit split = CurrentRowSplit();
+  const unsigned threads = split.threads > 0 ? static_cast<unsigned>(split.threads)
+                                             : std::max(1u, std::thread::hardware_concurrency());
+  const std::size_t total = workPerRow * static_cast<std::size_t>(rows);
+  const std::size_t byWork = split.minimumWork == 0 ? total + 1 : total / split.minimumWork + 1;
+  return static_cast<int>(std::min<std::size_t>({threads, static_cast<std::size_t>(rows), byWork}));
+}
+
 // Calls body(y0, y1) over consecutive bands covering [begin, end). workPerRow estimates the
 // cost of one row; small jobs run on the calling thread. The first exception thrown by any
 // band is rethrown here after every band has finished.
@@ -20,10 +50,7 @@ template <typename Body>
 void ParallelRows(int begin, int end, std::size_t workPerRow, Body&& body) {
   if (end <= begin) return;
   const int rows = end - begin;
-  const unsigned hw = std::max(1u, std::thread::hardware_concurrency());
-  const std::size_t total = workPerRow * static_cast<std::size_t>(rows);
-  const int threads = static_cast<int>(
-      std::min<std::size_t>({hw, static_cast<std::size_t>(rows), total / kParallelThreshold + 1}));
+  const int threads = RowBands(rows, workPerRow);
   if (threads <= 1) {
     body(begin, end);
     return;

@@ -168,16 +168,34 @@ inline Rgb TableHslToRgb(const HslTables& t, int h, int s, int l) {
   return Rgb{light[sat[hue[0]]], light[sat[hue[1]]], light[sat[hue[2]]]};
 }
 
-// Gray value in integers: 100 times the weighted sum is 30 R + 59 G + 11 B exactly. Away from
+// Gray values in integers: 100 times the weighted sum is 30 R + 59 G + 11 B exactly. Away from
 // an exact half the extended-precision sum (within 1e-15 of it) rounds the same way; at an
-// exact half its rounding errors decide, so it is formed as GrayValue forms it. Identical to
-// GrayValue for every colour (checked for all of them in the tests).
-inline std::uint8_t FastGrayValue(int r, int g, int b) {
-  const int n = 30 * r + 59 * g + 11 * b;
-  const int k = n / 100;
-  const int rest = n - 100 * k;
-  if (rest != 50) return static_cast<std::uint8_t>(rest < 50 ? k : k + 1);
-  return static_cast<std::uint8_t>(RoundBetween(0.3L * r + 0.59L * g + 0.11L * b, k));
+// exact half its rounding errors decide. Identical to GrayValue for every colour (checked for
+// all of them in the tests).
+
+// For each red and green level, whether an exact half rounds up, for the (at most three) blue
+// levels that make one: bit i for the blue level 100 i + (the smallest such level). Filled
+// once; every entry compares the extended-precision sum with the half as Round would.
+const std::array<std::uint8_t, 65536>& HalfRoundsUp() {
+  static const auto table = [] {
+    std::array<std::uint8_t, 65536> t{};
+    for (int r = 0; r < 256; ++r)
+      for (int g = 0; g < 256; ++g) {
+        // 11 b = 50 - 30 r - 59 g (mod 100), and 91 is the inverse of 11 modulo 100.
+        const int first = (((50 - 30 * r - 59 * g) % 100 + 100) * 91) % 100;
+        std::uint8_t bits = 0;
+        for (int b = first, i = 0; b < 256; b += 100, ++i) {
+          const int k = (30 * r + 59 * g + 11 * b) / 100;
+          const Extended sum = 0.3L * r + 0.59L * g + 0.11L * b;
+          const Extended half = k + 0.5L;
+          if (sum > half || (sum == half && (k & 1) != 0))
+            bits |= static_cast<std::uint8_t>(1 << i);
+        }
+        t[static_cast<std::size_t>(r << 8 | g)] = bits;
+      }
+    return t;
+  }();
+  return table;
 }
 
 // Gray values of n <= kGrayChunk pixels taken as little-endian words 0xAARRGGBB, in 16-bit
@@ -202,7 +220,7 @@ void GrayChunk(const std::uint32_t* src, int n, std::uint8_t* level) {
   if (!anyHalf) return;
   for (int i = 0; i < n; ++i)
     if (half[i])
-      level[i] = FastGrayValue((src[i] >> 16) & 0xFF, (src[i] >> 8) & 0xFF, src[i] & 0xFF);
+      level[i] = GrayValueOfHalf((src[i] >> 16) & 0xFF, (src[i] >> 8) & 0xFF, src[i] & 0xFF);
 }
 
 // Gray rows: each pixel's gray value plus shift, limited to 0..255, in B, G and R, alpha 255.
@@ -228,6 +246,12 @@ bool IsByte(int v) {
 }
 
 }  // namespace
+
+std::uint8_t GrayValueOfHalf(int r, int g, int b) {
+  const int k = (30 * r + 59 * g + 11 * b) / 100;
+  const int up = HalfRoundsUp()[static_cast<std::size_t>(r << 8 | g)] >> (b / 100) & 1;
+  return static_cast<std::uint8_t>(k + up);
+}
 
 Hsl RgbToHsl(int r, int g, int b) {
   if (!IsByte(r) || !IsByte(g) || !IsByte(b)) return PlainRgbToHsl(r, g, b);
@@ -273,12 +297,7 @@ TBitmap32 PencilContrastPass(const TBitmap32& input, int c) {
   const auto curve = LightnessContrastTable(c);
   // A gray pixel keeps hue and saturation 0, so its result depends on its level alone: one
   // table serves every gray pixel, and the edge map this pass usually gets is all gray.
-  std::array<std::uint8_t, 256> grayLevel{};
-  for (int v = 0; v < 256; ++v) {
-    const Hsl hsl = RgbToHsl(v, v, v);
-    grayLevel[static_cast<std::size_t>(v)] =
-        static_cast<std::uint8_t>(HslToRgb(hsl.h, hsl.s, curve[static_cast<std::size_t>(hsl.l)]).r);
-  }
+  const std::array<std::uint8_t, 256> grayLevel = PencilContrastGrayLevels(c);
   const HslTables& tables = Tables();
   const int w = out.Width();
   ParallelRows(0, out.Height(), static_cast<std::size_t>(w) * 4, [&](int y0, int y1) {
@@ -300,6 +319,24 @@ TBitmap32 PencilContrastPass(const TBitmap32& input, int c) {
     }
   });
   return out;
+}
+
+std::array<std::uint8_t, 256> PencilContrastGrayLevels(int c) {
+  const auto curve = LightnessContrastTable(c);
+  std::array<std::uint8_t, 256> levels{};
+  for (int v = 0; v < 256; ++v) {
+    const Hsl hsl = RgbToHsl(v, v, v);
+    levels[static_cast<std::size_t>(v)] =
+        static_cast<std::uint8_t>(HslToRgb(hsl.h, hsl.s, curve[static_cast<std::size_t>(hsl.l)]).r);
+  }
+  return levels;
+}
+
+std::array<std::uint8_t, 256> PencilLightingLevels(int v) {
+  std::array<std::uint8_t, 256> levels{};
+  for (int y = 0; y < 256; ++y)
+    levels[static_cast<std::size_t>(y)] = static_cast<std::uint8_t>(ClampByte(y + 2 * (v - 128)));
+  return levels;
 }
 
 TBitmap32 PencilLightingPass(const TBitmap32& input, int v) {

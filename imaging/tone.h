@@ -70,6 +70,13 @@ std::array<std::uint8_t, 101> LightnessContrastTable(int c);
 // The input is not changed.
 TBitmap32 PencilContrastPass(const TBitmap32& input, int c);
 
+// What PencilContrastPass makes of each gray level (R = G = B = index): a gray level again.
+std::array<std::uint8_t, 256> PencilContrastGrayLevels(int c);
+
+// What PencilLightingPass makes of each gray value: the value plus 2 (v - 128), limited to
+// 0..255.
+std::array<std::uint8_t, 256> PencilLightingLevels(int v);
+
 // PencilContrastPass pixel by pixel through the reference conversions and LightnessContrast;
 // the oracle that the fast pass must equal.
 TBitmap32 PencilContrastPassReference(const TBitmap32& input, int c);
@@ -80,6 +87,10 @@ TBitmap32 PencilLightingPass(const TBitmap32& input, int v);
 
 // Writes each pixel's gray value into B, G and R and 255 into alpha.
 void ConvertToGray(TBitmap32& bitmap);
+
+// GrayValue of a colour whose weighted sum is an exact half (30 R + 59 G + 11 B ends in 50),
+// where only the extended-precision sum's own rounding decides; from a table.
+std::uint8_t GrayValueOfHalf(int r, int g, int b);
 
 // The gray values (GrayValue) of count pixels, one byte each.
 void GrayLevels(const Pixel* in, std::uint8_t* out, int count);

@@ -5,6 +5,7 @@
 #include "effects/registry.h"
 #include "imaging/numeric.h"
 #include "imaging/parallel.h"
+#include "imaging/row_pass.h"
 #include "imaging/tone.h"
 
 namespace quillane {
@@ -21,12 +22,8 @@ TBitmap32 HslAdjust(const TBitmap32& source, int hue, int saturation, int lighti
         static_cast<std::uint8_t>(std::clamp(v + lighting - 100, 0, 100));
   }
   const HslRowChanger changer(change);
-  TBitmap32 out(source.Width(), source.Height());
-  const int w = source.Width();
-  ParallelRows(0, source.Height(), static_cast<std::size_t>(w) * 8, [&](int y0, int y1) {
-    for (int y = y0; y < y1; ++y) changer.Row(source.ScanLine(y), out.ScanLine(y), w);
-  });
-  return out;
+  return MapRows(source, 8,
+                 [&](const Pixel* in, Pixel* out, int w, int) { changer.Row(in, out, w); });
 }
 
 const EffectSpec& HslAdjustEffect() {

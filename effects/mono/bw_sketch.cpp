@@ -8,11 +8,26 @@
 namespace quillane {
 
 TBitmap32 peccilsketch(const TBitmap32& source, PencilToneMode mode, int contrast, int lighting) {
-  TBitmap32 edges = source;
-  picsobel(edges);
-  if (mode == PencilToneMode::Lighting) return PencilLightingPass(edges, lighting);
-  ConvertToGray(edges);
-  return PencilContrastPass(edges, contrast);
+  // Either tone turns each gray value of the edge map into one level: the lighting pass by
+  // itself, the contrast pass because the gray copy it gets has hue and saturation 0.
+  return GrayEdgeLevels(source, mode == PencilToneMode::Lighting
+                                    ? PencilLightingLevels(lighting)
+                                    : PencilContrastGrayLevels(contrast));
+}
+
+TBitmap32 PencilSketchReference(const TBitmap32& source, PencilToneMode mode, int contrast,
+                                int lighting) {
+  const TBitmap32 edges = PicsobelReference(source);
+  TBitmap32 toned = edges;
+  for (int y = 0; y < toned.Height(); ++y)
+    for (int x = 0; x < toned.Width(); ++x) {
+      Pixel& p = toned.At(x, y);
+      int v = GrayValue(p.r, p.g, p.b);
+      if (mode == PencilToneMode::Lighting) v = ClampByte(v + 2 * (lighting - 128));
+      p = Pixel{static_cast<std::uint8_t>(v), static_cast<std::uint8_t>(v),
+                static_cast<std::uint8_t>(v), 255};
+    }
+  return mode == PencilToneMode::Lighting ? toned : PencilContrastPassReference(toned, contrast);
 }
 
 const EffectSpec& PencilSketchEffect() {

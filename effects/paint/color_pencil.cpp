@@ -9,6 +9,7 @@
 #include "imaging/edge_map.h"
 #include "imaging/numeric.h"
 #include "imaging/parallel.h"
+#include "imaging/row_pass.h"
 #include "imaging/tone.h"
 
 namespace quillane {
@@ -25,7 +26,7 @@ int EdgeTone(int gray, int pressure) {
 }  // namespace
 
 TBitmap32 colorsketch(const TBitmap32& source, int pressure) {
-  TBitmap32 out(source.Width(), source.Height());
+  TBitmap32 out = ScratchPicture(source.Width(), source.Height());
   ColorSketchInto(source, pressure, out);
   return out;
 }

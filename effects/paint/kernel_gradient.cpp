@@ -4,6 +4,7 @@
 #include <cstring>
 
 #include "imaging/parallel.h"
+#include "imaging/row_pass.h"
 
 namespace quillane {
 namespace {
@@ -75,7 +76,7 @@ TBitmap32 KernelGradientReference(const TBitmap32& picture, const Kernel& k, Gra
 }
 
 TBitmap32 KernelGradientFilter(const TBitmap32& picture, const Kernel& k, Gradient gradient) {
-  TBitmap32 out(picture.Width(), picture.Height());
+  TBitmap32 out = ScratchPicture(picture.Width(), picture.Height());
   KernelGradientFilterInto(picture, k, gradient, out);
   return out;
 }

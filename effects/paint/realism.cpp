@@ -6,6 +6,7 @@
 #include "effects/registry.h"
 #include "imaging/numeric.h"
 #include "imaging/parallel.h"
+#include "imaging/row_pass.h"
 
 namespace quillane {
 namespace {
@@ -34,7 +35,7 @@ TBitmap32 ConvolveReference(const TBitmap32& picture, const Kernel& k, std::uint
 }
 
 TBitmap32 Convolve(const TBitmap32& picture, const Kernel& k, std::uint16_t divisor) {
-  TBitmap32 out(picture.Width(), picture.Height());
+  TBitmap32 out = ScratchPicture(picture.Width(), picture.Height());
   ConvolveInto(picture, k, divisor, out);
   return out;
 }

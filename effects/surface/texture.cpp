@@ -10,6 +10,7 @@
 #include "effects/surface/for_current.h"
 #include "imaging/numeric.h"
 #include "imaging/parallel.h"
+#include "imaging/row_pass.h"
 #include "imaging/tone.h"
 
 namespace quillane {
@@ -32,8 +33,7 @@ std::vector<ParamOption> TileOptions() {
 
 TBitmap32 texture(const TBitmap32& base, const TBitmap32& tile, int pressure) {
   const int w = base.Width(), h = base.Height();
-  TBitmap32 out(w, h);
-  if (w == 0 || h == 0) return out;
+  if (w == 0 || h == 0) return TBitmap32(w, h);
   const int tw = std::max(1, tile.Width()), th = std::max(1, tile.Height());
   const bool plain = tile.Width() == 0 || tile.Height() == 0;
   // One row of shifts per tile row, already repeated across the picture's width.
@@ -48,12 +48,10 @@ TBitmap32 texture(const TBitmap32& base, const TBitmap32& tile, int pressure) {
     for (int x = tw; x < w; ++x) row[x] = row[x - tw];
   }
   const HslRowChanger changer(NoHslChange());
-  ParallelRows(0, h, static_cast<std::size_t>(w) * 8, [&](int y0, int y1) {
-    for (int y = y0; y < y1; ++y)
-      changer.Row(base.ScanLine(y), out.ScanLine(y), w,
-                  &shifts[static_cast<std::size_t>(y % rows) * static_cast<std::size_t>(w)]);
+  return MapRows(base, 8, [&](const Pixel* in, Pixel* out, int width, int y) {
+    changer.Row(in, out, width,
+                &shifts[static_cast<std::size_t>(y % rows) * static_cast<std::size_t>(width)]);
   });
-  return out;
 }
 
 TBitmap32 TextureReference(const TBitmap32& base, const TBitmap32& tile, int pressure) {

@@ -1,0 +1,249 @@
+// The gray edge map through a table, fused: each band walks its rows a stretch at a time, and
+// the edge bytes, their gray values and the table's pixels of a stretch live only in the
+// first-level cache. The arithmetic is written so that the compiler handles many bytes per
+// instruction; it is compiled twice, for any x86-64 and for processors with AVX2, and the one
+// this processor runs is chosen once.
+#include <algorithm>
+#include <cstring>
+
+#if defined(__x86_64__)
+#include <immintrin.h>
+#endif
+
+#include "imaging/edge_map.h"
+#include "imaging/numeric.h"
+#include "imaging/parallel.h"
+#include "imaging/tone.h"
+#include "imaging/vector_dispatch.h"
+
+namespace quillane {
+namespace {
+
+// Pixels per stretch: the stretch's edge bytes, gray values and marks take about 6 KB.
+constexpr int kStretch = 1024;
+
+// The edge bytes of the pixels x0 .. x0 + n - 1 of an interior row (1 <= x0,
+// x0 + n <= width - 1), as picsobel makes them: the neighbours of a colour byte sit 4 bytes to
+// either side, every sum fits 16 bits, and max(clamp(a), clamp(b)) is clamp(max(a, b)).
+[[gnu::always_inline]] inline void EdgeStretch(const std::uint8_t* __restrict above,
+                                               const std::uint8_t* __restrict row,
+                                               const std::uint8_t* __restrict below, int x0, int n,
+                                               std::uint8_t* __restrict edge) {
+  const int first = 4 * x0;
+  for (int j = 0; j < 4 * n; ++j) {
+    const int i = first + j;
+    const auto left = static_cast<std::int16_t>(above[i - 4] + row[i - 4] + below[i - 4]);
+    const auto right = static_cast<std::int16_t>(above[i + 4] + row[i + 4] + below[i + 4]);
+    const auto outer =
+        static_cast<std::int16_t>(left + right + above[i] + below[i] - row[i - 4] - row[i + 4]);
+    const auto a = static_cast<std::int16_t>(6 * row[i] - outer);
+    const auto b = static_cast<std::int16_t>(left - right);
+    const std::int16_t m = std::max(a, b);
+    const std::int16_t clamped = std::min<std::int16_t>(255, std::max<std::int16_t>(0, m));
+    edge[j] = static_cast<std::uint8_t>(255 - clamped);
+  }
+}
+
+// Gray values of n edge pixels: 100 times the weighted sum is 30 R + 59 G + 11 B exactly, and
+// (s * 5243) >> 19 is s / 100 for every s up to 25500. An exact half is marked in half and
+// left to GrayValueOfHalf; returns whether there is one.
+[[gnu::always_inline]] inline bool GrayStretch(const std::uint8_t* __restrict edge, int n,
+                                               std::uint8_t* __restrict level,
+                                               std::uint8_t* __restrict half) {
+  std::uint8_t anyHalf = 0;
+  for (int x = 0; x < n; ++x) {
+    const auto sum =
+        static_cast<std::uint16_t>(30 * edge[4 * x + 2] + 59 * edge[4 * x + 1] + 11 * edge[4 * x]);
+    const auto k = static_cast<std::uint16_t>((static_cast<std::uint32_t>(sum) * 5243u) >> 19);
+    const auto rest = static_cast<std::uint16_t>(sum - 100 * k);
+    half[x] = rest == 50;
+    anyHalf |= half[x];
+    level[x] = static_cast<std::uint8_t>(k + (rest > 50));
+  }
+  return anyHalf != 0;
+}
+
+void HalvesOf(const std::uint8_t* edge, std::uint8_t* level, int x) {
+  level[x] = GrayValueOfHalf(edge[4 * x + 2], edge[4 * x + 1], edge[4 * x]);
+}
+
+void LookUp(const std::uint8_t* level, int n, const std::uint32_t* pixelOf, std::uint32_t* out) {
+  for (int x = 0; x < n; ++x) out[x] = pixelOf[level[x]];
+}
+
+void PlainStretch(const std::uint8_t* above, const std::uint8_t* row, const std::uint8_t* below,
+                  int x0, int n, const std::uint32_t* pixelOf, Pixel* out) {
+  alignas(64) std::uint8_t edge[4 * kStretch];
+  std::uint8_t level[kStretch];
+  std::uint8_t half[kStretch];
+  EdgeStretch(above, row, below, x0, n, edge);
+  if (GrayStretch(edge, n, level, half))
+    for (int x = 0; x < n; ++x)
+      if (half[x]) HalvesOf(edge, level, x);
+  std::uint32_t pixels[kStretch];
+  LookUp(level, n, pixelOf, pixels);
+  std::memcpy(static_cast<void*>(out + x0), pixels, static_cast<std::size_t>(n) * sizeof(Pixel));
+}
+
+#if defined(__x86_64__) && defined(__GNUC__)
+// The weighted sums of 8 pixels: multiply-add of the bytes with 11, 59, 30 and 0.
+[[gnu::target("avx2"), gnu::always_inline]] inline __m256i Sums8(const std::uint8_t* edge) {
+  const __m256i e = _mm256_load_si256(reinterpret_cast<const __m256i*>(edge));
+  return _mm256_madd_epi16(_mm256_maddubs_epi16(e, _mm256_set1_epi32(0x001E3B0B)),
+                           _mm256_set1_epi16(1));
+}
+
+// Gray values of 16 sums, with the exact halves marked in halves.
+[[gnu::target("avx2"), gnu::always_inline]] inline __m256i Levels16(__m256i s, __m256i& halves) {
+  const __m256i fifty = _mm256_set1_epi16(50);
+  const __m256i k = _mm256_srli_epi16(_mm256_mulhi_epu16(s, _mm256_set1_epi16(5243)), 3);
+  const __m256i rest = _mm256_sub_epi16(s, _mm256_mullo_epi16(k, _mm256_set1_epi16(100)));
+  halves = _mm256_cmpeq_epi16(rest, fifty);
+  return _mm256_sub_epi16(k, _mm256_cmpgt_epi16(rest, fifty));
+}
+
+[[gnu::target("avx2"), gnu::always_inline]] inline __m256i Widened16(const std::uint8_t* p) {
+  return _mm256_cvtepu8_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(p)));
+}
+
+// max(line, gradient) of 16 bytes from byte i on, as 16-bit numbers.
+[[gnu::target("avx2"), gnu::always_inline]] inline __m256i Response16(const std::uint8_t* above,
+                                                                      const std::uint8_t* row,
+                                                                      const std::uint8_t* below,
+                                                                      int i) {
+  const auto at = Widened16;
+  const __m256i aboveSides = _mm256_add_epi16(at(above + i - 4), at(above + i + 4));
+  const __m256i belowSides = _mm256_add_epi16(at(below + i - 4), at(below + i + 4));
+  const __m256i left =
+      _mm256_add_epi16(_mm256_add_epi16(at(above + i - 4), at(row + i - 4)), at(below + i - 4));
+  const __m256i right =
+      _mm256_add_epi16(_mm256_add_epi16(at(above + i + 4), at(row + i + 4)), at(below + i + 4));
+  const __m256i outer = _mm256_add_epi16(_mm256_add_epi16(aboveSides, belowSides),
+                                         _mm256_add_epi16(at(above + i), at(below + i)));
+  const __m256i line =
+      _mm256_sub_epi16(_mm256_mullo_epi16(at(row + i), _mm256_set1_epi16(6)), outer);
+  return _mm256_max_epi16(line, _mm256_sub_epi16(left, right));
+}
+
+// The edge bytes 32 at a time: packing with unsigned saturation is the clamp to 0..255.
+[[gnu::target("avx2"), gnu::always_inline]] inline void Avx2EdgeStretch(const std::uint8_t* above,
+                                                                        const std::uint8_t* row,
+                                                                        const std::uint8_t* below,
+                                                                        int x0, int n,
+                                                                        std::uint8_t* edge) {
+  const int first = 4 * x0;
+  const int bytes = 4 * n;
+  int j = 0;
+  for (; j + 32 <= bytes; j += 32) {
+    const __m256i packed = _mm256_packus_epi16(Response16(above, row, below, first + j),
+                                               Response16(above, row, below, first + j + 16));
+    const __m256i ordered = _mm256_permute4x64_epi64(packed, 0xD8);
+    _mm256_store_si256(reinterpret_cast<__m256i*>(edge + j),
+                       _mm256_xor_si256(ordered, _mm256_set1_epi8(-1)));
+  }
+  if (j < bytes) EdgeStretch(above + j, row + j, below + j, x0, (bytes - j) / 4, edge + j);
+}
+
+// The gray values 32 pixels at a time; the halves come out as a bit mask.
+[[gnu::target("avx2")]] void Avx2Stretch(const std::uint8_t* above, const std::uint8_t* row,
+                                         const std::uint8_t* below, int x0, int n,
+                                         const std::uint32_t* pixelOf, Pixel* out) {
+  alignas(64) std::uint8_t edge[4 * kStretch];
+  alignas(64) std::uint8_t level[kStretch];
+  std::uint8_t half[kStretch];
+  Avx2EdgeStretch(above, row, below, x0, n, edge);
+  const __m256i order = _mm256_setr_epi32(0, 4, 1, 5, 2, 6, 3, 7);
+  int x = 0;
+  for (; x + 32 <= n; x += 32) {
+    // Packing works within halves of the register: the order is restored at the end.
+    const __m256i s01 = _mm256_packus_epi32(Sums8(edge + 4 * x), Sums8(edge + 4 * x + 32));
+    const __m256i s23 = _mm256_packus_epi32(Sums8(edge + 4 * x + 64), Sums8(edge + 4 * x + 96));
+    __m256i h01, h23;
+    const __m256i l01 = Levels16(s01, h01);
+    const __m256i l23 = Levels16(s23, h23);
+    const __m256i bytes = _mm256_permutevar8x32_epi32(_mm256_packus_epi16(l01, l23), order);
+    _mm256_store_si256(reinterpret_cast<__m256i*>(level + x), bytes);
+    auto mask = static_cast<std::uint32_t>(
+        _mm256_movemask_epi8(_mm256_permutevar8x32_epi32(_mm256_packs_epi16(h01, h23), order)));
+    for (; mask != 0; mask &= mask - 1) HalvesOf(edge, level, x + __builtin_ctz(mask));
+  }
+  if (x < n && GrayStretch(edge + 4 * x, n - x, level + x, half))
+    for (int i = x; i < n; ++i)
+      if (half[i - x]) HalvesOf(edge, level, i);
+  // The result goes past the caches: it is far larger than they are, and streaming stores
+  // spare reading each line of it before writing it. The band ends with a store fence.
+  alignas(32) std::uint32_t pixels[kStretch];
+  LookUp(level, n, pixelOf, pixels);
+  auto* dst = reinterpret_cast<std::uint8_t*>(out + x0);
+  int i = 0;
+  for (; i < n && reinterpret_cast<std::uintptr_t>(dst + 4 * i) % 32 != 0; ++i)
+    std::memcpy(dst + 4 * i, pixels + i, 4);
+  for (; i + 8 <= n; i += 8)
+    _mm256_stream_si256(reinterpret_cast<__m256i*>(dst + 4 * i),
+                        _mm256_loadu_si256(reinterpret_cast<const __m256i*>(pixels + i)));
+  for (; i < n; ++i) std::memcpy(dst + 4 * i, pixels + i, 4);
+}
+#endif
+
+using Stretch = void (*)(const std::uint8_t*, const std::uint8_t*, const std::uint8_t*, int, int,
+                         const std::uint32_t*, Pixel*);
+
+Stretch ChooseStretch() {
+#if defined(__x86_64__) && defined(__GNUC__)
+  if (UseAvx2()) return Avx2Stretch;
+#endif
+  return PlainStretch;
+}
+
+// Output row y (1 .. height - 2) from source rows y - 1, y and y + 1.
+void GrayEdgeRow(Stretch stretch, const TBitmap32& source, int y, const std::uint32_t* pixelOf,
+                 Pixel* out) {
+  const int w = source.Width();
+  const auto* above = reinterpret_cast<const std::uint8_t*>(source.ScanLine(y - 1));
+  const auto* row = reinterpret_cast<const std::uint8_t*>(source.ScanLine(y));
+  const auto* below = reinterpret_cast<const std::uint8_t*>(source.ScanLine(y + 1));
+  for (int x0 = 1; x0 < w - 1; x0 += kStretch)
+    stretch(above, row, below, x0, std::min(kStretch, w - 1 - x0), pixelOf, out);
+  // The side pixels repeat their inner neighbours.
+  out[0] = out[1];
+  out[w - 1] = out[w - 2];
+}
+
+}  // namespace
+
+TBitmap32 GrayEdgeLevels(const TBitmap32& source, const std::array<std::uint8_t, 256>& levels) {
+  const int w = source.Width();
+  const int h = source.Height();
+  if (w < 3 || h < 3) {
+    // No interior pixel: the border rules alone, the plain way.
+    TBitmap32 edges = source;
+    picsobel(edges);
+    for (int y = 0; y < h; ++y) {
+      Pixel* p = edges.ScanLine(y);
+      for (int x = 0; x < w; ++x) {
+        const std::uint8_t v = levels[GrayValue(p[x].r, p[x].g, p[x].b)];
+        p[x] = Pixel{v, v, v, 255};
+      }
+    }
+    return edges;
+  }
+  const Stretch stretch = ChooseStretch();
+  std::uint32_t pixelOf[256];
+  for (int v = 0; v < 256; ++v)
+    pixelOf[v] = 0xFF000000u | 0x010101u * levels[static_cast<std::size_t>(v)];
+
+  TBitmap32 out = TBitmap32::ForOverwrite(w, h);
+  const std::size_t rowBytes = static_cast<std::size_t>(w) * sizeof(Pixel);
+  ParallelRows(1, h - 1, static_cast<std::size_t>(w) * 12, [&](int y0, int y1) {
+    for (int y = y0; y < y1; ++y) GrayEdgeRow(stretch, source, y, pixelOf, out.ScanLine(y));
+    // The top and bottom rows repeat their inner neighbours.
+    if (y0 == 1) std::memcpy(out.ScanLine(0), out.ScanLine(1), rowBytes);
+    if (y1 == h - 1) std::memcpy(out.ScanLine(h - 1), out.ScanLine(h - 2), rowBytes);
+#if defined(__x86_64__)
+    _mm_sfence();
+#endif
+  });
+  return out;
+}
+
+}  // namespace quillane
