@@ -136,8 +136,10 @@ std::string DescribeParam(const ParamSpec& param) {
       return "default " + std::to_string(param.defaultValue);
     case ParamKind::Cells: {
       std::string defaults;
-      for (std::int64_t v : param.defaultList)
-        defaults += (defaults.empty() ? "" : ",") + std::to_string(v);
+      for (std::int64_t v : param.defaultList) {
+        if (!defaults.empty()) defaults += ',';
+        defaults += std::to_string(v);
+      }
       return "N,N,...  " + std::to_string(param.cells.size()) + " integers, default " + defaults;
     }
     case ParamKind::Choice: {
