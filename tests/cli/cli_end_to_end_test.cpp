@@ -19,20 +19,16 @@
 #include "effects/surface/emboss.h"
 #include "effects/surface/stria.h"
 #include "tests/cli/cli_run.h"
+#include "tests/imaging/random_picture.h"
 
 namespace quillane {
 namespace {
 
 namespace fs = std::filesystem;
 
+// Alpha varies; the document makes it 255.
 TBitmap32 Picture(int width, int height) {
-  TBitmap32 p(width, height);
-  for (int y = 0; y < height; ++y)
-    for (int x = 0; x < width; ++x)
-      p.At(x, y) = Pixel{static_cast<std::uint8_t>(x * 29 + y), static_cast<std::uint8_t>(y * 41),
-                         static_cast<std::uint8_t>((x * y * 7) & 255),
-                         static_cast<std::uint8_t>(255 - x * 5)};
-  return p;
+  return RandomPicture(width, height, 7);
 }
 
 TBitmap32 FromPng(const std::string& path) {
@@ -119,7 +115,7 @@ TEST_F(CliRun, EveryEffectWritesWhatItsRoutineGives) {
 }
 
 TEST_F(CliRun, ApplyReadsPngStandardInputAndTheBuiltInPicture) {
-  const TBitmap32 input = Picture(17, 13);  // alpha varies; the document makes it 255
+  const TBitmap32 input = Picture(17, 13);
   SavePng(input, Path("in.png"));
   ASSERT_EQ(Run("apply pencil-sketch " + Q("in.png") + " -o " + Q("out.png")), 0) << err_;
   EXPECT_EQ(FromPng(Path("out.png")), Pencil(input, PencilToneMode::Contrast, 45, 128));
