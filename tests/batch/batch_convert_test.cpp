@@ -11,6 +11,7 @@
 
 #include "codecs/picture_file.h"
 #include "effects/mono/bw_sketch.h"
+#include "tests/imaging/random_picture.h"
 
 namespace quillane {
 namespace {
@@ -38,16 +39,10 @@ class BatchFolder : public ::testing::Test {
   std::string out_;
 };
 
-// A small picture with edges in every channel, different for each seed.
+// A small opaque picture, different for each seed.
 TBitmap32 Picture(int width, int height, int seed) {
-  TBitmap32 p(width, height);
-  for (int y = 0; y < height; ++y) {
-    Pixel* row = p.ScanLine(y);
-    for (int x = 0; x < width; ++x)
-      row[x] = Pixel{static_cast<std::uint8_t>((x * 37 + seed * 11) & 255),
-                     static_cast<std::uint8_t>((y * 53 + x * x + seed) & 255),
-                     static_cast<std::uint8_t>(((x + y) % 3) * 120), 255};
-  }
+  TBitmap32 p = RandomPicture(width, height, static_cast<unsigned>(seed));
+  SetAlphaChannel(p, 255);
   return p;
 }
 

@@ -14,6 +14,7 @@
 
 #include "batch/batch_convert.h"
 #include "codecs/picture_file.h"
+#include "tests/imaging/random_picture.h"
 
 namespace quillane {
 namespace {
@@ -21,12 +22,8 @@ namespace {
 namespace fs = std::filesystem;
 
 TBitmap32 Picture(int width, int height, int seed) {
-  TBitmap32 p(width, height);
-  for (int y = 0; y < height; ++y)
-    for (int x = 0; x < width; ++x)
-      p.At(x, y) = Pixel{static_cast<std::uint8_t>(x * 37 + seed * 11),
-                         static_cast<std::uint8_t>(y * 53 + x * x + seed),
-                         static_cast<std::uint8_t>((x + y) % 3 * 120), 255};
+  TBitmap32 p = RandomPicture(width, height, static_cast<unsigned>(seed));
+  SetAlphaChannel(p, 255);
   return p;
 }
 

@@ -1,52 +1,27 @@
 // quillane-cli rotate, resize and convert, run as built on real files and checked against the
 // routines run here.
-#include <gtest/gtest.h>
-#include <stdlib.h>
-#include <sys/wait.h>
-
-#include <filesystem>
 #include <fstream>
-#include <iterator>
 #include <string>
 
 #include "codecs/picture_file.h"
 #include "document/reshape.h"
+#include "tests/cli/cli_run.h"
 #include "tests/imaging/random_picture.h"
 
 namespace quillane {
 namespace {
 
-namespace fs = std::filesystem;
-
-class PictureCommands : public ::testing::Test {
+class PictureCommands : public CliRun {
  protected:
   void SetUp() override {
-    std::string pattern = (fs::temp_directory_path() / "quillane-cli-XXXXXX").string();
-    ASSERT_NE(mkdtemp(pattern.data()), nullptr);
-    dir_ = pattern;
+    CliRun::SetUp();
     opened_ = RandomPicture(521, 346, 5);
     SetAlphaChannel(opened_, 255);  // as the program opens the bitmap
     SaveBitmap24(opened_, Path("in.bmp"));
     SaveBitmap24(TBitmap32(2, 1), Path("thin.bmp"));
   }
-  void TearDown() override { fs::remove_all(dir_); }
+  std::string Read(const std::string& name) const { return ReadText(Path(name)); }
 
-  std::string Path(const std::string& name) const { return dir_ + "/" + name; }
-  std::string Read(const std::string& name) const {
-    std::ifstream in(Path(name), std::ios::binary);
-    return {std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
-  }
-  // Runs quillane-cli in the test's folder; its exit code, with what it said in err_.
-  int Run(const std::string& arguments, const std::string& shellPrefix = "") {
-    const int status = std::system((shellPrefix + "cd '" + dir_ + "' && '" + QUILLANE_CLI_PATH +
-                                    "' " + arguments + " >out.txt 2>err.txt")
-                                       .c_str());
-    err_ = Read("err.txt");
-    return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
-  }
-
-  std::string dir_;
-  std::string err_;
   TBitmap32 opened_;
 };
 

@@ -20,45 +20,6 @@ TEST(PictureDocument, StartsWithOnePictureEverywhereHeldOnce) {
   EXPECT_EQ(doc.CurrentSlot(), 1);
 }
 
-TEST(PictureDocument, TwentyFiveStepsKeepTwentyUndos) {
-  PictureDocument doc(Flat(2, 2, 0));
-  for (int i = 1; i <= 25; ++i) {
-    doc.SetWorking(Flat(2, 2, static_cast<std::uint8_t>(i)));
-    doc.Backup();
-    EXPECT_EQ(doc.Slot(doc.CurrentSlot()).Data(), doc.Working().Data());  // the same, not a copy
-  }
-  EXPECT_EQ(doc.UndoCount(), 20);
-  for (int i = 0; i < 20; ++i) {
-    ASSERT_TRUE(doc.Undo());
-    EXPECT_EQ(doc.UndoCount() + doc.RedoCount(), 20);
-  }
-  EXPECT_EQ(doc.Working(), Flat(2, 2, 5));
-  EXPECT_FALSE(doc.Undo());
-  EXPECT_EQ(doc.Working(), Flat(2, 2, 5));
-  for (int i = 0; i < 20; ++i) ASSERT_TRUE(doc.Redo());
-  EXPECT_EQ(doc.Working(), Flat(2, 2, 25));
-  EXPECT_FALSE(doc.Redo());
-}
-
-TEST(PictureDocument, NewStepAfterUndoDiscardsRedo) {
-  PictureDocument doc(Flat(2, 2, 0));
-  doc.SetWorking(Flat(2, 2, 1));
-  doc.Backup();
-  doc.SetWorking(Flat(2, 2, 2));
-  doc.Backup();
-  doc.Undo();
-  doc.Undo();
-  EXPECT_EQ(doc.Working(), Flat(2, 2, 0));
-  EXPECT_EQ(doc.RedoCount(), 2);
-  doc.SetWorking(Flat(2, 2, 9));
-  doc.Backup();
-  EXPECT_FALSE(doc.CanRedo());
-  EXPECT_EQ(doc.CurrentSlot(), 2);
-  EXPECT_EQ(doc.Slot(2), Flat(2, 2, 9));
-  doc.Undo();
-  EXPECT_EQ(doc.Working(), Flat(2, 2, 0));
-}
-
 TEST(PictureDocument, UndoAfterResizeResamplesSourceOnlyWhenWidthDiffers) {
   PictureDocument doc(Flat(10, 10, 0));
   // A smaller picture recorded, then the larger state restored by Undo: the source follows.

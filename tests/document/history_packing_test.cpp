@@ -42,37 +42,48 @@ TEST(PictureDocument, UndoAndRedoAfterPackingGiveBackTheExactStates) {
     states.push_back(Noise(40 + static_cast<int>(i % 3), 30, i));
     doc.SetWorking(states.back());
     doc.Backup();
+    EXPECT_EQ(doc.Slot(doc.CurrentSlot()).Data(), doc.Working().Data());  // the same, not a copy
   }
+  EXPECT_EQ(doc.UndoCount(), 20);
   PictureDocument::WaitForHistoryPacking();
   const PictureDocument copy = doc;
   const auto shown = doc.SharedWorking();  // a picture someone still holds must not change
   for (int i = 23; i >= 4; --i) {
     ASSERT_TRUE(doc.Undo());
     EXPECT_EQ(doc.Working(), states[static_cast<std::size_t>(i)]) << i;
+    EXPECT_EQ(doc.UndoCount() + doc.RedoCount(), 20);
   }
   EXPECT_FALSE(doc.Undo());
+  EXPECT_EQ(doc.Working(), states[4]);
   EXPECT_EQ(*shown, states[24]);
   for (int i = 5; i <= 24; ++i) {
     ASSERT_TRUE(doc.Redo());
     EXPECT_EQ(doc.Working(), states[static_cast<std::size_t>(i)]) << i;
   }
+  EXPECT_FALSE(doc.Redo());
   EXPECT_EQ(copy.Working(), states[24]);
   EXPECT_EQ(copy.Slot(copy.CurrentSlot() == 1 ? 21 : copy.CurrentSlot() - 1), states[23]);
 }
 
-TEST(PictureDocument, StatesThatCannotBeReachedAreLetGo) {
-  PictureDocument doc(TBitmap32(2, 2, Pixel{1, 1, 1, 255}));
+TEST(PictureDocument, ANewStepAfterUndoDiscardsRedoAndLetsUnreachableStatesGo) {
+  const auto flat = [](std::uint8_t v) { return TBitmap32(2, 2, Pixel{v, v, v, 255}); };
+  PictureDocument doc(flat(1));
   for (std::uint8_t v = 2; v <= 4; ++v) {
-    doc.SetWorking(TBitmap32(2, 2, Pixel{v, v, v, 255}));
+    doc.SetWorking(flat(v));
     doc.Backup();
   }
   doc.Undo();
   doc.Undo();
-  doc.SetWorking(TBitmap32(2, 2, Pixel{9, 9, 9, 255}));
+  EXPECT_EQ(doc.RedoCount(), 2);
+  doc.SetWorking(flat(9));
   doc.Backup();  // slot 3 now holds 9; slot 4 (state 4) can no longer be reached
-  EXPECT_EQ(doc.Slot(3), TBitmap32(2, 2, Pixel{9, 9, 9, 255}));
+  EXPECT_FALSE(doc.CanRedo());
+  EXPECT_EQ(doc.CurrentSlot(), 3);
+  EXPECT_EQ(doc.Slot(3), flat(9));
   EXPECT_TRUE(doc.Slot(4).Empty());
-  EXPECT_EQ(doc.Slot(1), TBitmap32(2, 2, Pixel{1, 1, 1, 255}));
+  EXPECT_EQ(doc.Slot(1), flat(1));
+  doc.Undo();
+  EXPECT_EQ(doc.Working(), flat(2));
 }
 
 }  // namespace

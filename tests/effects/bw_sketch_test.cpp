@@ -8,22 +8,6 @@
 namespace quillane {
 namespace {
 
-Pixel Gray(std::uint8_t v) {
-  return Pixel{v, v, v, 255};
-}
-
-TEST(PencilSketch, FlatPictureGivesUniformTones) {
-  const TBitmap32 flat(6, 5, Pixel{40, 90, 200, 255});
-  for (int v : {128, 200, 255})
-    EXPECT_EQ(peccilsketch(flat, PencilToneMode::Lighting, 0, v), TBitmap32(6, 5, Gray(255)));
-  for (int c : {45, 60, 89})
-    EXPECT_EQ(peccilsketch(flat, PencilToneMode::Contrast, c, 0), TBitmap32(6, 5, Gray(255)));
-  EXPECT_EQ(peccilsketch(flat, PencilToneMode::Contrast, 10, 0), TBitmap32(6, 5, Gray(250)));
-  EXPECT_EQ(peccilsketch(flat, PencilToneMode::Contrast, 0, 0), TBitmap32(6, 5, Gray(255)));
-  EXPECT_EQ(peccilsketch(flat, PencilToneMode::Lighting, 45, 0), TBitmap32(6, 5, Gray(0)));
-  EXPECT_EQ(peccilsketch(flat, PencilToneMode::Lighting, 45, 100), TBitmap32(6, 5, Gray(199)));
-}
-
 TBitmap32 Scene() {
   TBitmap32 b(9, 7);
   for (int y = 0; y < 7; ++y)

@@ -2,25 +2,16 @@
 
 #include <gtest/gtest.h>
 
+#include "tests/imaging/random_picture.h"
+
 namespace quillane {
 namespace {
 
 const Pixel kWhite{255, 255, 255, 255};
 
-// Colours of every kind: grays, saturated and muddy ones, edges in all directions.
+// Three pixels in four gray, the rest any colour: flat areas, grays and edges everywhere.
 TBitmap32 Varied(int w, int h) {
-  TBitmap32 b(w, h);
-  for (int y = 0; y < h; ++y)
-    for (int x = 0; x < w; ++x) {
-      const unsigned v =
-          (static_cast<unsigned>(x) * 2654435761u) ^ (static_cast<unsigned>(y) * 40503u);
-      b.At(x, y) = (x / 3 + y / 2) % 5 == 0
-                       ? Pixel{static_cast<std::uint8_t>(x * 7), static_cast<std::uint8_t>(x * 7),
-                               static_cast<std::uint8_t>(x * 7), 255}
-                       : Pixel{static_cast<std::uint8_t>(v), static_cast<std::uint8_t>(v >> 8),
-                               static_cast<std::uint8_t>(v >> 16), 255};
-    }
-  return b;
+  return RandomPicture(w, h, 3, true);
 }
 
 TEST(ColorPencil, FlatAreasTurnWhiteAndStrongEdgesKeepTheirColour) {

@@ -13,10 +13,6 @@ namespace {
 const Kernel kPopArt{-1, -2, -1, 0, 0, 0, 1, 2, 1};
 const Pixel kWhite{255, 255, 255, 255};
 
-TBitmap32 Noise(int w, int h) {
-  return RandomPicture(w, h, 5);
-}
-
 // The levels down the middle column (vertical) or along the middle row of the result on a
 // 6 x 6 picture of level first before the middle and second after it.
 std::vector<int> AcrossEdge(TBitmap32 (*effect)(const TBitmap32&, const Kernel&), const Kernel& k,
@@ -63,14 +59,13 @@ TEST(KernelGradient, SmallPicturesRepeatTheirInnerLineInverted) {
 
 TEST(KernelGradient, RowsOfBytesGiveTheReferenceBytes) {
   constexpr std::int64_t kMax = std::numeric_limits<std::int32_t>::max();
-  const TBitmap32 noise = Noise(29, 13);
   for (Gradient g : {Gradient::LeftMinusRight, Gradient::RightMinusLeftSobel})
     for (const Kernel& k :
          {kPopArt, Kernel{-1, -1, -1, 0, 0, 0, -1, -1, -1}, Kernel{0, 0, 0, 0, 1},
           Kernel{-3, 17, 0, 0, -100, 8}, Kernel{kMax, 0, 0, 0, 0, 0, 0, 0, -kMax}})
       for (auto [w, h] : {std::pair{29, 13}, {3, 3}, {1, 4}, {0, 0}})
-        ASSERT_EQ(KernelGradientFilter(Noise(w, h), k, g),
-                  KernelGradientReference(Noise(w, h), k, g));
+        ASSERT_EQ(KernelGradientFilter(RandomPicture(w, h, 5), k, g),
+                  KernelGradientReference(RandomPicture(w, h, 5), k, g));
   // Sums beyond 32 bits clamp: any channel that is not 0 where the weight is gives 255, drawn
   // black.
   EXPECT_EQ(popart(TBitmap32(3, 3, Pixel{0, 1, 2, 255}), Kernel{kMax, kMax, kMax}),

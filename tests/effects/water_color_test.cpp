@@ -2,21 +2,13 @@
 
 #include <gtest/gtest.h>
 
+#include "tests/imaging/random_picture.h"
+
 namespace quillane {
 namespace {
 
 TBitmap32 Noise(int w, int h, unsigned seed) {
-  TBitmap32 b(w, h);
-  for (int y = 0; y < h; ++y)
-    for (int x = 0; x < w; ++x) {
-      seed = seed * 1103515245u + 12345u;
-      // Mostly mid tones with some extremes, so that the sharpening clamps on both sides.
-      b.At(x, y) =
-          Pixel{static_cast<std::uint8_t>(seed >> 24), static_cast<std::uint8_t>(seed >> 16),
-                static_cast<std::uint8_t>(seed % 7 == 0 ? 255 : seed >> 8),
-                static_cast<std::uint8_t>(seed >> 4)};
-    }
-  return b;
+  return RandomPicture(w, h, seed);
 }
 
 TEST(WaterColor, MediansRemoveSpecksAndLinesButKeepTheEdgeOfTwoAreas) {

@@ -91,6 +91,7 @@ TEST(PencilLightingPass, AllPositionsAtTheExtremes) {
         ASSERT_EQ(out.At(x, y), (Pixel{e, e, e, 255})) << x << "," << y << " v=" << v;
       }
   }
+  EXPECT_TRUE(PencilLightingPass(TBitmap32(), 45).Empty());
 }
 
 class EveryHsl : public ::testing::TestWithParam<int> {};
