@@ -112,6 +112,7 @@ TEST_F(MainWindow, UndoSizesThePictureByTheZoomLabel) {
   // it back from there, while Renew uses the zoom itself.
   const QLocale previous;
   QLocale::setDefault(QLocale(QLocale::German));
+  EXPECT_EQ(TMyPicture::ZoomLabelText(1455.19), "1455,2%");  // and no group separator
   Apply(Flat(30, 20, 1), "Changed");
   MainChild<QLabel>("Label5")->setText("41,0%");
   EXPECT_EQ(Main().ZoomFromLabel(), 41.0);
