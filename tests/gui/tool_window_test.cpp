@@ -23,8 +23,9 @@ int VisibleToolWindows(TMyPicture& main) {
   return visible;
 }
 
-TEST_F(ToolWindows, EveryMenuEntryOpensItsOwnWindowAlone) {
+TEST_F(ToolWindows, EveryMenuEntryOpensItsOwnWindowAloneBesideTheMainWindow) {
   ASSERT_EQ(Effects().size(), 17u);
+  const QRect main = Main().frameGeometry();
   for (const EffectSpec* spec : Effects()) {
     QAction* entry = MenuAction(EntryName(*spec));
     ASSERT_NE(entry, nullptr) << spec->menuHandler;
@@ -32,6 +33,8 @@ TEST_F(ToolWindows, EveryMenuEntryOpensItsOwnWindowAlone) {
     EXPECT_TRUE(Tool(spec->toolNumber).isVisible()) << spec->windowClass;
     EXPECT_EQ(Main().ActiveTool(), spec->toolNumber) << spec->windowClass;
     EXPECT_EQ(VisibleToolWindows(Main()), 1) << spec->windowClass;
+    const QRect frame = Tool(spec->toolNumber).frameGeometry();
+    EXPECT_EQ(frame.topLeft(), QPoint(main.right() - frame.width() - 24, main.top() + 84));
   }
 }
 
@@ -76,15 +79,6 @@ TEST_F(ToolWindows, ChoosingTheOpenWindowAgainShowsItAfresh) {
   EXPECT_TRUE(Tool(1).isVisible());
   EXPECT_EQ(Main().ActiveTool(), 1);
   EXPECT_FALSE(colorUp->isEnabled());
-}
-
-TEST_F(ToolWindows, WindowsOpenBesideTheMainWindow) {
-  MenuAction("Emboss1")->trigger();
-  const QRect main = Main().frameGeometry();
-  const ToolWindow& emboss = Tool(15);
-  EXPECT_EQ(
-      emboss.frameGeometry().topLeft(),
-      QPoint(main.left() + main.width() - emboss.frameGeometry().width() - 25, main.top() + 84));
 }
 
 TEST_F(ToolWindows, BatchPanelFoldsOutAndBackIn) {
