@@ -1,14 +1,10 @@
 // The windows of the ColorAdjust and Veins menus, driven by their control names.
 #include <QCheckBox>
-#include <QLabel>
-#include <QLineEdit>
 #include <QPushButton>
 #include <QRadioButton>
-#include <QSlider>
-#include <QToolButton>
 
 #include "batch/batch_convert_ok.h"
-#include "codecs/picture_file.h"
+#include "data/texture_tiles.h"
 #include "effects/adjust/color_filter.h"
 #include "effects/adjust/color_panel.h"
 #include "effects/adjust/color_variety.h"
@@ -17,7 +13,8 @@
 #include "effects/surface/emboss.h"
 #include "effects/surface/snapshot_window.h"
 #include "effects/surface/stria.h"
-#include "tests/gui/temp_folder.h"
+#include "effects/surface/texture.h"
+#include "tests/gui/window_helpers.h"
 #include "ui/picture_view.h"
 
 namespace quillane {
@@ -26,60 +23,30 @@ namespace {
 constexpr int kHsl = 11;
 constexpr int kVariety = 12;
 constexpr int kPanel = 13;
+constexpr int kTexture = 14;
 constexpr int kEmboss = 15;
 constexpr int kFilter = 16;
 constexpr int kStria = 17;
 
-class AdjustWindows : public FileGuiTest {
- protected:
-  ToolWindow& Open(const char* menuAction, int number) {
-    MenuAction(menuAction)->trigger();
-    return Tool(number);
-  }
-  QString Text(int number, const char* label) { return ToolChild<QLabel>(number, label)->text(); }
-  void Slide(int number, const char* slider, int value) {
-    ToolChild<QSlider>(number, slider)->setValue(value);
-  }
-  const TBitmap32& Source() { return Main().Document().Source(); }
-  void ClickOn(int number, const char* name) {
-    quillane::ClickOn(ToolChild<QWidget>(number, name));
-  }
-  const TBitmap32& Working() { return Main().Document().Working(); }
-
-  // One picture in folder "in" converted by the open window into "out"; the output's name.
-  std::vector<std::string> ConvertOnePicture(int number, const char* inputField,
-                                             const char* outputField) {
-    std::filesystem::create_directory(LocalPath("in"));
-    SaveBitmap24(TestPicture(13, 9), LocalPath("in/p.bmp"));
-    platform_.folderAnswers.push_back(Path("in"));
-    ToolChild<QToolButton>(number, "SpeedButton1")->click();
-    ToolChild<QToolButton>(number, "SpeedButton2")->click();
-    ToolChild<QLineEdit>(number, outputField)->setText(Path("out"));
-    EXPECT_EQ(ToolChild<QLineEdit>(number, inputField)->text(), Path("in"));
-    ToolChild<QToolButton>(number, "SpeedButton4")->click();
-    EXPECT_TRUE(Main().BatchConvertOk().isVisible());
-    return Entries("out");
-  }
-};
+using AdjustWindows = WindowTest;
 
 TEST_F(AdjustWindows, EmbossAppliesOnButton2AndRecordsEachBatchPicture) {
-  Open("Emboss1", kEmboss);
-  EXPECT_EQ(Text(kEmboss, "Label9"), "100");
-  EXPECT_EQ(Text(kEmboss, "Label3"), "3");
+  Open(kEmboss);
   Slide(kEmboss, "TrackBar2", 5);
-  ToolChild<QPushButton>(kEmboss, "Button2")->click();
+  EXPECT_EQ(Text(kEmboss, "Label3"), "5");
+  Press(kEmboss, "Button2");
   EXPECT_EQ(Working(), emboss(Source(), 100, 5));
   EXPECT_EQ(Main().StatusText(), "Emboss");
-  EXPECT_EQ(ConvertOnePicture(kEmboss, "Edit10", "Edit11"),
-            std::vector<std::string>{"p-Emboss.jpg"});
+  MakeInput({TestPicture(13, 9)});
+  EXPECT_EQ(Convert(kEmboss), std::vector<std::string>{"a-Emboss.jpg"});
+  EXPECT_TRUE(Main().BatchConvertOk().isVisible());
   EXPECT_EQ(Working(), emboss(Source(), 100, 5));
-  EXPECT_EQ(Main().Document().UndoCount(), 2);
+  EXPECT_EQ(Steps(), 2);
 }
 
 TEST_F(AdjustWindows, HslAdjustShowsSignedNumbersAndStartsNeutralOnEveryShowing) {
-  Open("HSLadjust1", kHsl);
+  Open(kHsl);
   EXPECT_EQ(ToolChild<QToolButton>(kHsl, "SpeedButton1"), nullptr);
-  for (const char* label : {"Label4", "Label3", "Label9"}) EXPECT_EQ(Text(kHsl, label), "0");
   for (auto [position, shown] : {std::pair{0, "-100"}, {181, "1"}, {270, "50"}}) {
     Slide(kHsl, "TrackBar1", position);
     EXPECT_EQ(Text(kHsl, "Label4"), shown) << position;
@@ -87,88 +54,119 @@ TEST_F(AdjustWindows, HslAdjustShowsSignedNumbersAndStartsNeutralOnEveryShowing)
   Slide(kHsl, "TrackBar2", 0);
   Slide(kHsl, "TrackBar3", 130);
   EXPECT_EQ(Text(kHsl, "Label3"), "-100");
-  ToolChild<QPushButton>(kHsl, "Button1")->click();
+  Press(kHsl, "Button1");
   EXPECT_EQ(Working(), HslAdjust(Source(), 270, 0, 130));
   EXPECT_EQ(Main().StatusText(), "HSL Adjusted");
-  EXPECT_EQ(Main().Document().UndoCount(), 1);
-
   Tool(kHsl).close();
-  Open("HSLadjust1", kHsl);
-  EXPECT_EQ(ToolChild<QSlider>(kHsl, "TrackBar1")->value(), 180);
+  Open(kHsl);
+  EXPECT_EQ(Child<QSlider>(kHsl, "TrackBar1")->value(), 180);
   EXPECT_EQ(Text(kHsl, "Label9"), "0");
 }
 
 TEST_F(AdjustWindows, StriaTakesItsColourFromTheDialogAndStartsFromTheSnapshot) {
-  Open("Emboss1", kEmboss);
-  ToolChild<QPushButton>(kEmboss, "Button2")->click();
+  Open(kEmboss);
+  Press(kEmboss, "Button2");
   const TBitmap32 embossed = Working();
-  Open("Verticalstria1", kStria);
-  EXPECT_EQ(Text(kStria, "Label9"), "50");
+  Open(kStria);
   Slide(kStria, "TrackBar1", 40);
   EXPECT_EQ(Text(kStria, "Label9"), "16");
   Slide(kStria, "TrackBar3", 2);
-  ToolChild<QRadioButton>(kStria, "RadioButton2")->setChecked(true);
+  Press(kStria, "RadioButton2");
   platform_.colorAnswers.push_back(0x0000FF);
-  ClickOn(kStria, "ColorPanel");
+  ClickOn(Child(kStria, "ColorPanel"));
   EXPECT_EQ(platform_.colorRequests, std::vector<std::uint32_t>{0});
 
   // With "For current" both presses start from the picture as it was when the window opened.
   const TBitmap32 expected = stria(embossed, Source().Width(), Source().Height(),
                                    StriaDirection::Horizontal, 2, 2, 40, 0xFF);
   for (int press = 1; press <= 2; ++press) {
-    ToolChild<QPushButton>(kStria, "Button1")->click();
+    Press(kStria, "Button1");
     EXPECT_EQ(Working(), expected);
     EXPECT_EQ(Main().StatusText(), "Added stria");
-    EXPECT_EQ(Main().Document().UndoCount(), 1 + press);
+    EXPECT_EQ(Steps(), 1 + press);
   }
-  ToolChild<QCheckBox>(kStria, "CheckBox1")->setChecked(false);
-  ToolChild<QPushButton>(kStria, "Button1")->click();
+  Child<QCheckBox>(kStria, "CheckBox1")->setChecked(false);
+  Press(kStria, "Button1");
   EXPECT_EQ(Working(), stria(Source(), Source().Width(), Source().Height(),
                              StriaDirection::Horizontal, 2, 2, 40, 0xFF));
   Tool(kStria).close();
-  Open("Verticalstria1", kStria);
-  EXPECT_TRUE(ToolChild<QCheckBox>(kStria, "CheckBox1")->isChecked());
+  Open(kStria);
+  EXPECT_TRUE(Child<QCheckBox>(kStria, "CheckBox1")->isChecked());
 }
 
-TEST_F(AdjustWindows, StriaBatchStripesEachSourceAndRefreshesTheSnapshot) {
-  Open("Verticalstria1", kStria);
-  EXPECT_EQ(ConvertOnePicture(kStria, "Edit1", "Edit2"), std::vector<std::string>{"p-Stria.jpg"});
-  EXPECT_FALSE(ToolChild<QCheckBox>(kStria, "CheckBox1")->isChecked());
-  EXPECT_EQ(Working(), stria(Source(), 13, 9, StriaDirection::Vertical, 1, 2, 128, 0));
-  EXPECT_EQ(dynamic_cast<SnapshotWindow&>(Tool(kStria)).Snapshot(), Working());
-  EXPECT_EQ(Main().Document().UndoCount(), 1);
+TEST_F(AdjustWindows, TextureTileClicksChooseAndOkStartsFromTheSnapshot) {
+  Open(kTexture);
+  for (int n = 1; n <= kTextureTiles; ++n) {
+    EXPECT_EQ(Child(kTexture, qPrintable(QString("texture%1").arg(n)))->cursor().shape(),
+              n <= 4 ? Qt::PointingHandCursor : Qt::ArrowCursor);
+    EXPECT_EQ(
+        Child<QRadioButton>(kTexture, qPrintable(QString("RadioButton%1").arg(n)))->isChecked(),
+        n == 4);
+  }
+  Slide(kTexture, "TrackBar1", 80);
+  ClickOn(Child(kTexture, "texture7"));
+  EXPECT_TRUE(Child<QRadioButton>(kTexture, "RadioButton7")->isChecked());
+  // Two presses with different tiles do not pile up: both start from the picture as shown.
+  const TBitmap32 shown = Working();
+  for (int n : {7, 12}) {
+    Press(kTexture, qPrintable(QString("RadioButton%1").arg(n)));
+    Press(kTexture, "Button1");
+    EXPECT_EQ(Working(), texture(shown, TextureTile(n), 80));
+    EXPECT_EQ(Main().StatusText(), "Made texture");
+  }
+  EXPECT_EQ(Steps(), 2);
+}
+
+TEST_F(AdjustWindows, SnapshotBatchesWorkOnEachSourceAndRefreshTheSnapshot) {
+  MakeInput({TestPicture(13, 9)});
+  const struct {
+    int tool;
+    const char* written;
+    std::function<TBitmap32(const TBitmap32&)> effect;
+  } cases[] = {
+      {kStria, "a-Stria.jpg",
+       [](const TBitmap32& p) { return stria(p, 13, 9, StriaDirection::Vertical, 1, 2, 128, 0); }},
+      {kTexture, "a-Texture.jpg",
+       [](const TBitmap32& p) { return texture(p, TextureTile(4), 50); }},
+  };
+  for (const auto& c : cases) {
+    std::filesystem::remove_all(LocalPath("out"));
+    Open(c.tool);
+    const int steps = Steps();
+    EXPECT_EQ(Convert(c.tool), std::vector<std::string>{c.written});
+    EXPECT_FALSE(Child<QCheckBox>(c.tool, "CheckBox1")->isChecked());
+    EXPECT_EQ(Working(), c.effect(Source()));
+    EXPECT_EQ(dynamic_cast<SnapshotWindow&>(Tool(c.tool)).Snapshot(), Working());
+    EXPECT_EQ(Steps(), steps + 1) << c.written;
+  }
 }
 
 TEST_F(AdjustWindows, ColorPanelAppliesALayoutWhenItBecomesSelected) {
-  Open("Colorpanel1", kPanel);
+  Open(kPanel);
   EXPECT_EQ(ToolChild<QPushButton>(kPanel, "Button1"), nullptr);
-  const auto click = [&](const char* name) { ToolChild<QRadioButton>(kPanel, name)->click(); };
-  struct Case {
-    const char* button;
-    PanelLayout layout;
-    const char* status;
-  } const cases[] = {{"RadioButton5", PanelLayout::Pane3x3, "Color Pane"},
-                     {"RadioButton6", PanelLayout::Catercorner16, "Color Catercorner"},
-                     {"RadioButton4", PanelLayout::Panel3x3, "Color Panels"}};
+  const std::tuple<const char*, PanelLayout, const char*> cases[] = {
+      {"RadioButton5", PanelLayout::Pane3x3, "Color Pane"},
+      {"RadioButton6", PanelLayout::Catercorner16, "Color Catercorner"},
+      {"RadioButton4", PanelLayout::Panel3x3, "Color Panels"}};
   int steps = 0;
-  for (const Case& c : cases) {
-    click(c.button);
-    EXPECT_EQ(Working(), ColorPanel(Source(), c.layout)) << c.button;
-    EXPECT_EQ(Main().StatusText(), c.status);
-    EXPECT_EQ(Main().Document().UndoCount(), ++steps);
+  for (const auto& [button, layout, status] : cases) {
+    Press(kPanel, button);
+    EXPECT_EQ(Working(), ColorPanel(Source(), layout)) << button;
+    EXPECT_EQ(Main().StatusText(), status);
+    EXPECT_EQ(Steps(), ++steps);
   }
-  click("RadioButton4");  // already selected: nothing happens
-  EXPECT_EQ(Main().Document().UndoCount(), steps);
+  Press(kPanel, "RadioButton4");  // already selected: nothing happens
+  EXPECT_EQ(Steps(), steps);
   Tool(kPanel).close();
-  Open("Colorpanel1", kPanel);
-  EXPECT_TRUE(ToolChild<QRadioButton>(kPanel, "RadioButton4")->isChecked());
+  Open(kPanel);
+  EXPECT_TRUE(Child<QRadioButton>(kPanel, "RadioButton4")->isChecked());
 }
 
 // Panel 3 x 3 on a picture under 3 pixels leaves nothing to show; what follows must cope.
 TEST_F(AdjustWindows, AnEmptyWorkingPictureIsRefusedWhereNothingCanBeDone) {
   Main().ShowNewPicture(TestPicture(2, 5), true);
-  Open("Colorpanel1", kPanel);
-  ToolChild<QRadioButton>(kPanel, "RadioButton4")->click();
+  Open(kPanel);
+  Press(kPanel, "RadioButton4");
   ASSERT_TRUE(Working().Empty());
   EXPECT_EQ(Main().StatusText(), "Color Panels");
 
@@ -180,11 +178,11 @@ TEST_F(AdjustWindows, AnEmptyWorkingPictureIsRefusedWhereNothingCanBeDone) {
       << platform_.errors[0].toStdString();
   Main().SetDisplaySize(250);
 
-  Open("Verticalstria1", kStria);  // "For current": stripes over nothing
-  ToolChild<QPushButton>(kStria, "Button1")->click();
+  Open(kStria);  // "For current": stripes over nothing
+  Press(kStria, "Button1");
   EXPECT_TRUE(Working().Empty());
-  Open("Emboss1", kEmboss);  // from the source, which is still there
-  ToolChild<QPushButton>(kEmboss, "Button2")->click();
+  Open(kEmboss);  // from the source, which is still there
+  Press(kEmboss, "Button2");
   EXPECT_EQ(Working(), emboss(Source(), 100, 3));
   Main().SpeedButton3Click();
   Main().SpeedButton3Click();
@@ -193,46 +191,41 @@ TEST_F(AdjustWindows, AnEmptyWorkingPictureIsRefusedWhereNothingCanBeDone) {
 }
 
 TEST_F(AdjustWindows, ColorFilterPreviewsEachSwatchAndOkAppliesThePreview) {
-  Open("ColorFilter2", kFilter);
   auto& window = dynamic_cast<PreviewWindow&>(Tool(kFilter));
-  const auto* image2 = ToolChild<PictureView>(kFilter, "Image2");
-  EXPECT_EQ(ToolChild<PictureView>(kFilter, "Image1")->geometry(), QRect(2, 19, 105, 72));
-  EXPECT_EQ(image2->geometry(), QRect(2, 19, 105, 72));
-  ToolChild<QRadioButton>(kFilter, "Panel6")->click();
+  Open(kFilter);
+  Press(kFilter, "Panel6");
   EXPECT_EQ(window.Preview(), filter(Source(), ColorFilterKind::Yellow));
-  EXPECT_EQ(image2->Image(), OpaqueImage(window.Preview()));
-  ClickOn(kFilter, "Image1");  // Reset
+  EXPECT_EQ(Child<PictureView>(kFilter, "Image2")->Image(), OpaqueImage(window.Preview()));
+  ClickOn(Child(kFilter, "Image1"));  // Reset
   EXPECT_EQ(window.Preview(), Source());
-  ToolChild<QRadioButton>(kFilter, "Panel6")->click();  // the same swatch again after a reset
+  Press(kFilter, "Panel6");  // the same swatch again after a reset
   EXPECT_EQ(window.Preview(), filter(Source(), ColorFilterKind::Yellow));
-  ToolChild<QRadioButton>(kFilter, "Panel4")->click();  // replaces, does not add
+  Press(kFilter, "Panel4");  // replaces, does not add
   EXPECT_EQ(Working(), Source());
-  ToolChild<QPushButton>(kFilter, "Button1")->click();
+  Press(kFilter, "Button1");
   EXPECT_EQ(Working(), filter(Source(), ColorFilterKind::Green));
   EXPECT_EQ(Main().StatusText(), "Color Filter");
-  EXPECT_EQ(Main().Document().UndoCount(), 1);
+  EXPECT_EQ(Steps(), 1);
   EXPECT_FALSE(Tool(kFilter).isVisible());
   EXPECT_EQ(Main().ActiveTool(), 0);
 }
 
 TEST_F(AdjustWindows, ColorVarietyAccumulatesClicksAndForCurrentStartsAgain) {
   Main().SetWorkingPicture(TestPicture(10, 30), true);
-  Open("Colorvariety1", kVariety);
   auto& window = dynamic_cast<PreviewWindow&>(Tool(kVariety));
+  Open(kVariety);
   EXPECT_EQ(window.Base(), Source());
-  for (const char* swatch : {"Panel6", "Panel6", "Panel3"})
-    ToolChild<QPushButton>(kVariety, swatch)->click();
+  for (const char* swatch : {"Panel6", "Panel6", "Panel3"}) Press(kVariety, swatch);
   EXPECT_EQ(window.Preview(), VarietyClicks(Source(), {4, 4, 1}));
-  ToolChild<QCheckBox>(kVariety, "CheckBox1")->setChecked(true);
+  Child<QCheckBox>(kVariety, "CheckBox1")->setChecked(true);
   EXPECT_EQ(window.Preview(), TestPicture(10, 30));
-  EXPECT_EQ(ToolChild<PictureView>(kVariety, "Image1")->geometry(), QRect(37, 2, 37, 105));
-  ToolChild<QPushButton>(kVariety, "Panel5")->click();
-  ToolChild<QPushButton>(kVariety, "Button1")->click();
+  Press(kVariety, "Panel5");
+  Press(kVariety, "Button1");
   EXPECT_EQ(Working(), variety(TestPicture(10, 30), 3));
   EXPECT_EQ(Main().StatusText(), "Color Varied");
-  EXPECT_EQ(Main().Document().UndoCount(), 2);
-  Open("Colorvariety1", kVariety);
-  EXPECT_FALSE(ToolChild<QCheckBox>(kVariety, "CheckBox1")->isChecked());
+  EXPECT_EQ(Steps(), 2);
+  Open(kVariety);
+  EXPECT_FALSE(Child<QCheckBox>(kVariety, "CheckBox1")->isChecked());
   EXPECT_EQ(window.Preview(), Source());
 }
 

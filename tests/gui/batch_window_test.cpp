@@ -129,11 +129,10 @@ TEST_F(BatchWindow, ConvertWritesOnePencilSketchPerPicture) {
   EXPECT_FALSE(Completion().isModal());
   EXPECT_EQ(Completion().findChild<QLabel*>("Label1")->text(), "The batch convert is successful.");
 
-  // A second run goes again; the pictures' bytes are the batch loop's own tests.
+  // One button closes the notice, the other also opens the output folder.
   Completion().findChild<QToolButton*>("SpeedButton1")->click();
   EXPECT_FALSE(Completion().isVisible());
   Button("SpeedButton4")->click();
-  // Its other button opens the output folder.
   ASSERT_TRUE(Completion().isVisible());
   Completion().findChild<QToolButton*>("SpeedButton2")->click();
   EXPECT_EQ(platform_.openedFolders, std::vector<QString>{Path("out/deeper/still")});

@@ -94,7 +94,7 @@ TEST_F(FreehandWindows, ColorUpOfADrawingWindowOpensThePair) {
   MenuAction("Pensketch1")->trigger();
   ToolChild<QPushButton>(2, "Button1")->click();
   ToolChild<QToolButton>(2, "Button2")->click();
-  EXPECT_TRUE(Area().isVisible() && Panel().isVisible());
+  EXPECT_TRUE(Area().isVisible() && Panel().isVisible() && Tool(2).isVisible());
   EXPECT_EQ(Area().Picture(), Main().Document().Working());
   EXPECT_TRUE(Control<QPushButton>("Button8")->isEnabled()) << "pen sketch makes line art";
   Press("Button2");
@@ -110,12 +110,8 @@ TEST_F(FreehandWindows, BrushRecoloursStrokesOnlyAndCtrlZTakesTheStrokeBack) {
   Control<QSlider>("TrackBar1")->setValue(4);
   const TBitmap32 before = Area().Picture();
   Stroke({{20, 11}, {24, 12}, {60, 50}});  // the last point lies outside the picture
-  const TBitmap32& after = Area().Picture();
-  EXPECT_EQ(after.At(20, 11), kPaperTint);
-  EXPECT_EQ(after.At(16, 11), kRed);
-  EXPECT_EQ(after.At(28, 12), kRed);
-  EXPECT_EQ(after.At(15, 11), kBlack) << "beyond the disc";
-  EXPECT_EQ(after.At(20, 9), kWhite);
+  // Which pixels a disc recolours is the painting's own test.
+  EXPECT_EQ(Area().Picture().At(28, 12), kRed);
   QAction* undo = Area().findChild<QAction*>("UndoStroke");
   EXPECT_EQ(undo->shortcut(), QKeySequence(QKeySequence::Undo));
   undo->trigger();

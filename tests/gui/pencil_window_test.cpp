@@ -1,111 +1,90 @@
-#include <QLabel>
+// The Pencil sketch window: two sliders, the one moved last choosing the tone.
 #include <QPushButton>
-#include <QSlider>
-#include <QToolButton>
 
 #include "effects/mono/bw_sketch.h"
 #include "effects/mono/bw_sketch_window.h"
-#include "tests/gui/gui_fixture.h"
+#include "tests/gui/window_helpers.h"
 #include "ui/picture_view.h"
 
 namespace quillane {
 namespace {
 
-class PencilWindow : public GuiTest {
+class PencilWindow : public WindowTest {
  protected:
   void SetUp() override {
-    GuiTest::SetUp();
-    MenuAction("Pencilsketch1")->trigger();
+    WindowTest::SetUp();
+    Open(1);
   }
-
   TBack_and_White_Sketch& Pencil() { return dynamic_cast<TBack_and_White_Sketch&>(Tool(1)); }
-  QSlider* Slider(const char* name) { return ToolChild<QSlider>(1, name); }
-  QLabel* Label(const char* name) { return ToolChild<QLabel>(1, name); }
-  QString Text(const char* name) { return Label(name)->text(); }
-  QColor Color(const char* name) { return Label(name)->palette().color(QPalette::WindowText); }
-  void PressOk() { ToolChild<QPushButton>(1, "Button1")->click(); }
+  TBitmap32 Sketch(PencilToneMode mode, int contrast, int lighting) {
+    return peccilsketch(Source(), mode, contrast, lighting);
+  }
 
   // Contrast chosen: its labels in the window's text colour, Lighting's in gray.
   void ExpectContrastMarked(bool contrast) {
-    const QColor text = Pencil().palette().color(QPalette::WindowText);
-    const QColor gray(128, 128, 128);
-    EXPECT_EQ(Color("Label1"), contrast ? text : gray);
-    EXPECT_EQ(Color("Label4"), contrast ? text : gray);
-    EXPECT_EQ(Color("Label2"), contrast ? gray : text);
-    EXPECT_EQ(Color("Label3"), contrast ? gray : text);
+    EXPECT_EQ(Pencil().ToneMode(), contrast ? PencilToneMode::Contrast : PencilToneMode::Lighting);
+    const QColor text = Pencil().palette().color(QPalette::WindowText), gray(128, 128, 128);
+    for (auto [label, marksContrast] :
+         {std::pair{"Label1", true}, {"Label4", true}, {"Label2", false}, {"Label3", false}})
+      EXPECT_EQ(Child<QLabel>(1, label)->palette().color(QPalette::WindowText),
+                marksContrast == contrast ? text : gray)
+          << label;
   }
 };
 
 TEST_F(PencilWindow, NumberLabelsShowPercentOfTheRange) {
-  EXPECT_EQ(Text("Label4"), "50");
-  EXPECT_EQ(Text("Label3"), "50");
-  EXPECT_FALSE(ToolChild<QToolButton>(1, "Button2")->isEnabled());
+  EXPECT_EQ(Text(1, "Label4") + " " + Text(1, "Label3"), "50 50");
   ExpectContrastMarked(true);
   // Percent of the slider's range, rounded: 45 of 89 shows 51, not the "50" it started with.
-  for (auto [value, shown] : {std::pair{46, "52"}, {45, "51"}, {0, "0"}, {89, "100"}}) {
-    Slider("TrackBar1")->setValue(value);
-    EXPECT_EQ(Text("Label4"), shown) << value;
+  for (auto [value, shown] : {std::pair{46, "52"}, {45, "51"}, {89, "100"}}) {
+    Slide(1, "TrackBar1", value);
+    EXPECT_EQ(Text(1, "Label4"), shown) << value;
   }
-  for (auto [value, shown] : {std::pair{255, "100"}, {0, "0"}, {128, "50"}}) {
-    Slider("TrackBar2")->setValue(value);
-    EXPECT_EQ(Text("Label3"), shown) << value;
-  }
-  EXPECT_EQ(Text("Label4"), "100");
+  Slide(1, "TrackBar2", 255);
+  EXPECT_EQ(Text(1, "Label3"), "100");
 }
 
 // Undo itself is the main window's test.
-TEST_F(PencilWindow, OkDrawsThePictureAndRecordsIt) {
+TEST_F(PencilWindow, OkDrawsThePictureFromTheSourceAndRecordsIt) {
   Main().SetLineArt(true);
-  const TBitmap32 source = Main().Document().Source();
-  PressOk();
-  const TBitmap32 expected = peccilsketch(source, PencilToneMode::Contrast, 45, 128);
-  EXPECT_EQ(Main().Document().Working(), expected);
-  EXPECT_EQ(Main().Document().Source(), source);
-  EXPECT_EQ(Main().Document().UndoCount(), 1);
+  EXPECT_FALSE(Child<QToolButton>(1, "Button2")->isEnabled());
+  const TBitmap32 source = Source();
+  const TBitmap32 expected = Sketch(PencilToneMode::Contrast, 45, 128);
+  for (int press = 1; press <= 2; ++press) {
+    Press(1, "Button1");
+    EXPECT_EQ(Working(), expected);
+    EXPECT_EQ(Source(), source);
+    EXPECT_EQ(Steps(), press);
+  }
   EXPECT_EQ(Main().StatusText(), "Pencil Sketch");
   EXPECT_FALSE(Main().LineArt());
-  EXPECT_TRUE(ToolChild<QToolButton>(1, "Button2")->isEnabled());
-  EXPECT_TRUE(Main().centralWidget()->findChild<QToolButton*>("SpeedButton3")->isEnabled());
-  EXPECT_EQ(Main().findChild<PictureView*>("Image1")->Image(), OpaqueImage(expected));
-
-  // Applying again starts from the source picture, not from the drawing.
-  PressOk();
-  EXPECT_EQ(Main().Document().Working(), expected);
-  EXPECT_EQ(Main().Document().UndoCount(), 2);
+  EXPECT_TRUE(Child<QToolButton>(1, "Button2")->isEnabled());
+  EXPECT_TRUE(MainChild<QToolButton>("SpeedButton3")->isEnabled());
+  EXPECT_EQ(MainChild<PictureView>("Image1")->Image(), OpaqueImage(expected));
 }
 
-TEST_F(PencilWindow, TheSliderMovedLastChoosesTheTone) {
-  const TBitmap32 source = Main().Document().Source();
-  Slider("TrackBar1")->setValue(30);
-  EXPECT_EQ(Pencil().ToneMode(), PencilToneMode::Contrast);
-  Slider("TrackBar2")->setValue(90);
-  EXPECT_EQ(Pencil().ToneMode(), PencilToneMode::Lighting);
-  ExpectContrastMarked(false);
-  PressOk();
-  EXPECT_EQ(Main().Document().Working(), peccilsketch(source, PencilToneMode::Lighting, 30, 90));
-
-  Slider("TrackBar1")->setValue(60);
+TEST_F(PencilWindow, TheSliderMovedLastChoosesTheToneUntilTheWindowIsShownAgain) {
+  Slide(1, "TrackBar1", 30);
   ExpectContrastMarked(true);
-  PressOk();
-  EXPECT_EQ(Main().Document().Working(), peccilsketch(source, PencilToneMode::Contrast, 60, 90));
-}
-
-TEST_F(PencilWindow, ShowingTheWindowAgainChoosesContrast) {
-  Slider("TrackBar2")->setValue(200);
+  Slide(1, "TrackBar2", 90);
   ExpectContrastMarked(false);
+  Press(1, "Button1");
+  EXPECT_EQ(Working(), Sketch(PencilToneMode::Lighting, 30, 90));
+  Slide(1, "TrackBar1", 60);
+  ExpectContrastMarked(true);
+  Press(1, "Button1");
+  EXPECT_EQ(Working(), Sketch(PencilToneMode::Contrast, 60, 90));
+
+  // Shown again, contrast is chosen; the sliders keep their places.
+  Slide(1, "TrackBar2", 200);
   Pencil().close();
   Main().SetLineArt(true);
-  MenuAction("Pencilsketch1")->trigger();
-
-  EXPECT_EQ(Pencil().ToneMode(), PencilToneMode::Contrast);
+  Open(1);
   ExpectContrastMarked(true);
   EXPECT_FALSE(Main().LineArt());
-  // The slider keeps its place between showings.
-  EXPECT_EQ(Slider("TrackBar2")->value(), 200);
-  EXPECT_EQ(Text("Label3"), "78");
-  PressOk();
-  EXPECT_EQ(Main().Document().Working(),
-            peccilsketch(Main().Document().Source(), PencilToneMode::Contrast, 45, 200));
+  EXPECT_EQ(Text(1, "Label3"), "78");
+  Press(1, "Button1");
+  EXPECT_EQ(Working(), Sketch(PencilToneMode::Contrast, 60, 200));
 }
 
 }  // namespace

@@ -1,7 +1,6 @@
 #include <QFrame>
 #include <QLineEdit>
 #include <QPushButton>
-#include <QSignalSpy>
 #include <QToolButton>
 
 #include "tests/gui/gui_fixture.h"
@@ -24,8 +23,9 @@ int VisibleToolWindows(TMyPicture& main) {
   return visible;
 }
 
-TEST_F(ToolWindows, EveryMenuEntryOpensItsOwnWindowAlone) {
+TEST_F(ToolWindows, EveryMenuEntryOpensItsOwnWindowAloneBesideTheMainWindow) {
   ASSERT_EQ(Effects().size(), 17u);
+  const QRect main = Main().frameGeometry();
   for (const EffectSpec* spec : Effects()) {
     QAction* entry = MenuAction(EntryName(*spec));
     ASSERT_NE(entry, nullptr) << spec->menuHandler;
@@ -33,6 +33,8 @@ TEST_F(ToolWindows, EveryMenuEntryOpensItsOwnWindowAlone) {
     EXPECT_TRUE(Tool(spec->toolNumber).isVisible()) << spec->windowClass;
     EXPECT_EQ(Main().ActiveTool(), spec->toolNumber) << spec->windowClass;
     EXPECT_EQ(VisibleToolWindows(Main()), 1) << spec->windowClass;
+    const QRect frame = Tool(spec->toolNumber).frameGeometry();
+    EXPECT_EQ(frame.topLeft(), QPoint(main.right() - frame.width() - 24, main.top() + 84));
   }
 }
 
@@ -60,15 +62,10 @@ TEST_F(ToolWindows, OpeningAnotherWindowClosesTheOpenOne) {
   EXPECT_TRUE(Tool(15).isVisible());
   EXPECT_EQ(Main().ActiveTool(), 15);
   Tool(1).removeEventFilter(&watcher);
-}
-
-TEST_F(ToolWindows, TheCloseBoxClearsTheActiveTool) {
-  MenuAction("Verticalstria1")->trigger();
-  ASSERT_EQ(Main().ActiveTool(), 17);
-  Tool(17).close();
+  // The close box clears the number; with nothing open, closing the open tool closes nothing.
+  Tool(15).close();
   EXPECT_EQ(Main().ActiveTool(), 0);
-  EXPECT_FALSE(Tool(17).isVisible());
-  // Nothing is open, so closing the open tool closes nothing.
+  EXPECT_FALSE(Tool(15).isVisible());
   Main().closetool();
   EXPECT_EQ(Main().ActiveTool(), 0);
 }
@@ -82,15 +79,6 @@ TEST_F(ToolWindows, ChoosingTheOpenWindowAgainShowsItAfresh) {
   EXPECT_TRUE(Tool(1).isVisible());
   EXPECT_EQ(Main().ActiveTool(), 1);
   EXPECT_FALSE(colorUp->isEnabled());
-}
-
-TEST_F(ToolWindows, WindowsOpenBesideTheMainWindow) {
-  MenuAction("Emboss1")->trigger();
-  const QRect main = Main().frameGeometry();
-  const ToolWindow& emboss = Tool(15);
-  EXPECT_EQ(
-      emboss.frameGeometry().topLeft(),
-      QPoint(main.left() + main.width() - emboss.frameGeometry().width() - 25, main.top() + 84));
 }
 
 TEST_F(ToolWindows, BatchPanelFoldsOutAndBackIn) {
@@ -121,21 +109,6 @@ TEST_F(ToolWindows, BatchPanelFoldsOutAndBackIn) {
   }
 }
 
-TEST_F(ToolWindows, ConvertRunsTheBatchOnlyForAnEffectThatIsThere) {
-  // An effect still to come converts nothing, as its OK does nothing.
-  for (const EffectSpec* e : Effects())
-    if (!e->routine && e->HasBatchPanel()) {
-      ToolChild<QToolButton>(e->toolNumber, "SpeedButton4")->click();
-      break;
-    }
-  EXPECT_TRUE(platform_.messages.empty());
-  EXPECT_TRUE(platform_.errors.empty());
-  // A built one runs the batch loop, which refuses a missing input folder.
-  ToolChild<QToolButton>(1, "SpeedButton4")->click();
-  ASSERT_EQ(platform_.messages.size(), 1u);
-  EXPECT_EQ(platform_.messages[0].text, "Input Director in not exist.");
-}
-
 TEST_F(ToolWindows, FoldersAreSharedBetweenWindows) {
   MenuAction("Emboss1")->trigger();
   platform_.folderAnswers.push_back(QString("/photos/in"));
@@ -159,27 +132,6 @@ TEST_F(ToolWindows, FoldersAreSharedBetweenWindows) {
   ToolChild<QToolButton>(1, "SpeedButton2")->click();
   EXPECT_EQ(Main().InputFolder(), "/photos/in");
   EXPECT_EQ(ToolChild<QLineEdit>(1, "Edit1")->text(), "/photos/in");
-}
-
-TEST_F(ToolWindows, AWindowWhoseEffectIsNotThereYetOnlyOpensAndCloses) {
-  for (const EffectSpec* spec : Effects()) {
-    if (spec->routine) continue;
-    MenuAction(EntryName(*spec))->trigger();
-    Tool(spec->toolNumber).findChild<QPushButton*>("Button1")->click();
-    EXPECT_EQ(Main().StatusText(), "New picture") << spec->windowClass;
-    EXPECT_FALSE(Main().Document().CanUndo()) << spec->windowClass;
-    Tool(spec->toolNumber).close();
-    EXPECT_EQ(Main().ActiveTool(), 0);
-  }
-}
-
-TEST_F(ToolWindows, ColorUpAsksForTheFreehandWindows) {
-  MenuAction("Pencilsketch1")->trigger();
-  QSignalSpy colorUp(&Tool(1), &ToolWindow::colorUpRequested);
-  Tool(1).findChild<QPushButton*>("Button1")->click();
-  Tool(1).findChild<QToolButton*>("Button2")->click();
-  EXPECT_EQ(colorUp.count(), 1);
-  EXPECT_TRUE(Tool(1).isVisible());
 }
 
 }  // namespace

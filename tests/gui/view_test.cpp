@@ -1,6 +1,5 @@
 // Zoom, the mouse wheel, panning and the quarter turns of the main window.
 #include <QLabel>
-#include <QLocale>
 #include <QMenu>
 #include <QScrollArea>
 #include <QScrollBar>
@@ -48,17 +47,6 @@ TEST_F(View, ZoomStepsSetTheLabelAndTheDisplaySize) {
     EXPECT_EQ(ZoomLabel(), s.label);
     EXPECT_EQ(Display(), s.display) << s.label;
   }
-  // Undo sizes by the label: 41.0 % at a zoom of 40.96 %.
-  Main().SetWorkingPicture(TBitmap32(100, 50), true);
-  Click("SpeedButton5", 6);
-  EXPECT_EQ(Display(), QSize(41, 20));
-  Main().SpeedButton3Click();
-  EXPECT_EQ(Display(), QSize(10, 7));
-  // The user's decimal separator, and no group separator.
-  const QLocale previous;
-  QLocale::setDefault(QLocale(QLocale::German));
-  EXPECT_EQ(TMyPicture::ZoomLabelText(1455.19), "1455,2%");
-  QLocale::setDefault(previous);
 }
 
 TEST_F(View, ZoomStopsBeforeTheDisplayLeavesTheWidgetRange) {
