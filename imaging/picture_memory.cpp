@@ -60,7 +60,7 @@ void Unmap(const Block& b) {
   ::munmap(b.memory, b.capacity);
 }
 
-void* Map(std::size_t capacity) {
+[[maybe_unused]] void* Map(std::size_t capacity) {
   const bool huge = capacity % kHugePage == 0;
   const std::size_t length = capacity + (huge ? kHugePage : 0);
   void* p = ::mmap(nullptr, length, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
@@ -123,7 +123,7 @@ void* AllocatePictureBytes(std::size_t bytes) {
   return ::operator new(bytes, kHeapAlignment);
 }
 
-void FreePictureBytes(void* memory, std::size_t bytes) noexcept {
+void FreePictureBytes(void* memory, [[maybe_unused]] std::size_t bytes) noexcept {
   if (memory == nullptr) return;
 #ifndef QUILLANE_PLAIN_PICTURE_MEMORY
   if (bytes >= kPictureBlockBytes) {
