@@ -22,13 +22,9 @@
 namespace quillane {
 namespace {
 
-constexpr int kWidth = 4000;
-constexpr int kHeight = 3000;
-
-const TBitmap32& Photo() {
-  static const TBitmap32 photo = bench::SyntheticPhoto(kWidth, kHeight);
-  return photo;
-}
+constexpr int kWidth = bench::kPhotoWidth;
+constexpr int kHeight = bench::kPhotoHeight;
+using bench::Photo;
 
 // A point on a zigzag through the part of the picture the work area shows at first.
 QPoint PathPoint(std::int64_t i) {

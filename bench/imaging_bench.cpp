@@ -32,13 +32,9 @@
 namespace quillane {
 namespace {
 
-constexpr int kWidth = 4000;
-constexpr int kHeight = 3000;
-
-const TBitmap32& Photo() {
-  static const TBitmap32 photo = bench::SyntheticPhoto(kWidth, kHeight);
-  return photo;
-}
+constexpr int kWidth = bench::kPhotoWidth;
+constexpr int kHeight = bench::kPhotoHeight;
+using bench::Photo;
 
 const TBitmap32& EdgeMap() {
   static const TBitmap32 edges = [] {

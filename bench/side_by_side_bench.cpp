@@ -25,13 +25,9 @@
 namespace quillane {
 namespace {
 
-constexpr int kWidth = 4000;
-constexpr int kHeight = 3000;
-
-const TBitmap32& Photo() {
-  static const TBitmap32 photo = bench::SyntheticPhoto(kWidth, kHeight);
-  return photo;
-}
+constexpr int kWidth = bench::kPhotoWidth;
+constexpr int kHeight = bench::kPhotoHeight;
+using bench::Photo;
 
 void Memcpy(benchmark::State& state) {
   const TBitmap32& photo = Photo();

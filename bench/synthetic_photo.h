@@ -52,4 +52,12 @@ inline TBitmap32 SyntheticPhoto(int width, int height) {
   return big;
 }
 
+// The 12-megapixel photo the benchmarks share, made once per program.
+constexpr int kPhotoWidth = 4000;
+constexpr int kPhotoHeight = 3000;
+inline const TBitmap32& Photo() {
+  static const TBitmap32 photo = SyntheticPhoto(kPhotoWidth, kPhotoHeight);
+  return photo;
+}
+
 }  // namespace quillane::bench

@@ -95,6 +95,20 @@ void WriteOutput(const TBitmap32& picture, const Options& o, std::ostream& out) 
   if (!out) throw PictureFileError("standard output could not be written");
 }
 
+// WriteOutput, with a failure written to err as the reason the command failed.
+bool WriteOutputOrSay(const TBitmap32& picture, const Options& o, std::ostream& out,
+                      std::ostream& err) {
+  try {
+    WriteOutput(picture, o, out);
+    return true;
+  } catch (const std::exception& e) {
+    err << "quillane-cli: cannot write "
+        << (o.output == "-" ? std::string("to standard output") : ShownName(o.output)) << ": "
+        << ShownName(e.what()) << "\n";
+    return false;
+  }
+}
+
 int ApplyCommand(const Options& o, std::ostream& out, std::ostream& err) {
   std::optional<TBitmap32> picture = InputOrBuiltInPicture(o, err);
   if (!picture) return kExitFailed;
@@ -112,14 +126,7 @@ int ApplyCommand(const Options& o, std::ostream& out, std::ostream& err) {
       err << "quillane-cli: " << o.effect->cliName << ": " << ShownName(e.what()) << "\n";
       return kExitFailed;
     }
-    try {
-      WriteOutput(document.Working(), o, out);
-    } catch (const std::exception& e) {
-      err << "quillane-cli: cannot write "
-          << (o.output == "-" ? std::string("to standard output") : ShownName(o.output)) << ": "
-          << ShownName(e.what()) << "\n";
-      return kExitFailed;
-    }
+    if (!WriteOutputOrSay(document.Working(), o, out, err)) return kExitFailed;
   } catch (const std::bad_alloc&) {
     err << "quillane-cli: " << o.effect->cliName << ": " << ShownName(name) << " "
         << MemoryNeedText(OperationBytes(width, height)) << "\n";
@@ -162,14 +169,7 @@ int PictureCommand(const Options& o, std::ostream& out, std::ostream& err) {
         return kExitUsage;
       }
     }
-    try {
-      WriteOutput(document.Working(), o, out);
-    } catch (const std::exception& e) {
-      err << "quillane-cli: cannot write "
-          << (o.output == "-" ? std::string("to standard output") : ShownName(o.output)) << ": "
-          << ShownName(e.what()) << "\n";
-      return kExitFailed;
-    }
+    if (!WriteOutputOrSay(document.Working(), o, out, err)) return kExitFailed;
     if (o.output != "-")
       out << ShownName(o.output) << ": " << document.Working().Width() << " by "
           << document.Working().Height() << " pixels\n";

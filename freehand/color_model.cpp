@@ -3,6 +3,7 @@
 #include <algorithm>
 
 #include "imaging/numeric.h"
+#include "imaging/tone.h"
 
 namespace quillane {
 namespace {
@@ -25,27 +26,8 @@ double Channel(double m1, double m2, double h) {
 }  // namespace
 
 FreehandHsl RGBtoHSL(Pixel color) {
-  const double r = color.r / 255.0;
-  const double g = color.g / 255.0;
-  const double b = color.b / 255.0;
-  const double mx = std::max({r, g, b});
-  const double mn = std::min({r, g, b});
-  FreehandHsl hsl;
-  hsl.l = (mx + mn) / 2;
-  if (mx == mn) return hsl;
-  const double d = mx - mn;
-  hsl.s = hsl.l >= 0.5 ? d / (2 - mx - mn) : d / (mx + mn);
-  double h;
-  if (r == mx)
-    h = (g - b) / d;
-  else if (g == mx)
-    h = 2 + (b - r) / d;
-  else
-    h = 4 + (r - g) / d;
-  h /= 6;
-  if (h < 0) h += 1;
-  hsl.h = h;
-  return hsl;
+  const HslFractions f = HslFractionsOf(color.r, color.g, color.b);
+  return {f.h, f.s, f.l};
 }
 
 Pixel HSLtoRGB(double l, double s, double h) {

@@ -5,6 +5,7 @@
 #include <thread>
 #include <vector>
 
+#include "imaging/edge_byte.h"
 #include "imaging/parallel.h"
 
 namespace quillane {
@@ -19,24 +20,11 @@ void CopyColour(Pixel& to, const Pixel& from) {
 // One interior row, already inverted. The kernels treat the three colour channels alike and
 // never mix them, so the row is walked as bytes: the neighbours of a byte sit 4 bytes to
 // either side. That lets the compiler process many bytes at once; the alpha bytes get a
-// meaningless value here and are put back by the caller. Since the clamp is monotonic,
-// max(clamp(a), clamp(b)) is clamp(max(a, b)).
+// meaningless value here and are put back by the caller.
 void InvertedResponseRow(const std::uint8_t* __restrict above, const std::uint8_t* __restrict row,
                          const std::uint8_t* __restrict below, std::uint8_t* __restrict out,
                          int bytes) {
-  // Every sum fits 16 bits (the line kernel spans -1530..1530), which lets the compiler work
-  // on eight bytes per instruction.
-  for (int i = 4; i < bytes - 4; ++i) {
-    const auto left = static_cast<std::int16_t>(above[i - 4] + row[i - 4] + below[i - 4]);
-    const auto right = static_cast<std::int16_t>(above[i + 4] + row[i + 4] + below[i + 4]);
-    const auto outer =
-        static_cast<std::int16_t>(left + right + above[i] + below[i] - row[i - 4] - row[i + 4]);
-    const auto a = static_cast<std::int16_t>(6 * row[i] - outer);
-    const auto b = static_cast<std::int16_t>(left - right);
-    const std::int16_t m = std::max(a, b);
-    const std::int16_t clamped = std::min<std::int16_t>(255, std::max<std::int16_t>(0, m));
-    out[i] = static_cast<std::uint8_t>(255 - clamped);
-  }
+  for (int i = 4; i < bytes - 4; ++i) out[i] = InvertedEdgeByte(above, row, below, i);
 }
 
 // Pictures without an interior pixel: only the border copies and the inversion apply.

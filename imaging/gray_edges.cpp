@@ -10,6 +10,7 @@
 #include <immintrin.h>
 #endif
 
+#include "imaging/edge_byte.h"
 #include "imaging/edge_map.h"
 #include "imaging/numeric.h"
 #include "imaging/parallel.h"
@@ -23,25 +24,13 @@ namespace {
 constexpr int kStretch = 1024;
 
 // The edge bytes of the pixels x0 .. x0 + n - 1 of an interior row (1 <= x0,
-// x0 + n <= width - 1), as picsobel makes them: the neighbours of a colour byte sit 4 bytes to
-// either side, every sum fits 16 bits, and max(clamp(a), clamp(b)) is clamp(max(a, b)).
+// x0 + n <= width - 1), as picsobel makes them.
 [[gnu::always_inline]] inline void EdgeStretch(const std::uint8_t* __restrict above,
                                                const std::uint8_t* __restrict row,
                                                const std::uint8_t* __restrict below, int x0, int n,
                                                std::uint8_t* __restrict edge) {
   const int first = 4 * x0;
-  for (int j = 0; j < 4 * n; ++j) {
-    const int i = first + j;
-    const auto left = static_cast<std::int16_t>(above[i - 4] + row[i - 4] + below[i - 4]);
-    const auto right = static_cast<std::int16_t>(above[i + 4] + row[i + 4] + below[i + 4]);
-    const auto outer =
-        static_cast<std::int16_t>(left + right + above[i] + below[i] - row[i - 4] - row[i + 4]);
-    const auto a = static_cast<std::int16_t>(6 * row[i] - outer);
-    const auto b = static_cast<std::int16_t>(left - right);
-    const std::int16_t m = std::max(a, b);
-    const std::int16_t clamped = std::min<std::int16_t>(255, std::max<std::int16_t>(0, m));
-    edge[j] = static_cast<std::uint8_t>(255 - clamped);
-  }
+  for (int j = 0; j < 4 * n; ++j) edge[j] = InvertedEdgeByte(above, row, below, first + j);
 }
 
 // Gray values of n edge pixels: 100 times the weighted sum is 30 R + 59 G + 11 B exactly, and

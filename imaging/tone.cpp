@@ -11,16 +11,8 @@
 #include "imaging/parallel.h"
 
 namespace quillane {
-namespace {
 
-// The conversion's fractions, in double exactly as the formulas state them.
-struct HslFractions {
-  double h = 0;
-  double s = 0;
-  double l = 0;
-};
-
-HslFractions Fractions(int red, int green, int blue) {
+HslFractions HslFractionsOf(int red, int green, int blue) {
   const double r = red / 255.0;
   const double g = green / 255.0;
   const double b = blue / 255.0;
@@ -43,8 +35,10 @@ HslFractions Fractions(int red, int green, int blue) {
   return f;
 }
 
+namespace {
+
 Hsl PlainRgbToHsl(int r, int g, int b) {
-  const HslFractions f = Fractions(r, g, b);
+  const HslFractions f = HslFractionsOf(r, g, b);
   Hsl out;
   out.h = Round(static_cast<Extended>(f.h) * 360);
   if (out.h == 360) out.h = 0;
@@ -100,7 +94,7 @@ inline Hsl FastRgbToHsl(int r, int g, int b) {
   // at mx + mn = 255 both are the same.
   const int sum = mx + mn;
   out.s = RoundQuotient(100 * d, sum < 255 ? sum : 510 - sum,
-                        [&] { return static_cast<Extended>(Fractions(r, g, b).s) * 100; });
+                        [&] { return static_cast<Extended>(HslFractionsOf(r, g, b).s) * 100; });
   // Hue in degrees: 60 (g - b) / d, 120 + 60 (b - r) / d or 240 + 60 (r - g) / d by the
   // largest channel (red before green before blue), a negative one taken a turn round. All
   // three are formed and one chosen, which photographs' colours favour over branching.
@@ -108,7 +102,8 @@ inline Hsl FastRgbToHsl(int r, int g, int b) {
   const int fromGreen = 120 * d + 60 * (b - r);
   const int fromBlue = 240 * d + 60 * (r - g);
   const int num = r == mx ? fromRed : (g == mx ? fromGreen : fromBlue);
-  out.h = RoundQuotient(num, d, [&] { return static_cast<Extended>(Fractions(r, g, b).h) * 360; });
+  out.h =
+      RoundQuotient(num, d, [&] { return static_cast<Extended>(HslFractionsOf(r, g, b).h) * 360; });
   if (out.h == 360) out.h = 0;
   return out;
 }

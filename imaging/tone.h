@@ -52,6 +52,15 @@ struct HslTables {
 };
 const HslTables& HslToRgbTables();
 
+// Hue, saturation and lightness as fractions of 1, in double exactly as the formulas state
+// them: what RgbToHsl rounds, and what the freehand brush's colour model works on.
+struct HslFractions {
+  double h = 0;
+  double s = 0;
+  double l = 0;
+};
+HslFractions HslFractionsOf(int red, int green, int blue);
+
 // The two conversions written straight from the formulas above, one branch per case. The
 // table- and integer-based RgbToHsl and HslToRgb must equal them for every input; they are
 // kept as the oracles for those fast paths.
