@@ -21,12 +21,6 @@ namespace {
 
 namespace fs = std::filesystem;
 
-TBitmap32 Picture(int width, int height, int seed) {
-  TBitmap32 p = RandomPicture(width, height, static_cast<unsigned>(seed));
-  SetAlphaChannel(p, 255);
-  return p;
-}
-
 std::string Hash(const std::string& bytes) {
   std::uint32_t hash = 2166136261u;
   for (char byte : bytes) hash = (hash ^ static_cast<std::uint8_t>(byte)) * 16777619u;
@@ -45,17 +39,17 @@ std::vector<std::string> Convert(const fs::path& root, const std::vector<std::st
                                  bool outputBeside, bool overlap) {
   fs::remove_all(root);
   fs::create_directories(root / "in");
-  SaveJpeg(Picture(40, 30, 1), (root / "in" / "a.jpg").string(), 90);
-  SaveJpeg(Picture(33, 21, 2), (root / "in" / "a.JPG").string(), 90);
-  SaveBitmap24(Picture(17, 40, 3), (root / "in" / "b.bmp").string());
+  SaveJpeg(RandomPicture(40, 30, 1), (root / "in" / "a.jpg").string(), 90);
+  SaveJpeg(RandomPicture(33, 21, 2), (root / "in" / "a.JPG").string(), 90);
+  SaveBitmap24(RandomPicture(17, 40, 3), (root / "in" / "b.bmp").string());
   std::ofstream((root / "in" / "broken.jpg").string()) << "not a picture";
-  SaveJpeg(Picture(25, 25, 4), (root / "in" / "c.jpg").string(), 90);
-  SaveJpeg(Picture(19, 23, 5), (root / "in" / "d.jpg").string(), 90);
+  SaveJpeg(RandomPicture(25, 25, 4), (root / "in" / "c.jpg").string(), 90);
+  SaveJpeg(RandomPicture(19, 23, 5), (root / "in" / "d.jpg").string(), 90);
   const std::string out = (root / (outputBeside ? "in" : "out")).string();
   fs::create_directories(out + "/c-Brume.jpg");  // c's output cannot be written
 
   std::vector<std::string> seen;
-  PictureDocument document(Picture(9, 9, 0));
+  PictureDocument document(RandomPicture(9, 9, 0));
   BatchObserver observer;
   observer.message = [&](const std::string& caption, const std::string& text) {
     seen.push_back("message " + caption + " " + text);

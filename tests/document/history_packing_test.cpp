@@ -1,32 +1,23 @@
 #include <gtest/gtest.h>
 
 #include <cstdint>
-#include <random>
 #include <vector>
 
 #include "document/document.h"
 #include "document/packed_picture.h"
+#include "tests/imaging/random_picture.h"
 
 namespace quillane {
 namespace {
-
-TBitmap32 Noise(int w, int h, std::uint32_t seed) {
-  std::mt19937 random(seed);
-  TBitmap32 picture(w, h);
-  auto* bytes = reinterpret_cast<std::uint8_t*>(picture.Data());
-  for (std::size_t i = 0; i < picture.PixelCount() * 4; ++i)
-    bytes[i] = static_cast<std::uint8_t>(random() % 7 + (i % 13) * 19);
-  return picture;
-}
 
 TEST(PackedPicture, GivesBackEveryByte) {
   // Awkward sizes, and one tall enough to be packed in several bands on several threads.
   const struct { int w, h; } sizes[] = {{0, 0}, {1, 1}, {1, 9}, {9, 1}, {7, 5}, {300, 2000}};
   for (const auto& size : sizes) {
-    const TBitmap32 picture = Noise(size.w, size.h, 7);
+    const TBitmap32 picture = RandomPicture(size.w, size.h, 7);
     const PackedPicture packed = PackedPicture::Pack(picture);
     EXPECT_EQ(packed.Unpack(), picture) << size.w << "x" << size.h;
-    TBitmap32 reused = Noise(size.w, size.h, 8);  // same size: its storage is overwritten
+    TBitmap32 reused = RandomPicture(size.w, size.h, 8);  // same size: its storage is overwritten
     packed.UnpackInto(reused);
     EXPECT_EQ(reused, picture) << size.w << "x" << size.h;
   }
@@ -36,10 +27,10 @@ TEST(PackedPicture, GivesBackEveryByte) {
 
 // Each step has its own size, so undo moves between storage of different sizes as well.
 TEST(PictureDocument, UndoAndRedoAfterPackingGiveBackTheExactStates) {
-  std::vector<TBitmap32> states{Noise(40, 30, 0)};
+  std::vector<TBitmap32> states{RandomPicture(40, 30, 0)};
   PictureDocument doc(states[0]);
   for (std::uint32_t i = 1; i <= 24; ++i) {
-    states.push_back(Noise(40 + static_cast<int>(i % 3), 30, i));
+    states.push_back(RandomPicture(40 + static_cast<int>(i % 3), 30, i));
     doc.SetWorking(states.back());
     doc.Backup();
     EXPECT_EQ(doc.Slot(doc.CurrentSlot()).Data(), doc.Working().Data());  // the same, not a copy

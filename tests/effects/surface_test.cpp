@@ -34,22 +34,6 @@ TBitmap32 PlainEmboss(TBitmap32 b, int lighting, int depth) {
   return b;
 }
 
-TEST(Emboss, ReliefOfTwoPixelsOneStepApart) {
-  struct Case {
-    int p, q, lighting, gray;
-  } const cases[] = {
-      {90, 90, 100, 150}, {90, 90, 0, 50}, {90, 90, 200, 250}, {95, 90, 200, 255},
-      {40, 90, 0, 0},     {30, 90, 0, 10},  // below the offset the difference folds back up
-  };
-  for (const Case& c : cases) {
-    TBitmap32 b(2, 2, Gray(c.q));
-    b.At(0, 0) = Gray(c.p);
-    const TBitmap32 out = emboss(b, c.lighting, 1);
-    EXPECT_EQ(out.At(0, 0), Gray(c.gray)) << c.p << " " << c.q << " " << c.lighting;
-    EXPECT_EQ(out.At(1, 1), Gray(c.q));
-  }
-}
-
 // The formula leaves the rightmost and bottom depth pixels as they were; pictures no larger
 // than depth in either direction come back unchanged.
 TEST(Emboss, MatchesTheFormulaOnRandomPicturesOfEverySize) {

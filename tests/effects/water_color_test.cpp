@@ -11,24 +11,6 @@ TBitmap32 Noise(int w, int h, unsigned seed) {
   return RandomPicture(w, h, seed);
 }
 
-TEST(WaterColor, MediansRemoveSpecksAndLinesButKeepTheEdgeOfTwoAreas) {
-  const Pixel dark{20, 30, 40, 255}, bright{250, 240, 230, 255};
-  TBitmap32 speck(7, 7, dark);
-  speck.At(3, 3) = bright;
-  EXPECT_EQ(watercolor(speck, 1), TBitmap32(7, 7, dark));
-
-  TBitmap32 line(7, 6, dark);
-  for (int y = 0; y < 6; ++y) line.At(3, y) = bright;
-  const TBitmap32 washed = watercolor(line, 1);
-  for (int y = 1; y < 5; ++y) EXPECT_EQ(washed.At(3, y), dark) << y;
-  EXPECT_EQ(washed.At(3, 0), bright);  // the frame is never written
-
-  TBitmap32 halves(8, 6, dark);
-  for (int y = 0; y < 6; ++y)
-    for (int x = 4; x < 8; ++x) halves.At(x, y) = bright;
-  EXPECT_EQ(watercolor(halves, 3), halves);
-}
-
 TEST(WaterColor, FastPassesGiveTheSelectionSortBytesAndKeepTheFrame) {
   const TBitmap32 in = Noise(40, 9, 11);
   TBitmap32 median(40, 9);

@@ -58,8 +58,7 @@ TEST(FreehandColor, BrushColourOfOnePixel) {
     SCOPED_TRACE(c.what);
     EXPECT_EQ(drawcolor(c.pixel, RGBtoHSL(c.brush)), c.expected);
   }
-  const FreehandHsl red = RGBtoHSL(Rgb(255, 0, 0));
-  EXPECT_EQ(red, (FreehandHsl{0, 1, 0.5}));
+  EXPECT_EQ(RGBtoHSL(Rgb(255, 0, 0)), (FreehandHsl{0, 1, 0.5}));
   EXPECT_EQ(HSLtoRGB(0.49, 1, 0), Rgb(250, 0, 0));
 }
 

@@ -32,52 +32,6 @@ TBitmap32 Opaque(TBitmap32 b) {
   return ::testing::AssertionFailure() << "colours differ";
 }
 
-// A picture whose columns are given, the same in every row.
-TBitmap32 Columns(int h, const std::vector<Pixel>& columns) {
-  TBitmap32 b(static_cast<int>(columns.size()), h);
-  for (int y = 0; y < h; ++y)
-    for (int x = 0; x < b.Width(); ++x) b.At(x, y) = columns[static_cast<std::size_t>(x)];
-  return b;
-}
-
-// (Pictures without an interior pixel keep their inverted colour: see the tiny sizes below.)
-TEST(Picsobel, FlatPictureBecomesWhiteBordersIncluded) {
-  for (auto [w, h] : {std::pair{3, 3}, {5, 4}, {17, 9}, {3, 40}, {40, 3}})
-    EXPECT_TRUE(
-        SameColours(Sobel(TBitmap32(w, h, Rgb(90, 140, 30))), TBitmap32(w, h, Rgb(255, 255, 255))))
-        << w << "x" << h;
-}
-
-TEST(Picsobel, BrightLeftDarkRightGivesATwoPixelStroke) {
-  const Pixel white = Rgb(255, 255, 255), black = Rgb(0, 0, 0);
-  std::vector<Pixel> in(10, black), out(10, white);
-  std::fill(in.begin(), in.begin() + 5, white);
-  out[4] = out[5] = black;  // the last white and the first black column
-  EXPECT_TRUE(SameColours(Sobel(Columns(6, in)), Columns(6, out)));
-  // Mirrored: one stroke, on the first white column, from the line kernel alone.
-  std::reverse(in.begin(), in.end());
-  out.assign(10, white);
-  out[5] = black;
-  EXPECT_TRUE(SameColours(Sobel(Columns(6, in)), Columns(6, out)));
-}
-
-TEST(Picsobel, ResponseGrowsWithTheStepAndChannelsStayApart) {
-  // A step of 40 in red only, bright on the left: 3 * 40 from the gradient kernel on both sides
-  // of the step (the line kernel gives 80 on the bright side, less than 120).
-  std::vector<Pixel> in(8, Rgb(0, 77, 200)), out(8, Rgb(255, 255, 255));
-  std::fill(in.begin(), in.begin() + 4, Rgb(40, 77, 200));
-  out[3] = out[4] = Rgb(255 - 120, 255, 255);
-  EXPECT_TRUE(SameColours(Sobel(Columns(5, in)), Columns(5, out)));
-}
-
-TEST(Picsobel, BrightHorizontalLineBecomesADarkLine) {
-  TBitmap32 in(9, 7, Rgb(0, 0, 0));
-  for (int x = 0; x < 9; ++x) in.At(x, 3) = Rgb(255, 255, 255);
-  TBitmap32 out(9, 7, Rgb(255, 255, 255));
-  for (int x = 0; x < 9; ++x) out.At(x, 3) = Rgb(0, 0, 0);
-  EXPECT_TRUE(SameColours(Sobel(in), out));
-}
-
 TEST(Picsobel, TwoHighOrTwoWideRepeatsTheSecondLineInverted) {
   const TBitmap32 wide = RandomPicture(6, 2, 1);
   TBitmap32 expected(6, 2);

@@ -66,7 +66,6 @@ TEST(RotatePicture, SizesOfQuarterTurns) {
       {521, 346, QuarterTurn::Anticlockwise, 347, 520},
       {101, 57, QuarterTurn::Clockwise, 57, 101},
       {101, 57, QuarterTurn::Anticlockwise, 57, 101},
-      {5, 5, QuarterTurn::Clockwise, 5, 5},
   };
   for (const auto& c : cases) {
     const std::optional<TBitmap32> r = Turn(RandomPicture(c.w, c.h, 1), c.turn);
