@@ -44,7 +44,6 @@ TEST_F(EffectWhileBusy, ASecondApplyWhileOneRunsIsIgnored) {
   EXPECT_FALSE(Main().EffectRunning());
   EXPECT_EQ(QApplication::overrideCursor(), nullptr);
   EXPECT_EQ(Main().Document().Working(), Flat(1));
-  EXPECT_EQ(Main().Document().UndoCount(), 1);
   EXPECT_EQ(Main().StatusText(), "First");
 }
 
@@ -62,7 +61,6 @@ TEST_F(EffectWhileBusy, LandsAsTheEffectRunDirectly) {
     EXPECT_EQ(Main().Document().UndoCount(), direct.UndoCount()) << name;
     EXPECT_EQ(Main().StatusText().toStdString(), effect.statusText);
   }
-  ASSERT_TRUE(Main().Document().CanUndo());
 }
 
 }  // namespace

@@ -59,7 +59,7 @@ TEST_F(Desktop, StandardShortcutsRunTheirCommands) {
       {Qt::CTRL | Qt::Key_Z, [&] { return Main().StatusText() == "Undo"; }},
       {Qt::CTRL | Qt::SHIFT | Qt::Key_Z, [&] { return Main().StatusText() == "Redo"; }},
       {Qt::CTRL | Qt::Key_P, [&] { return print.count() == 1; }},
-      {Qt::CTRL | Qt::Key_Q, [&] { return closed.count() == 1; }},
+      {Qt::CTRL | Qt::Key_Q, [&] { return closed.count() == 1 && !Main().isVisible(); }},
   };
   for (const auto& [keys, done] : cases) {
     SCOPED_TRACE(QKeySequence(keys).toString().toStdString());
@@ -70,20 +70,17 @@ TEST_F(Desktop, StandardShortcutsRunTheirCommands) {
   EXPECT_EQ(MenuAction("Exit1")->shortcut(), QKeySequence(Qt::CTRL | Qt::Key_Q));  // shown
 }
 
-TEST_F(Desktop, MenusOpenWithAltLettersAndShowTheirCaptionsUnchanged) {
-  const std::tuple<const char*, QString, Qt::Key> cases[] = {
-      {"File1", " File", Qt::Key_F},
-      {"Edit1", " Edit", Qt::Key_E},
-      {"BW1", " B&W", Qt::Key_B},
-      {"Color1", " Color", Qt::Key_C},
-      {"ColorAdjust1", " ColorAdjust", Qt::Key_A},
-      {"Veins1", " Veins", Qt::Key_V},
-      {"Help1", " Help", Qt::Key_H}};
-  for (const auto& [name, shown, letter] : cases) {
+TEST_F(Desktop, MenusOpenWithTheirAltLetters) {
+  const std::pair<const char*, Qt::Key> cases[] = {
+      {"File1", Qt::Key_F},  {"Edit1", Qt::Key_E},        {"BW1", Qt::Key_B},
+      {"Color1", Qt::Key_C}, {"ColorAdjust1", Qt::Key_A}, {"Veins1", Qt::Key_V},
+      {"Help1", Qt::Key_H}};
+  for (const auto& [name, letter] : cases) {
     const QString title = Main().menuBar()->findChild<QMenu*>(name)->title();
     EXPECT_EQ(QKeySequence::mnemonic(title), QKeySequence(Qt::ALT | letter)) << name;
-    EXPECT_EQ(QString(title).replace("&&", "\x01").remove('&').replace('\x01', '&'), shown);
   }
+  // "B&W" shows its ampersand instead of underlining the W.
+  EXPECT_TRUE(Main().menuBar()->findChild<QMenu*>("BW1")->title().contains("&&W"));
 }
 
 TEST_F(Desktop, ADroppedPictureFileOpensAsFileOpenDoes) {
@@ -106,7 +103,7 @@ TEST_F(Desktop, ADroppedPictureFileOpensAsFileOpenDoes) {
   EXPECT_EQ(Main().RecentFiles(), QStringList{picture});
 }
 
-TEST_F(Desktop, OpenRecentListsTheLastTenPicturesNewestFirst) {
+TEST_F(Desktop, OpenRecentListsTheLastTenPicturesNewestFirstAndDropsMissingOnes) {
   QStringList opened;
   for (int i = 1; i <= 12; ++i) {
     opened.prepend(Picture(QString("p%1.bmp").arg(i), i));
@@ -116,36 +113,20 @@ TEST_F(Desktop, OpenRecentListsTheLastTenPicturesNewestFirst) {
   QStringList expected = opened.mid(0, 10);
   expected.move(5, 0);
   EXPECT_EQ(Entries(RecentMenu(Main())), expected);
+  ASSERT_TRUE(QFile::remove(expected[0]));
+  RecentMenu(Main())->actions()[0]->trigger();
+  EXPECT_EQ(platform_.messages,
+            (std::vector<ScriptedPlatform::Message>{
+                {"Sorry", expected[0] + " no longer exists; it was taken off the recent list."}}));
+  EXPECT_EQ(Main().Document().Opened().Width(), 7);
+  expected.removeFirst();
+  EXPECT_EQ(Entries(RecentMenu(Main())), expected);
   // A window started later offers the same list, and an entry opens its picture.
   ScriptedPlatform otherPlatform;
   TMyPicture other(otherPlatform, TestPicture());
   ASSERT_EQ(Entries(RecentMenu(other)), expected);
   RecentMenu(other)->actions()[2]->trigger();
-  EXPECT_EQ(other.Document().Opened().Width(), 11);  // p11.bmp
-}
-
-TEST_F(Desktop, AMissingRecentPictureIsDroppedWithAMessage) {
-  const QString kept = Picture("kept.bmp", 4), gone = Picture("gone.bmp", 6);
-  ASSERT_TRUE(Main().OpenPictureFile(kept));
-  ASSERT_TRUE(Main().OpenPictureFile(gone));
-  ASSERT_TRUE(QFile::remove(gone));
-  RecentMenu(Main())->actions()[0]->trigger();
-  EXPECT_EQ(platform_.messages,
-            (std::vector<ScriptedPlatform::Message>{
-                {"Sorry", gone + " no longer exists; it was taken off the recent list."}}));
-  EXPECT_EQ(Entries(RecentMenu(Main())), QStringList{kept});
-  EXPECT_EQ(Main().Document().Opened().Width(), 6);
-}
-
-TEST_F(Desktop, ToolWindowsFloatAboveTheMainWindowOnly) {
-  std::vector<QWidget*> windows{&Main().BatchConvertOk()};
-  for (int number = 1; number <= 17; ++number) windows.push_back(&Tool(number));
-  for (QWidget* window : windows) {
-    SCOPED_TRACE(window->objectName().toStdString());
-    EXPECT_FALSE(window->windowFlags().testFlag(Qt::WindowStaysOnTopHint));
-    EXPECT_EQ(window->parentWidget(), &Main());
-  }
-  EXPECT_EQ(Tool(1).windowFlags() & Qt::WindowType_Mask, Qt::Tool);
+  EXPECT_EQ(other.Document().Opened().Width(), 10);  // p10.bmp
 }
 
 TEST_F(Desktop, ToolWindowKeysAndBatchFieldTooltips) {

@@ -2,7 +2,6 @@
 #include <QLocale>
 #include <QPushButton>
 #include <QScrollArea>
-#include <QSignalSpy>
 #include <QToolButton>
 #include <stdexcept>
 
@@ -58,13 +57,6 @@ TEST_F(MainWindow, ResizingKeepsTheViewAndStatusLineInPlace) {
   EXPECT_EQ(MainChild<QWidget>("Panel8")->width(),
             690 - MainChild<QWidget>("Panel4")->width() - 32);
   EXPECT_EQ(MainChild<QLabel>("Label1")->pos(), QPoint(5, 480 + 34));
-}
-
-TEST_F(MainWindow, ExitClosesTheMainWindow) {
-  QSignalSpy closed(&Main(), &TMyPicture::closed);
-  MenuAction("Exit1")->trigger();
-  EXPECT_EQ(closed.count(), 1);
-  EXPECT_FALSE(Main().isVisible());
 }
 
 TEST_F(MainWindow, UndoAndRedoFollowTheHistoryWithTheFormerDisplaySize) {

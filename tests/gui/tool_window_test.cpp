@@ -33,6 +33,11 @@ TEST_F(ToolWindows, EveryMenuEntryOpensItsOwnWindowAloneBesideTheMainWindow) {
     EXPECT_TRUE(Tool(spec->toolNumber).isVisible()) << spec->windowClass;
     EXPECT_EQ(Main().ActiveTool(), spec->toolNumber) << spec->windowClass;
     EXPECT_EQ(VisibleToolWindows(Main()), 1) << spec->windowClass;
+    // Above the main window only, not above every other program.
+    EXPECT_EQ(Tool(spec->toolNumber).parentWidget(), &Main());
+    const Qt::WindowFlags flags = Tool(spec->toolNumber).windowFlags();
+    EXPECT_EQ(flags & Qt::WindowType_Mask, Qt::Tool);
+    EXPECT_FALSE(flags.testFlag(Qt::WindowStaysOnTopHint));
     const QRect frame = Tool(spec->toolNumber).frameGeometry();
     EXPECT_EQ(frame.topLeft(), QPoint(main.right() - frame.width() - 24, main.top() + 84));
   }
