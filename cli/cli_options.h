@@ -21,7 +21,17 @@ enum ExitCode {
 // Manpage and Completion write the manual page and the bash completion script, both made from
 // the same effect table as List, so they cannot fall behind it.
 enum class Command {
-  Help, Version, List, Apply, Batch, Gallery, Rotate, Resize, Convert, Manpage, Completion
+  Help,
+  Version,
+  List,
+  Apply,
+  Batch,
+  Gallery,
+  Rotate,
+  Resize,
+  Convert,
+  Manpage,
+  Completion
 };
 
 struct Options {
