@@ -1,7 +1,7 @@
 // The 3 x 3 kernel sums that realism, abstract and pop art share, worked out a row at a time.
 // Pixels are walked as bytes: the neighbours of a colour byte sit 4 bytes to either side and
-// one row up or down, and each channel only ever meets itself, so the compiler can treat many
-// bytes at once. The alpha bytes get meaningless sums that the callers overwrite.
+// one row up or down, and each channel only ever meets itself, so many bytes are handled at
+// once. The alpha bytes get meaningless sums that are replaced by 255.
 #pragma once
 
 #include <array>
@@ -27,29 +27,39 @@ ParamSpec KernelParam(EffectParams::Values defaults);
 // is beyond 32 bits.
 Kernel KernelFrom(const EffectParams::Values& values);
 
-// One weighted tap: the byte `offset` bytes across in the row above (0), the same row (1) or
-// the row below (2).
-struct KernelTap {
-  int row = 0;
-  int offset = 0;
-  std::int16_t weight = 0;
+// The second operator abstract and pop art weigh against the kernel:
+// sign * (left column - right column), the middle row counting middle times.
+struct ColumnGradient {
+  int middle = 1;
+  int sign = 1;
 };
 
-// The nonzero taps of a kernel whose every sum over bytes fits 16 bits (the sum of the
-// weights' magnitudes at most 128, so |sum| <= 128 * 255); nothing when it is wider.
-std::optional<std::vector<KernelTap>> ShortTaps(const Kernel& k);
+// The interior of one row of a kernel pass. Each colour byte is the kernel's sum over its 3 x 3
+// block clamped to 0..255 or, with a gradient, 255 minus the clamped larger of the kernel's and
+// the gradient's sums. Alpha is 255. Works in 16 bits, so only for kernels whose weights'
+// magnitudes add up to at most 128 (|sum| <= 128 * 255); Make gives nothing for the others.
+class KernelRowPass {
+ public:
+  static std::optional<KernelRowPass> Make(const Kernel& k, std::optional<ColumnGradient> gradient);
 
-// sums[i] = sum of the taps over byte first + i of the rows, for i < count.
-void ShortSums(const std::uint8_t* const rows[3], int first, int count,
-               const std::vector<KernelTap>& taps, std::int16_t* sums);
+  // Pixels 1 .. w - 2 of out from the source rows above, row and below, each w >= 3 pixels.
+  // The caller ends each band with EndBand, as some stores bypass the caches.
+  void Row(const Pixel* above, const Pixel* row, const Pixel* below, int w, Pixel* out) const;
+  static void EndBand();
 
-// A sum limited to 0..255, by value so that the compiler does many at once.
-inline std::uint8_t ClampShort(std::int16_t v) {
-  const std::int16_t low = v < 0 ? 0 : v;
-  return static_cast<std::uint8_t>(low > 255 ? 255 : low);
-}
+ private:
+  struct Tap {
+    int row = 0;
+    int offset = 0;
+    std::int16_t weight = 0;
+  };
+  void PlainRow(const std::uint8_t* const rows[3], int w, std::uint8_t* out) const;
 
-// Bytes of a row handled per round: the sums stay in the first-level cache.
-inline constexpr int kSumChunk = 1024;
+  std::vector<Tap> taps_;
+  std::optional<ColumnGradient> gradient_;
+  // For the AVX2 variant: the weights in byte pairs (left, right of each row; above, below
+  // centre; centre alone) and which pairs count; empty when a weight does not fit a signed byte.
+  std::optional<std::array<std::int8_t, 10>> pairs_;
+};
 
 }  // namespace quillane

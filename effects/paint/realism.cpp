@@ -44,33 +44,32 @@ void ConvolveInto(const TBitmap32& picture, const Kernel& k, std::uint16_t divis
                   TBitmap32& out) {
   const int w = picture.Width();
   const int h = picture.Height();
-  const auto taps = ShortTaps(k);
   // Kernels too heavy for 16-bit sums, and divisors other than 1, are rare: they take the
   // plain way.
-  if (!taps || divisor > 1) {
+  const auto pass = divisor > 1 ? std::nullopt : KernelRowPass::Make(k, std::nullopt);
+  if (!pass) {
     out = ConvolveReference(picture, k, divisor);
     return;
   }
-  if (w == 0) return;
-  std::memcpy(out.Data(), picture.Data(), picture.PixelCount() * sizeof(Pixel));
-  if (w < 3 || h < 3) return;
-  const int bytes = w * 4;
-  ParallelRows(1, h - 1, static_cast<std::size_t>(w) * (taps->size() + 2), [&](int y0, int y1) {
-    std::int16_t sums[kSumChunk];
+  if (w == 0 || h == 0) return;
+  const std::size_t rowBytes = static_cast<std::size_t>(w) * sizeof(Pixel);
+  if (w < 3 || h < 3) {
+    std::memcpy(out.Data(), picture.Data(), rowBytes * static_cast<std::size_t>(h));
+    return;
+  }
+  // One pass over bands of rows: each output row is written once, from three source rows
+  // that are still in the cache from the row before.
+  ParallelRows(1, h - 1, static_cast<std::size_t>(w) * 8, [&](int y0, int y1) {
+    if (y0 == 1) std::memcpy(out.ScanLine(0), picture.ScanLine(0), rowBytes);
     for (int y = y0; y < y1; ++y) {
-      const std::uint8_t* rows[3] = {
-          reinterpret_cast<const std::uint8_t*>(picture.ScanLine(y - 1)),
-          reinterpret_cast<const std::uint8_t*>(picture.ScanLine(y)),
-          reinterpret_cast<const std::uint8_t*>(picture.ScanLine(y + 1))};
+      const Pixel* source = picture.ScanLine(y);
       Pixel* row = out.ScanLine(y);
-      auto* dst = reinterpret_cast<std::uint8_t*>(row);
-      for (int first = 4; first < bytes - 4; first += kSumChunk) {
-        const int count = std::min(kSumChunk, bytes - 4 - first);
-        ShortSums(rows, first, count, *taps, sums);
-        for (int i = 0; i < count; ++i) dst[first + i] = ClampShort(sums[i]);
-      }
-      for (int x = 1; x < w - 1; ++x) row[x].a = 255;
+      pass->Row(picture.ScanLine(y - 1), source, picture.ScanLine(y + 1), w, row);
+      row[0] = source[0];
+      row[w - 1] = source[w - 1];
     }
+    if (y1 == h - 1) std::memcpy(out.ScanLine(h - 1), picture.ScanLine(h - 1), rowBytes);
+    KernelRowPass::EndBand();
   });
 }
 

@@ -12,4 +12,7 @@ namespace quillane {
 // and alpha. lighting 0..200, depth 1..5 (any depth >= 1 works).
 TBitmap32 emboss(const TBitmap32& source, int lighting, int depth);
 
+// The same pixel by pixel on one thread, straight from the formula: the reference for emboss.
+TBitmap32 EmbossReference(const TBitmap32& source, int lighting, int depth);
+
 }  // namespace quillane
