@@ -124,9 +124,10 @@ template <bool kGradient>
   }
 }
 
-// Bytes 4 .. 4w - 5 of out, for w - 2 >= 8 pixels. Vectors that overlap the first and last
-// aligned ones give the same bytes twice; in between, the result streams past the caches: it is
-// far larger than they are, and streaming spares reading each line of it before writing it.
+// Bytes 4 .. 4w - 5 of out, for w - 2 >= 8 pixels and out 4-byte aligned. Vectors that overlap the
+// first and last aligned ones give the same bytes twice; in between, the result streams past the
+// caches: it is far larger than they are, and streaming spares reading each line of it before
+// writing it.
 template <bool kGradient>
 [[gnu::target("avx2")]] void Avx2Row(const std::array<std::int8_t, 10>& weights,
                                      std::optional<ColumnGradient> gradient,
@@ -146,16 +147,11 @@ template <bool kGradient>
   const int first = 4;
   const int end = 4 * (w - 1);
   Store(out + first, Bytes32<kGradient>(k, above, row, below, first));
-  int j = first + 32;
   const auto address = reinterpret_cast<std::uintptr_t>(out);
-  if (address % 4 == 0) {
-    j = first + static_cast<int>((32 - (address + first) % 32) % 32);
-    for (; j + 32 <= end; j += 32)
-      _mm256_stream_si256(reinterpret_cast<__m256i*>(out + j),
-                          Bytes32<kGradient>(k, above, row, below, j));
-  } else {
-    for (; j + 32 <= end; j += 32) Store(out + j, Bytes32<kGradient>(k, above, row, below, j));
-  }
+  int j = first + static_cast<int>((32 - (address + first) % 32) % 32);
+  for (; j + 32 <= end; j += 32)
+    _mm256_stream_si256(reinterpret_cast<__m256i*>(out + j),
+                        Bytes32<kGradient>(k, above, row, below, j));
   if (j < end) Store(out + end - 32, Bytes32<kGradient>(k, above, row, below, end - 32));
 }
 #endif
@@ -240,7 +236,8 @@ void KernelRowPass::Row(const Pixel* above, const Pixel* row, const Pixel* below
                                  reinterpret_cast<const std::uint8_t*>(below)};
   auto* dst = reinterpret_cast<std::uint8_t*>(out);
 #if defined(__x86_64__) && defined(__GNUC__)
-  if (pairs_ && w - 2 >= 8) {
+  // Streaming wants whole pixels on aligned addresses, as pictures' rows always are.
+  if (pairs_ && w - 2 >= 8 && reinterpret_cast<std::uintptr_t>(out) % 4 == 0) {
     if (gradient_)
       Avx2Row<true>(*pairs_, gradient_, rows[0], rows[1], rows[2], w, dst);
     else
