@@ -4,6 +4,7 @@
 #include "effects/surface/emboss.h"
 
 #include <algorithm>
+#include <array>
 #include <cstdint>
 #include <cstdlib>
 #include <cstring>
@@ -40,9 +41,22 @@ void PlainReliefRow(const Pixel* p, const Pixel* q, int n, int lift, Pixel* out)
 }
 
 #if defined(__x86_64__) && defined(__GNUC__)
-// Pixels per stretch: the stretch's gray pixels stay in the first-level cache until they
-// stream out.
-constexpr int kStretch = 256;
+// For each red and green level, whether an exact half of the gray sum rounds up, for the (at
+// most three) blue levels that make one: bit b / 100 for the blue level b. Padded for reading
+// four bytes at any entry.
+const std::uint8_t* HalfRoundsUp() {
+  static const auto table = [] {
+    std::array<std::uint8_t, 65536 + 4> t{};
+    for (int r = 0; r < 256; ++r)
+      for (int g = 0; g < 256; ++g)
+        // 11 b = 50 - 30 r - 59 g (mod 100), and 91 is the inverse of 11 modulo 100.
+        for (int b = (((50 - 30 * r - 59 * g) % 100 + 100) * 91) % 100; b < 256; b += 100)
+          if (GrayValueOfHalf(r, g, b) > (30 * r + 59 * g + 11 * b) / 100)
+            t[static_cast<std::size_t>(r << 8 | g)] |= static_cast<std::uint8_t>(1 << (b / 100));
+    return t;
+  }();
+  return table.data();
+}
 
 // The relief bytes of eight pixels. In saturating byte arithmetic, with lift 0..255, exactly
 // one of (p -sat q +sat lift) -sat (q -sat p) and (q -sat p) -sat lift can be above 0, and it
@@ -64,101 +78,87 @@ constexpr int kStretch = 256;
                            _mm256_set1_epi16(1));
 }
 
-// Sixteen gray pixels from pixel x on into gray. With s the sum, the level is
-// (s + 49) / 100 but for an exact half (s = 100 k + 50), where (s + 50) / 100 is larger;
-// (t * 5243) >> 19 is t / 100 for every t up to 43000. Returns a bit per exact half, which
-// needs the extended-precision sum and is left to the caller.
-[[gnu::target("avx2"), gnu::always_inline]] inline std::uint32_t Gray16(const std::uint8_t* p,
-                                                                        const std::uint8_t* q,
-                                                                        __m256i lift,
-                                                                        std::uint8_t* gray) {
+// Whether an exact half of each of eight pixels rounds up, 0 or 1 in 32-bit lanes.
+[[gnu::target("avx2"), gnu::always_inline]] inline __m256i RoundsUp8(__m256i v,
+                                                                     const std::uint8_t* table) {
+  const __m256i redGreen = _mm256_shuffle_epi8(
+      v, _mm256_setr_epi8(1, 2, -1, -1, 5, 6, -1, -1, 9, 10, -1, -1, 13, 14, -1, -1, 1, 2, -1, -1,
+                          5, 6, -1, -1, 9, 10, -1, -1, 13, 14, -1, -1));
+  const __m256i bits = _mm256_i32gather_epi32(reinterpret_cast<const int*>(table), redGreen, 1);
+  const __m256i blue = _mm256_and_si256(v, _mm256_set1_epi32(0xFF));
+  const __m256i hundreds = _mm256_sub_epi32(
+      _mm256_sub_epi32(_mm256_setzero_si256(), _mm256_cmpgt_epi32(blue, _mm256_set1_epi32(99))),
+      _mm256_cmpgt_epi32(blue, _mm256_set1_epi32(199)));
+  return _mm256_and_si256(_mm256_srlv_epi32(bits, hundreds), _mm256_set1_epi32(1));
+}
+
+// Sixteen gray pixels into gray0 (pixels 0-7) and gray1 (8-15). With s the sum, the level is
+// (s + 49) / 100 but for an exact half (s = 100 k + 50), where (s + 50) / 100 is larger and the
+// table decides; (t * 5243) >> 19 is t / 100 for every t up to 43000.
+[[gnu::target("avx2"), gnu::always_inline]] inline void Gray16(const std::uint8_t* p,
+                                                               const std::uint8_t* q, __m256i lift,
+                                                               const std::uint8_t* table,
+                                                               __m256i& gray0, __m256i& gray1) {
+  const __m256i v0 = Relief8(p, q, lift);
+  const __m256i v1 = Relief8(p + 32, q + 32, lift);
   // Packing works within halves of the register: lane 0 holds pixels 0-3 and 8-11, lane 1
   // pixels 4-7 and 12-15.
-  const __m256i s =
-      _mm256_packus_epi32(Sums8(Relief8(p, q, lift)), Sums8(Relief8(p + 32, q + 32, lift)));
+  const __m256i s = _mm256_packus_epi32(Sums8(v0), Sums8(v1));
   const __m256i scale = _mm256_set1_epi16(5243);
   const __m256i t = _mm256_add_epi16(s, _mm256_set1_epi16(49));
-  const __m256i level = _mm256_srli_epi16(_mm256_mulhi_epu16(t, scale), 3);
+  __m256i level = _mm256_srli_epi16(_mm256_mulhi_epu16(t, scale), 3);
   const __m256i above =
       _mm256_srli_epi16(_mm256_mulhi_epu16(_mm256_add_epi16(t, _mm256_set1_epi16(1)), scale), 3);
-  const auto halves =
-      ~static_cast<std::uint32_t>(_mm256_movemask_epi8(_mm256_cmpeq_epi16(level, above)));
+  const __m256i whole = _mm256_cmpeq_epi16(level, above);
+  // Exact halves are rare enough that most groups have none.
+  if (_mm256_movemask_epi8(whole) != -1)
+    level = _mm256_add_epi16(
+        level, _mm256_andnot_si256(
+                   whole, _mm256_packus_epi32(RoundsUp8(v0, table), RoundsUp8(v1, table))));
   const __m256i alpha = _mm256_set1_epi32(static_cast<std::int32_t>(0xFF000000u));
   const __m256i first = _mm256_setr_epi8(0, 0, 0, -1, 2, 2, 2, -1, 4, 4, 4, -1, 6, 6, 6, -1, 0, 0,
                                          0, -1, 2, 2, 2, -1, 4, 4, 4, -1, 6, 6, 6, -1);
   const __m256i second =
       _mm256_setr_epi8(8, 8, 8, -1, 10, 10, 10, -1, 12, 12, 12, -1, 14, 14, 14, -1, 8, 8, 8, -1, 10,
                        10, 10, -1, 12, 12, 12, -1, 14, 14, 14, -1);
-  _mm256_storeu_si256(reinterpret_cast<__m256i*>(gray),
-                      _mm256_or_si256(_mm256_shuffle_epi8(level, first), alpha));
-  _mm256_storeu_si256(reinterpret_cast<__m256i*>(gray + 32),
-                      _mm256_or_si256(_mm256_shuffle_epi8(level, second), alpha));
-  return halves & 0x55555555u;
+  gray0 = _mm256_or_si256(_mm256_shuffle_epi8(level, first), alpha);
+  gray1 = _mm256_or_si256(_mm256_shuffle_epi8(level, second), alpha);
 }
 
-// The pixel of a stretch that bit b of Gray16's result stands for.
-constexpr int HalfPixel(int bit) {
-  const int element = bit / 2;
-  return (element % 8 < 4 ? 0 : 8) + element / 8 * 4 + element % 4;
+[[gnu::target("avx2"), gnu::always_inline]] inline void Store16(std::uint8_t* out, __m256i gray0,
+                                                                __m256i gray1) {
+  _mm256_storeu_si256(reinterpret_cast<__m256i*>(out), gray0);
+  _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + 32), gray1);
 }
 
-// Pixels 0 .. n - 1, n >= 16, into gray: groups of sixteen, the last overlapping the one
-// before; halves[g] gets the exact halves of group g. Returns the number of groups. Nothing
-// here calls out, so the constants stay in registers.
-[[gnu::target("avx2"), gnu::noinline]] int Avx2Groups(const std::uint8_t* p, const std::uint8_t* q,
-                                                      int n, int lift, std::uint32_t* gray,
-                                                      std::uint32_t* halves) {
-  auto* out = reinterpret_cast<std::uint8_t*>(gray);
-  const __m256i l = _mm256_set1_epi8(static_cast<char>(lift));
-  int groups = 0;
-  for (int x = 0; x < n; x += 16) {
-    const int at = std::min(x, n - 16);
-    halves[groups++] = Gray16(p + 4 * at, q + 4 * at, l, out + 4 * at);
-  }
-  return groups;
-}
-
-void Avx2Stretch(const Pixel* p, const Pixel* q, int n, int lift, std::uint32_t* gray) {
-  const auto* pb = reinterpret_cast<const std::uint8_t*>(p);
-  const auto* qb = reinterpret_cast<const std::uint8_t*>(q);
-  std::uint32_t halves[kStretch / 16 + 2];
-  const int groups = Avx2Groups(pb, qb, n, lift, gray, halves);
-  for (int g = 0; g < groups; ++g)
-    for (std::uint32_t bits = halves[g]; bits != 0; bits &= bits - 1) {
-      const int i = std::min(16 * g, n - 16) + HalfPixel(__builtin_ctz(bits));
-      const auto v = [&](int c) {
-        return std::min(255, std::abs(pb[4 * i + c] - qb[4 * i + c] + lift));
-      };
-      gray[i] = 0xFF000000u | 0x010101u * GrayValueOfHalf(v(2), v(1), v(0));
-    }
-}
-
-// n pixels from from into to. The result is far larger than the caches: streaming stores
-// spare reading each line of it before writing it. The band ends with a store fence.
-[[gnu::target("avx2")]] void StreamOut(const std::uint32_t* from, int n, Pixel* to) {
-  auto* dst = reinterpret_cast<std::uint8_t*>(to);
-  int i = 0;
-  for (; i < n && reinterpret_cast<std::uintptr_t>(dst + 4 * i) % 32 != 0; ++i)
-    std::memcpy(dst + 4 * i, from + i, 4);
-  for (; i + 8 <= n; i += 8)
-    _mm256_stream_si256(reinterpret_cast<__m256i*>(dst + 4 * i),
-                        _mm256_loadu_si256(reinterpret_cast<const __m256i*>(from + i)));
-  for (; i < n; ++i) std::memcpy(dst + 4 * i, from + i, 4);
-}
-
+// n >= 16 pixels in groups of sixteen, the first and the last overlapping their neighbours.
+// In between the result streams past the caches: it is far larger than they are, and streaming
+// spares reading each line of it before writing it. The band ends with a store fence.
 [[gnu::target("avx2")]] void Avx2ReliefRow(const Pixel* p, const Pixel* q, int n, int lift,
                                            Pixel* out) {
-  if (n < 16) {
+  const auto address = reinterpret_cast<std::uintptr_t>(out);
+  if (n < 16 || address % 4 != 0) {
     PlainReliefRow(p, q, n, lift, out);
     return;
   }
-  alignas(32) std::uint32_t gray[kStretch + 16];
-  for (int x = 0; x < n;) {
-    // A stretch of fewer than 16 pixels joins the one before.
-    const int count = n - x < kStretch + 16 ? n - x : kStretch;
-    Avx2Stretch(p + x, q + x, count, lift, gray);
-    StreamOut(gray, count, out + x);
-    x += count;
+  const auto* pb = reinterpret_cast<const std::uint8_t*>(p);
+  const auto* qb = reinterpret_cast<const std::uint8_t*>(q);
+  auto* dst = reinterpret_cast<std::uint8_t*>(out);
+  const std::uint8_t* table = HalfRoundsUp();
+  const __m256i l = _mm256_set1_epi8(static_cast<char>(lift));
+  const int end = 4 * n;
+  __m256i gray0, gray1;
+  Gray16(pb, qb, l, table, gray0, gray1);
+  Store16(dst, gray0, gray1);
+  int j = static_cast<int>((32 - address % 32) % 32);
+  for (; j + 64 <= end; j += 64) {
+    Gray16(pb + j, qb + j, l, table, gray0, gray1);
+    _mm256_stream_si256(reinterpret_cast<__m256i*>(dst + j), gray0);
+    _mm256_stream_si256(reinterpret_cast<__m256i*>(dst + j + 32), gray1);
+  }
+  if (j < end) {
+    Gray16(pb + end - 64, qb + end - 64, l, table, gray0, gray1);
+    Store16(dst + end - 64, gray0, gray1);
   }
 }
 #endif
@@ -169,7 +169,10 @@ using ReliefRow = void (*)(const Pixel*, const Pixel*, int, int, Pixel*);
 // variant.
 ReliefRow ChooseReliefRow(int lift) {
 #if defined(__x86_64__) && defined(__GNUC__)
-  if (UseAvx2() && lift >= 0 && lift <= 255) return Avx2ReliefRow;
+  if (UseAvx2() && lift >= 0 && lift <= 255) {
+    HalfRoundsUp();
+    return Avx2ReliefRow;
+  }
 #endif
   (void)lift;
   return PlainReliefRow;
