@@ -23,30 +23,53 @@ constexpr int kSumChunk = 1024;
 
 // One tap over a stretch of bytes, on its own so that the compiler sees that nothing else
 // overlaps and handles many bytes at once.
-void AddTap(const std::uint8_t* __restrict src, std::int16_t weight, std::int16_t* __restrict sums,
-            int count) {
-  for (int i = 0; i < count; ++i) sums[i] = static_cast<std::int16_t>(sums[i] + weight * src[i]);
+template <typename Sum>
+void AddTap(const std::uint8_t* __restrict src, Sum weight, Sum* __restrict sums, int count) {
+  for (int i = 0; i < count; ++i) sums[i] = static_cast<Sum>(sums[i] + weight * src[i]);
 }
 
 // The gradients weigh one column of three against the next but one: each column's weighted
 // sum is formed once and serves both neighbours. sums[i] = sign (column(i - 4) - column(i + 4))
 // over byte first + i, with the middle row weighing middle.
+template <typename Sum>
 void GradientSums(const std::uint8_t* const rows[3], int first, int count, int middle, int sign,
-                  std::int16_t* __restrict sums) {
-  std::int16_t columns[kSumChunk + 8];
+                  Sum* __restrict sums) {
+  Sum columns[kSumChunk + 8];
   const std::uint8_t* __restrict above = rows[0] + first - 4;
   const std::uint8_t* __restrict row = rows[1] + first - 4;
   const std::uint8_t* __restrict below = rows[2] + first - 4;
   for (int i = 0; i < count + 8; ++i)
-    columns[i] = static_cast<std::int16_t>(above[i] + middle * row[i] + below[i]);
-  for (int i = 0; i < count; ++i)
-    sums[i] = static_cast<std::int16_t>(sign * (columns[i] - columns[i + 8]));
+    columns[i] = static_cast<Sum>(above[i] + middle * row[i] + below[i]);
+  for (int i = 0; i < count; ++i) sums[i] = static_cast<Sum>(sign * (columns[i] - columns[i + 8]));
 }
 
 // A sum limited to 0..255, by value so that the compiler does many at once.
-inline std::uint8_t ClampShort(std::int16_t v) {
-  const std::int16_t low = v < 0 ? 0 : v;
+template <typename Sum>
+inline std::uint8_t Clamp(Sum v) {
+  const Sum low = v < 0 ? 0 : v;
   return static_cast<std::uint8_t>(low > 255 ? 255 : low);
+}
+
+template <typename Sum, typename Taps>
+void PlainSums(const Taps& taps, std::optional<ColumnGradient> gradient,
+               const std::uint8_t* const rows[3], int w, std::uint8_t* dst) {
+  const int bytes = 4 * w;
+  Sum sums[kSumChunk];
+  Sum gradientSums[kSumChunk];
+  for (int first = 4; first < bytes - 4; first += kSumChunk) {
+    const int count = std::min(kSumChunk, bytes - 4 - first);
+    std::fill(sums, sums + count, Sum{0});
+    for (const auto& t : taps)
+      AddTap<Sum>(rows[t.row] + first + t.offset, static_cast<Sum>(t.weight), sums, count);
+    if (gradient) {
+      GradientSums(rows, first, count, gradient->middle, gradient->sign, gradientSums);
+      for (int i = 0; i < count; ++i)
+        dst[first + i] = static_cast<std::uint8_t>(255 - Clamp(std::max(sums[i], gradientSums[i])));
+    } else {
+      for (int i = 0; i < count; ++i) dst[first + i] = Clamp(sums[i]);
+    }
+  }
+  for (int x = 1; x < w - 1; ++x) dst[4 * x + 3] = 255;
 }
 
 #if defined(__x86_64__) && defined(__GNUC__)
@@ -187,20 +210,19 @@ Kernel KernelFrom(const EffectParams::Values& values) {
 std::optional<KernelRowPass> KernelRowPass::Make(const Kernel& k,
                                                  std::optional<ColumnGradient> gradient) {
   std::int64_t magnitude = 0;
-  for (std::int64_t w : k) {
-    if (w > 128 || w < -128) return std::nullopt;
-    magnitude += w < 0 ? -w : w;
-  }
-  if (magnitude > 128) return std::nullopt;
+  for (std::int64_t w : k) magnitude += w < 0 ? -w : w;
   KernelRowPass pass;
   pass.gradient_ = gradient;
+  pass.wide_ = magnitude > 128;
+  // |sum| <= magnitude * 255 must fit 32 bits.
+  if (magnitude > std::numeric_limits<std::int32_t>::max() / 255) return std::nullopt;
   for (int t = 0; t < 9; ++t)
     if (k[static_cast<std::size_t>(t)] != 0)
       pass.taps_.push_back(
-          {t / 3, (t % 3 - 1) * 4, static_cast<std::int16_t>(k[static_cast<std::size_t>(t)])});
+          {t / 3, (t % 3 - 1) * 4, static_cast<std::int32_t>(k[static_cast<std::size_t>(t)])});
   // Only a lone weight of 128 misses a signed byte.
   const bool bytes = std::all_of(k.begin(), k.end(), [](std::int64_t w) { return w < 128; });
-  if (bytes && UseAvx2()) {
+  if (!pass.wide_ && bytes && UseAvx2()) {
     const auto at = [&k](int t) {
       return static_cast<std::int8_t>(k[static_cast<std::size_t>(t)]);
     };
@@ -210,23 +232,10 @@ std::optional<KernelRowPass> KernelRowPass::Make(const Kernel& k,
 }
 
 void KernelRowPass::PlainRow(const std::uint8_t* const rows[3], int w, std::uint8_t* dst) const {
-  const int bytes = 4 * w;
-  std::int16_t sums[kSumChunk];
-  std::int16_t gradientSums[kSumChunk];
-  for (int first = 4; first < bytes - 4; first += kSumChunk) {
-    const int count = std::min(kSumChunk, bytes - 4 - first);
-    std::fill(sums, sums + count, std::int16_t{0});
-    for (const Tap& t : taps_) AddTap(rows[t.row] + first + t.offset, t.weight, sums, count);
-    if (gradient_) {
-      GradientSums(rows, first, count, gradient_->middle, gradient_->sign, gradientSums);
-      for (int i = 0; i < count; ++i)
-        dst[first + i] =
-            static_cast<std::uint8_t>(255 - ClampShort(std::max(sums[i], gradientSums[i])));
-    } else {
-      for (int i = 0; i < count; ++i) dst[first + i] = ClampShort(sums[i]);
-    }
-  }
-  for (int x = 1; x < w - 1; ++x) dst[4 * x + 3] = 255;
+  if (wide_)
+    PlainSums<std::int32_t>(taps_, gradient_, rows, w, dst);
+  else
+    PlainSums<std::int16_t>(taps_, gradient_, rows, w, dst);
 }
 
 void KernelRowPass::Row(const Pixel* above, const Pixel* row, const Pixel* below, int w,

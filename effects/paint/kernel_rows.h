@@ -36,8 +36,9 @@ struct ColumnGradient {
 
 // The interior of one row of a kernel pass. Each colour byte is the kernel's sum over its 3 x 3
 // block clamped to 0..255 or, with a gradient, 255 minus the clamped larger of the kernel's and
-// the gradient's sums. Alpha is 255. Works in 16 bits, so only for kernels whose weights'
-// magnitudes add up to at most 128 (|sum| <= 128 * 255); Make gives nothing for the others.
+// the gradient's sums. Alpha is 255. Sums are formed in 16 bits when the weights' magnitudes
+// add up to at most 128 (|sum| <= 128 * 255), else in 32 bits; Make gives nothing for kernels
+// whose sums could leave 32 bits.
 class KernelRowPass {
  public:
   static std::optional<KernelRowPass> Make(const Kernel& k, std::optional<ColumnGradient> gradient);
@@ -51,12 +52,13 @@ class KernelRowPass {
   struct Tap {
     int row = 0;
     int offset = 0;
-    std::int16_t weight = 0;
+    std::int32_t weight = 0;
   };
   void PlainRow(const std::uint8_t* const rows[3], int w, std::uint8_t* out) const;
 
   std::vector<Tap> taps_;
   std::optional<ColumnGradient> gradient_;
+  bool wide_ = false;
   // For the AVX2 variant: the weights in byte pairs (left, right of each row; above, below
   // centre; centre alone) and which pairs count; empty when a weight does not fit a signed byte.
   std::optional<std::array<std::int8_t, 10>> pairs_;

@@ -44,7 +44,7 @@ void ConvolveInto(const TBitmap32& picture, const Kernel& k, std::uint16_t divis
                   TBitmap32& out) {
   const int w = picture.Width();
   const int h = picture.Height();
-  // Kernels too heavy for 16-bit sums, and divisors other than 1, are rare: they take the
+  // Kernels too heavy for 32-bit sums, and divisors other than 1, are rare: they take the
   // plain way.
   const auto pass = divisor > 1 ? std::nullopt : KernelRowPass::Make(k, std::nullopt);
   if (!pass) {

@@ -49,7 +49,8 @@ TBitmap32 Extremes(int w, int h) {
 }
 
 TEST(KernelFastPath, EqualsTheReferencesAtAwkwardSizes) {
-  // Defaults, pairs of weights at the byte limits, a lone 128 and kernels beyond 16 bits.
+  // Defaults, pairs of weights at the byte limits, a lone 128, kernels beyond 16 bits and at
+  // the edge of 32 (255 times their magnitudes is 2^31 - 128).
   const Kernel kernels[] = {{1, 2, 1, 0, 0, 0, -1, -1, -1},
                             {-1, -1, -1, 0, 0, 0, -1, -1, -1},
                             {-1, -2, -1, 0, 0, 0, 1, 2, 1},
@@ -59,7 +60,9 @@ TEST(KernelFastPath, EqualsTheReferencesAtAwkwardSizes) {
                             {0, 0, 0, 0, -64, 0, 0, -64},
                             {0, 0, 0, 0, 128},
                             {3, -17, 9, 40, -5, 11, -2, 30, 8},
-                            {200, 0, 0, 0, -90}};
+                            {200, 0, 0, 0, -90},
+                            {8421504},
+                            {-4210752, 0, 0, 0, 0, 0, 0, 0, -4210752}};
   for (const auto& [split, avx2] : kVariants) {
     const Variant variant(split, avx2);
     unsigned seed = 0;
