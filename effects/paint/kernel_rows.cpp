@@ -1,5 +1,5 @@
-// The kernel passes' rows, compiled twice: plain loops over 16-bit sums that any x86-64 widens,
-// and an AVX2 variant chosen once per pass when this processor has the instructions.
+// The kernel passes' rows, compiled twice: plain loops over 16- or 32-bit sums that any x86-64
+// widens, and an AVX2 variant chosen once per pass when this processor has the instructions.
 #include "effects/paint/kernel_rows.h"
 
 #include <algorithm>

@@ -59,8 +59,9 @@ class KernelRowPass {
   std::vector<Tap> taps_;
   std::optional<ColumnGradient> gradient_;
   bool wide_ = false;
-  // For the AVX2 variant: the weights in byte pairs (left, right of each row; above, below
-  // centre; centre alone) and which pairs count; empty when a weight does not fit a signed byte.
+  // For the AVX2 variant: the weights in byte pairs (left and right of each row; above and
+  // below the centre; the centre alone). Empty when it does not run: no AVX2, sums wider than
+  // 16 bits, or a weight of 128, which misses a signed byte.
   std::optional<std::array<std::int8_t, 10>> pairs_;
 };
 
