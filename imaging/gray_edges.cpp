@@ -58,8 +58,40 @@ void HalvesOf(const std::uint8_t* edge, std::uint8_t* level, int x) {
   level[x] = GrayValueOfHalf(edge[4 * x + 2], edge[4 * x + 1], edge[4 * x]);
 }
 
+// Whether the gray values of n edge pixels are above level, as cells (0xFF above, 0 not): the
+// gray value is above level exactly when the sum is above 100 level + 50, but for an exact half
+// there, where GrayValueOfHalf decides. A half at the limit is marked in half; returns whether
+// there is one. The division and the other halves are not needed.
+[[gnu::always_inline]] inline bool CellStretch(const std::uint8_t* __restrict edge, int n,
+                                               int level, std::uint8_t* __restrict cells,
+                                               std::uint8_t* __restrict half) {
+  const int limit = 100 * level + 50;
+  std::uint8_t anyHalf = 0;
+  for (int x = 0; x < n; ++x) {
+    const int sum = 30 * edge[4 * x + 2] + 59 * edge[4 * x + 1] + 11 * edge[4 * x];
+    cells[x] = sum > limit ? 0xFF : 0;
+    half[x] = sum == limit;
+    anyHalf |= half[x];
+  }
+  return anyHalf != 0;
+}
+
+void CellOfHalf(const std::uint8_t* edge, int level, std::uint8_t* cells, int x) {
+  cells[x] = GrayValueOfHalf(edge[4 * x + 2], edge[4 * x + 1], edge[4 * x]) > level ? 0xFF : 0;
+}
+
+void PlainCells(const std::uint8_t* above, const std::uint8_t* row, const std::uint8_t* below,
+                int x0, int n, int level, std::uint8_t* cells) {
+  alignas(64) std::uint8_t edge[4 * kStretch];
+  std::uint8_t half[kStretch];
+  EdgeStretch(above, row, below, x0, n, edge);
+  if (CellStretch(edge, n, level, cells, half))
+    for (int x = 0; x < n; ++x)
+      if (half[x]) CellOfHalf(edge, level, cells, x);
+}
+
 void PlainLevels(const std::uint8_t* above, const std::uint8_t* row, const std::uint8_t* below,
-                 int x0, int n, std::uint8_t* level) {
+                 int x0, int n, int /*level*/, std::uint8_t* level) {
   alignas(64) std::uint8_t edge[4 * kStretch];
   std::uint8_t half[kStretch];
   EdgeStretch(above, row, below, x0, n, edge);
@@ -134,7 +166,7 @@ void PlainPixels(const std::uint8_t* level, int n, const std::uint32_t* pixelOf,
 
 // The gray values 32 pixels at a time; the halves come out as a bit mask.
 [[gnu::target("avx2")]] void Avx2Levels(const std::uint8_t* above, const std::uint8_t* row,
-                                        const std::uint8_t* below, int x0, int n,
+                                        const std::uint8_t* below, int x0, int n, int /*level*/,
                                         std::uint8_t* level) {
   alignas(64) std::uint8_t edge[4 * kStretch];
   std::uint8_t half[kStretch];
@@ -159,6 +191,36 @@ void PlainPixels(const std::uint8_t* level, int n, const std::uint32_t* pixelOf,
       if (half[i - x]) HalvesOf(edge, level, i);
 }
 
+// The cells 32 pixels at a time, by comparing the sums; the halves at the limit come out as a
+// bit mask.
+[[gnu::target("avx2")]] void Avx2Cells(const std::uint8_t* above, const std::uint8_t* row,
+                                       const std::uint8_t* below, int x0, int n, int level,
+                                       std::uint8_t* cells) {
+  alignas(64) std::uint8_t edge[4 * kStretch];
+  std::uint8_t half[kStretch];
+  Avx2EdgeStretch(above, row, below, x0, n, edge);
+  const __m256i order = _mm256_setr_epi32(0, 4, 1, 5, 2, 6, 3, 7);
+  const __m256i limit = _mm256_set1_epi16(static_cast<std::int16_t>(100 * level + 50));
+  int x = 0;
+  for (; x + 32 <= n; x += 32) {
+    // Packing works within halves of the register: the order is restored at the end.
+    const __m256i s01 = _mm256_packus_epi32(Sums8(edge + 4 * x), Sums8(edge + 4 * x + 32));
+    const __m256i s23 = _mm256_packus_epi32(Sums8(edge + 4 * x + 64), Sums8(edge + 4 * x + 96));
+    const __m256i above01 = _mm256_cmpgt_epi16(s01, limit);
+    const __m256i above23 = _mm256_cmpgt_epi16(s23, limit);
+    _mm256_storeu_si256(reinterpret_cast<__m256i*>(cells + x),
+                        _mm256_permutevar8x32_epi32(_mm256_packs_epi16(above01, above23), order));
+    const __m256i at01 = _mm256_cmpeq_epi16(s01, limit);
+    const __m256i at23 = _mm256_cmpeq_epi16(s23, limit);
+    auto mask = static_cast<std::uint32_t>(
+        _mm256_movemask_epi8(_mm256_permutevar8x32_epi32(_mm256_packs_epi16(at01, at23), order)));
+    for (; mask != 0; mask &= mask - 1) CellOfHalf(edge, level, cells, x + __builtin_ctz(mask));
+  }
+  if (x < n && CellStretch(edge + 4 * x, n - x, level, cells + x, half))
+    for (int i = x; i < n; ++i)
+      if (half[i - x]) CellOfHalf(edge, level, cells, i);
+}
+
 // The table's pixels go past the caches: the result is far larger than they are, and streaming
 // stores spare reading each line of it before writing it. The band ends with a store fence.
 [[gnu::target("avx2")]] void Avx2Pixels(const std::uint8_t* level, int n,
@@ -179,8 +241,9 @@ void PlainPixels(const std::uint8_t* level, int n, const std::uint32_t* pixelOf,
 }
 #endif
 
+// A stretch of an interior row's gray values, or of its cells at a level.
 using LevelStretch = void (*)(const std::uint8_t*, const std::uint8_t*, const std::uint8_t*, int,
-                              int, std::uint8_t*);
+                              int, int, std::uint8_t*);
 using PixelRow = void (*)(const std::uint8_t*, int, const std::uint32_t*, Pixel*);
 
 LevelStretch ChooseLevels() {
@@ -188,6 +251,13 @@ LevelStretch ChooseLevels() {
   if (UseAvx2()) return Avx2Levels;
 #endif
   return PlainLevels;
+}
+
+LevelStretch ChooseCells() {
+#if defined(__x86_64__) && defined(__GNUC__)
+  if (UseAvx2()) return Avx2Cells;
+#endif
+  return PlainCells;
 }
 
 PixelRow ChoosePixels() {
@@ -199,22 +269,24 @@ PixelRow ChoosePixels() {
 
 // Gray edge row y from source rows y - 1, y and y + 1, a stretch at a time; the border rows
 // and columns repeat their inner neighbours, and so do their gray values.
-void EdgeRowLevels(LevelStretch stretch, const TBitmap32& source, int y, std::uint8_t* level) {
+void EdgeRowLevels(LevelStretch stretch, const TBitmap32& source, int y, int level,
+                   std::uint8_t* out) {
   const int w = source.Width();
   y = std::clamp(y, 1, source.Height() - 2);
   const auto* above = reinterpret_cast<const std::uint8_t*>(source.ScanLine(y - 1));
   const auto* row = reinterpret_cast<const std::uint8_t*>(source.ScanLine(y));
   const auto* below = reinterpret_cast<const std::uint8_t*>(source.ScanLine(y + 1));
   for (int x0 = 1; x0 < w - 1; x0 += kStretch)
-    stretch(above, row, below, x0, std::min(kStretch, w - 1 - x0), level + x0);
-  level[0] = level[1];
-  level[w - 1] = level[w - 2];
+    stretch(above, row, below, x0, std::min(kStretch, w - 1 - x0), level, out + x0);
+  out[0] = out[1];
+  out[w - 1] = out[w - 2];
 }
 
 }  // namespace
 
-void GrayEdgeRow(const TBitmap32& source, int y, std::uint8_t* levels) {
-  EdgeRowLevels(ChooseLevels(), source, y, levels);
+void GrayEdgeCells(const TBitmap32& source, int y, int level, std::uint8_t* cells) {
+  // Gray values are bytes: none is above 255, all are above -1.
+  EdgeRowLevels(ChooseCells(), source, y, std::clamp(level, -1, 255), cells);
 }
 
 TBitmap32 GrayEdgeLevels(const TBitmap32& source, const std::array<std::uint8_t, 256>& levels) {
@@ -243,7 +315,7 @@ TBitmap32 GrayEdgeLevels(const TBitmap32& source, const std::array<std::uint8_t,
   ParallelRows(0, h, static_cast<std::size_t>(w) * 12, [&](int y0, int y1) {
     std::vector<std::uint8_t> level(static_cast<std::size_t>(w));
     for (int y = y0; y < y1; ++y) {
-      EdgeRowLevels(stretch, source, y, level.data());
+      EdgeRowLevels(stretch, source, y, 0, level.data());
       pixels(level.data(), w, pixelOf, out.ScanLine(y));
     }
     EndStreamedRows();

@@ -14,13 +14,6 @@ namespace {
 // Pixels seen as 32-bit words, blue in the lowest byte.
 using Word [[gnu::may_alias]] = std::uint32_t;
 
-// Written so that the compiler compares many bytes per instruction; compiled once for any
-// x86-64 and once for AVX2.
-[[gnu::always_inline]] inline void ThresholdLoop(const std::uint8_t* levels, int n,
-                                                 std::uint8_t level, std::uint8_t* cells) {
-  for (int x = 0; x < n; ++x) cells[x] = levels[x] > level ? 0xFF : 0;
-}
-
 // A cell widened to 32 bits is all ones for paper and 0 for ink; alpha is set either way, and
 // the colour shows only through ink.
 [[gnu::always_inline]] inline void PixelLoop(const std::uint8_t* __restrict cells, int n,
@@ -43,11 +36,6 @@ const Word* Words(const Pixel* p) {
 }
 
 #if defined(__x86_64__) && defined(__GNUC__)
-[[gnu::target("avx2")]] void Avx2Threshold(const std::uint8_t* levels, int n, std::uint8_t level,
-                                           std::uint8_t* cells) {
-  ThresholdLoop(levels, n, level, cells);
-}
-
 // Eight pixels at a time, stored past the caches: a drawing is far larger than they are, and
 // streaming stores spare reading each line of it before writing it.
 [[gnu::target("avx2")]] void Avx2Pixels(const std::uint8_t* cells, int n, Pixel* out,
@@ -70,19 +58,6 @@ const Word* Words(const Pixel* p) {
 #endif
 
 }  // namespace
-
-void ThresholdCells(const std::uint8_t* levels, int n, int level, std::uint8_t* cells) {
-  // Levels are bytes: above 255 nothing is paper, below 0 everything is.
-  if (level >= 255 || level < 0) {
-    std::memset(cells, level < 0 ? 0xFF : 0, static_cast<std::size_t>(n > 0 ? n : 0));
-    return;
-  }
-  const auto byte = static_cast<std::uint8_t>(level);
-#if defined(__x86_64__) && defined(__GNUC__)
-  if (UseAvx2()) return Avx2Threshold(levels, n, byte, cells);
-#endif
-  ThresholdLoop(levels, n, byte, cells);
-}
 
 void InkPixels(const std::uint8_t* cells, int n, Pixel* out, const Pixel* colours) {
 #if defined(__x86_64__) && defined(__GNUC__)

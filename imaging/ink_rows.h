@@ -12,10 +12,6 @@ namespace quillane {
 inline constexpr Pixel kInk{0, 0, 0, 255};
 inline constexpr Pixel kPaper{255, 255, 255, 255};
 
-// cells[x] = 0xFF (paper) where levels[x] > level, else 0 (ink), for x < n; cells may be
-// levels itself.
-void ThresholdCells(const std::uint8_t* levels, int n, int level, std::uint8_t* cells);
-
 // The pixels of n cells (each 0 or 0xFF): paper for 0xFF, ink for 0. With colours, ink takes the
 // blue, green and red of colours[x] and alpha 255. The pixels may go past the caches: a band
 // that wrote any ends with EndStreamedRows() before another thread reads them.

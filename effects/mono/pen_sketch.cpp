@@ -40,8 +40,7 @@ TBitmap32 PenSketch(const TBitmap32& source, int pressure) {
   ParallelRows(0, h, static_cast<std::size_t>(w) * 12, [&](int y0, int y1) {
     std::vector<std::uint8_t> cells(static_cast<std::size_t>(w));
     for (int y = y0; y < y1; ++y) {
-      GrayEdgeRow(source, y, cells.data());
-      ThresholdCells(cells.data(), w, pressure, cells.data());
+      GrayEdgeCells(source, y, pressure, cells.data());
       InkPixels(cells.data(), w, drawing.ScanLine(y));
     }
     EndStreamedRows();

@@ -88,8 +88,7 @@ void HatchBand(const TBitmap32& source, TBitmap32& drawing, int y0, int y1, int 
   };
   for (int t = lo(0); t <= hi(0) + scope; ++t) {
     if (t <= hi(0)) {
-      GrayEdgeRow(source, t, slot(0, t));
-      ThresholdCells(slot(0, t), w, pressure, slot(0, t));
+      GrayEdgeCells(source, t, pressure, slot(0, t));
     }
     for (int k = 1; k <= scope; ++k) {
       const int r = t - k;
