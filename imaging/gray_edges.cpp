@@ -1,7 +1,8 @@
 // The gray values of the edge map, fused: each row is walked a stretch at a time, and the edge
-// bytes of a stretch live only in the first-level cache, as do the row's gray values that the
-// drawings then turn into pixels (through a table, or a threshold). The arithmetic is written
-// so that the compiler handles many bytes per instruction; it is compiled twice, for any x86-64
+// bytes of a stretch live only in the first-level cache. The pencil turns the row's gray values
+// into pixels through a table; the pen drawings need only whether each is above their
+// pressure, which the weighted sums tell without the division. The arithmetic is written so
+// that the compiler handles many bytes per instruction; it is compiled twice, for any x86-64
 // and for processors with AVX2, and the one this processor runs is chosen at run time.
 #include <algorithm>
 #include <cstring>
@@ -267,8 +268,8 @@ PixelRow ChoosePixels() {
   return PlainPixels;
 }
 
-// Gray edge row y from source rows y - 1, y and y + 1, a stretch at a time; the border rows
-// and columns repeat their inner neighbours, and so do their gray values.
+// Gray values (or cells) of edge row y from source rows y - 1, y and y + 1, a stretch at a
+// time; the border rows and columns repeat their inner neighbours, and so do their gray values.
 void EdgeRowLevels(LevelStretch stretch, const TBitmap32& source, int y, int level,
                    std::uint8_t* out) {
   const int w = source.Width();
