@@ -26,6 +26,12 @@ void picsobel(TBitmap32& bitmap);
 // changed.
 TBitmap32 GrayEdgeLevels(const TBitmap32& source, const std::array<std::uint8_t, 256>& levels);
 
+// Row y (0 .. height - 1) of the edge map of source thresholded at level, one byte a pixel into
+// cells[0 .. width - 1]: 0xFF where the gray value (GrayValue) of what picsobel makes of a copy
+// of source is above level, 0 elsewhere; from source's rows y - 1 to y + 1 alone, without the
+// edge map or its gray values. For sources of at least 3 by 3.
+void GrayEdgeCells(const TBitmap32& source, int y, int level, std::uint8_t* cells);
+
 // The same edge map computed the plain way, pixel by pixel and channel by channel from a
 // snapshot, border columns, border rows, then the inversion. picsobel must equal it byte for
 // byte, alpha included; it is kept as the oracle for the banded, threaded fast path. For

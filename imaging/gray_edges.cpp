@@ -1,10 +1,12 @@
-// The gray edge map through a table, fused: each band walks its rows a stretch at a time, and
-// the edge bytes, their gray values and the table's pixels of a stretch live only in the
-// first-level cache. The arithmetic is written so that the compiler handles many bytes per
-// instruction; it is compiled twice, for any x86-64 and for processors with AVX2, and the one
-// this processor runs is chosen once.
+// The gray values of the edge map, fused: each row is walked a stretch at a time, and the edge
+// bytes of a stretch live only in the first-level cache. The pencil turns the row's gray values
+// into pixels through a table; the pen drawings need only whether each is above their
+// pressure, which the weighted sums tell without the division. The arithmetic is written so
+// that the compiler handles many bytes per instruction; it is compiled twice, for any x86-64
+// and for processors with AVX2, and the one this processor runs is chosen at run time.
 #include <algorithm>
 #include <cstring>
+#include <vector>
 
 #if defined(__x86_64__)
 #include <immintrin.h>
@@ -12,6 +14,7 @@
 
 #include "imaging/edge_byte.h"
 #include "imaging/edge_map.h"
+#include "imaging/ink_rows.h"
 #include "imaging/numeric.h"
 #include "imaging/parallel.h"
 #include "imaging/tone.h"
@@ -56,22 +59,51 @@ void HalvesOf(const std::uint8_t* edge, std::uint8_t* level, int x) {
   level[x] = GrayValueOfHalf(edge[4 * x + 2], edge[4 * x + 1], edge[4 * x]);
 }
 
-void LookUp(const std::uint8_t* level, int n, const std::uint32_t* pixelOf, std::uint32_t* out) {
-  for (int x = 0; x < n; ++x) out[x] = pixelOf[level[x]];
+// Whether the gray values of n edge pixels are above level, as cells (0xFF above, 0 not): the
+// gray value is above level exactly when the sum is above 100 level + 50, but for an exact half
+// there, where GrayValueOfHalf decides. A half at the limit is marked in half; returns whether
+// there is one. The division and the other halves are not needed.
+[[gnu::always_inline]] inline bool CellStretch(const std::uint8_t* __restrict edge, int n,
+                                               int level, std::uint8_t* __restrict cells,
+                                               std::uint8_t* __restrict half) {
+  const int limit = 100 * level + 50;
+  std::uint8_t anyHalf = 0;
+  for (int x = 0; x < n; ++x) {
+    const int sum = 30 * edge[4 * x + 2] + 59 * edge[4 * x + 1] + 11 * edge[4 * x];
+    cells[x] = sum > limit ? 0xFF : 0;
+    half[x] = sum == limit;
+    anyHalf |= half[x];
+  }
+  return anyHalf != 0;
 }
 
-void PlainStretch(const std::uint8_t* above, const std::uint8_t* row, const std::uint8_t* below,
-                  int x0, int n, const std::uint32_t* pixelOf, Pixel* out) {
+void CellOfHalf(const std::uint8_t* edge, int level, std::uint8_t* cells, int x) {
+  cells[x] = GrayValueOfHalf(edge[4 * x + 2], edge[4 * x + 1], edge[4 * x]) > level ? 0xFF : 0;
+}
+
+void PlainCells(const std::uint8_t* above, const std::uint8_t* row, const std::uint8_t* below,
+                int x0, int n, int level, std::uint8_t* cells) {
   alignas(64) std::uint8_t edge[4 * kStretch];
-  std::uint8_t level[kStretch];
+  std::uint8_t half[kStretch];
+  EdgeStretch(above, row, below, x0, n, edge);
+  if (CellStretch(edge, n, level, cells, half))
+    for (int x = 0; x < n; ++x)
+      if (half[x]) CellOfHalf(edge, level, cells, x);
+}
+
+void PlainLevels(const std::uint8_t* above, const std::uint8_t* row, const std::uint8_t* below,
+                 int x0, int n, int /*level*/, std::uint8_t* level) {
+  alignas(64) std::uint8_t edge[4 * kStretch];
   std::uint8_t half[kStretch];
   EdgeStretch(above, row, below, x0, n, edge);
   if (GrayStretch(edge, n, level, half))
     for (int x = 0; x < n; ++x)
       if (half[x]) HalvesOf(edge, level, x);
-  std::uint32_t pixels[kStretch];
-  LookUp(level, n, pixelOf, pixels);
-  std::memcpy(static_cast<void*>(out + x0), pixels, static_cast<std::size_t>(n) * sizeof(Pixel));
+}
+
+void PlainPixels(const std::uint8_t* level, int n, const std::uint32_t* pixelOf, Pixel* out) {
+  for (int x = 0; x < n; ++x)
+    std::memcpy(static_cast<void*>(out + x), pixelOf + level[x], sizeof(Pixel));
 }
 
 #if defined(__x86_64__) && defined(__GNUC__)
@@ -134,11 +166,10 @@ void PlainStretch(const std::uint8_t* above, const std::uint8_t* row, const std:
 }
 
 // The gray values 32 pixels at a time; the halves come out as a bit mask.
-[[gnu::target("avx2")]] void Avx2Stretch(const std::uint8_t* above, const std::uint8_t* row,
-                                         const std::uint8_t* below, int x0, int n,
-                                         const std::uint32_t* pixelOf, Pixel* out) {
+[[gnu::target("avx2")]] void Avx2Levels(const std::uint8_t* above, const std::uint8_t* row,
+                                        const std::uint8_t* below, int x0, int n, int /*level*/,
+                                        std::uint8_t* level) {
   alignas(64) std::uint8_t edge[4 * kStretch];
-  alignas(64) std::uint8_t level[kStretch];
   std::uint8_t half[kStretch];
   Avx2EdgeStretch(above, row, below, x0, n, edge);
   const __m256i order = _mm256_setr_epi32(0, 4, 1, 5, 2, 6, 3, 7);
@@ -151,7 +182,7 @@ void PlainStretch(const std::uint8_t* above, const std::uint8_t* row, const std:
     const __m256i l01 = Levels16(s01, h01);
     const __m256i l23 = Levels16(s23, h23);
     const __m256i bytes = _mm256_permutevar8x32_epi32(_mm256_packus_epi16(l01, l23), order);
-    _mm256_store_si256(reinterpret_cast<__m256i*>(level + x), bytes);
+    _mm256_storeu_si256(reinterpret_cast<__m256i*>(level + x), bytes);
     auto mask = static_cast<std::uint32_t>(
         _mm256_movemask_epi8(_mm256_permutevar8x32_epi32(_mm256_packs_epi16(h01, h23), order)));
     for (; mask != 0; mask &= mask - 1) HalvesOf(edge, level, x + __builtin_ctz(mask));
@@ -159,46 +190,105 @@ void PlainStretch(const std::uint8_t* above, const std::uint8_t* row, const std:
   if (x < n && GrayStretch(edge + 4 * x, n - x, level + x, half))
     for (int i = x; i < n; ++i)
       if (half[i - x]) HalvesOf(edge, level, i);
-  // The result goes past the caches: it is far larger than they are, and streaming stores
-  // spare reading each line of it before writing it. The band ends with a store fence.
+}
+
+// The cells 32 pixels at a time, by comparing the sums; the halves at the limit come out as a
+// bit mask.
+[[gnu::target("avx2")]] void Avx2Cells(const std::uint8_t* above, const std::uint8_t* row,
+                                       const std::uint8_t* below, int x0, int n, int level,
+                                       std::uint8_t* cells) {
+  alignas(64) std::uint8_t edge[4 * kStretch];
+  std::uint8_t half[kStretch];
+  Avx2EdgeStretch(above, row, below, x0, n, edge);
+  const __m256i order = _mm256_setr_epi32(0, 4, 1, 5, 2, 6, 3, 7);
+  const __m256i limit = _mm256_set1_epi16(static_cast<std::int16_t>(100 * level + 50));
+  int x = 0;
+  for (; x + 32 <= n; x += 32) {
+    // Packing works within halves of the register: the order is restored at the end.
+    const __m256i s01 = _mm256_packus_epi32(Sums8(edge + 4 * x), Sums8(edge + 4 * x + 32));
+    const __m256i s23 = _mm256_packus_epi32(Sums8(edge + 4 * x + 64), Sums8(edge + 4 * x + 96));
+    const __m256i above01 = _mm256_cmpgt_epi16(s01, limit);
+    const __m256i above23 = _mm256_cmpgt_epi16(s23, limit);
+    _mm256_storeu_si256(reinterpret_cast<__m256i*>(cells + x),
+                        _mm256_permutevar8x32_epi32(_mm256_packs_epi16(above01, above23), order));
+    const __m256i at01 = _mm256_cmpeq_epi16(s01, limit);
+    const __m256i at23 = _mm256_cmpeq_epi16(s23, limit);
+    auto mask = static_cast<std::uint32_t>(
+        _mm256_movemask_epi8(_mm256_permutevar8x32_epi32(_mm256_packs_epi16(at01, at23), order)));
+    for (; mask != 0; mask &= mask - 1) CellOfHalf(edge, level, cells, x + __builtin_ctz(mask));
+  }
+  if (x < n && CellStretch(edge + 4 * x, n - x, level, cells + x, half))
+    for (int i = x; i < n; ++i)
+      if (half[i - x]) CellOfHalf(edge, level, cells, i);
+}
+
+// The table's pixels go past the caches: the result is far larger than they are, and streaming
+// stores spare reading each line of it before writing it. The band ends with a store fence.
+[[gnu::target("avx2")]] void Avx2Pixels(const std::uint8_t* level, int n,
+                                        const std::uint32_t* pixelOf, Pixel* out) {
   alignas(32) std::uint32_t pixels[kStretch];
-  LookUp(level, n, pixelOf, pixels);
-  auto* dst = reinterpret_cast<std::uint8_t*>(out + x0);
-  int i = 0;
-  for (; i < n && reinterpret_cast<std::uintptr_t>(dst + 4 * i) % 32 != 0; ++i)
-    std::memcpy(dst + 4 * i, pixels + i, 4);
-  for (; i + 8 <= n; i += 8)
-    _mm256_stream_si256(reinterpret_cast<__m256i*>(dst + 4 * i),
-                        _mm256_loadu_si256(reinterpret_cast<const __m256i*>(pixels + i)));
-  for (; i < n; ++i) std::memcpy(dst + 4 * i, pixels + i, 4);
+  for (int x0 = 0; x0 < n; x0 += kStretch) {
+    const int m = std::min(kStretch, n - x0);
+    for (int x = 0; x < m; ++x) pixels[x] = pixelOf[level[x0 + x]];
+    auto* dst = reinterpret_cast<std::uint8_t*>(out + x0);
+    int i = 0;
+    for (; i < m && reinterpret_cast<std::uintptr_t>(dst + 4 * i) % 32 != 0; ++i)
+      std::memcpy(dst + 4 * i, pixels + i, 4);
+    for (; i + 8 <= m; i += 8)
+      _mm256_stream_si256(reinterpret_cast<__m256i*>(dst + 4 * i),
+                          _mm256_loadu_si256(reinterpret_cast<const __m256i*>(pixels + i)));
+    for (; i < m; ++i) std::memcpy(dst + 4 * i, pixels + i, 4);
+  }
 }
 #endif
 
-using Stretch = void (*)(const std::uint8_t*, const std::uint8_t*, const std::uint8_t*, int, int,
-                         const std::uint32_t*, Pixel*);
+// A stretch of an interior row's gray values, or of its cells at a level.
+using LevelStretch = void (*)(const std::uint8_t*, const std::uint8_t*, const std::uint8_t*, int,
+                              int, int, std::uint8_t*);
+using PixelRow = void (*)(const std::uint8_t*, int, const std::uint32_t*, Pixel*);
 
-Stretch ChooseStretch() {
+LevelStretch ChooseLevels() {
 #if defined(__x86_64__) && defined(__GNUC__)
-  if (UseAvx2()) return Avx2Stretch;
+  if (UseAvx2()) return Avx2Levels;
 #endif
-  return PlainStretch;
+  return PlainLevels;
 }
 
-// Output row y (1 .. height - 2) from source rows y - 1, y and y + 1.
-void GrayEdgeRow(Stretch stretch, const TBitmap32& source, int y, const std::uint32_t* pixelOf,
-                 Pixel* out) {
+LevelStretch ChooseCells() {
+#if defined(__x86_64__) && defined(__GNUC__)
+  if (UseAvx2()) return Avx2Cells;
+#endif
+  return PlainCells;
+}
+
+PixelRow ChoosePixels() {
+#if defined(__x86_64__) && defined(__GNUC__)
+  if (UseAvx2()) return Avx2Pixels;
+#endif
+  return PlainPixels;
+}
+
+// Gray values (or cells) of edge row y from source rows y - 1, y and y + 1, a stretch at a
+// time; the border rows and columns repeat their inner neighbours, and so do their gray values.
+void EdgeRowLevels(LevelStretch stretch, const TBitmap32& source, int y, int level,
+                   std::uint8_t* out) {
   const int w = source.Width();
+  y = std::clamp(y, 1, source.Height() - 2);
   const auto* above = reinterpret_cast<const std::uint8_t*>(source.ScanLine(y - 1));
   const auto* row = reinterpret_cast<const std::uint8_t*>(source.ScanLine(y));
   const auto* below = reinterpret_cast<const std::uint8_t*>(source.ScanLine(y + 1));
   for (int x0 = 1; x0 < w - 1; x0 += kStretch)
-    stretch(above, row, below, x0, std::min(kStretch, w - 1 - x0), pixelOf, out);
-  // The side pixels repeat their inner neighbours.
+    stretch(above, row, below, x0, std::min(kStretch, w - 1 - x0), level, out + x0);
   out[0] = out[1];
   out[w - 1] = out[w - 2];
 }
 
 }  // namespace
+
+void GrayEdgeCells(const TBitmap32& source, int y, int level, std::uint8_t* cells) {
+  // Gray values are bytes: none is above 255, all are above -1.
+  EdgeRowLevels(ChooseCells(), source, y, std::clamp(level, -1, 255), cells);
+}
 
 TBitmap32 GrayEdgeLevels(const TBitmap32& source, const std::array<std::uint8_t, 256>& levels) {
   const int w = source.Width();
@@ -216,21 +306,20 @@ TBitmap32 GrayEdgeLevels(const TBitmap32& source, const std::array<std::uint8_t,
     }
     return edges;
   }
-  const Stretch stretch = ChooseStretch();
+  const LevelStretch stretch = ChooseLevels();
+  const PixelRow pixels = ChoosePixels();
   std::uint32_t pixelOf[256];
   for (int v = 0; v < 256; ++v)
     pixelOf[v] = 0xFF000000u | 0x010101u * levels[static_cast<std::size_t>(v)];
 
   TBitmap32 out = TBitmap32::ForOverwrite(w, h);
-  const std::size_t rowBytes = static_cast<std::size_t>(w) * sizeof(Pixel);
-  ParallelRows(1, h - 1, static_cast<std::size_t>(w) * 12, [&](int y0, int y1) {
-    for (int y = y0; y < y1; ++y) GrayEdgeRow(stretch, source, y, pixelOf, out.ScanLine(y));
-    // The top and bottom rows repeat their inner neighbours.
-    if (y0 == 1) std::memcpy(out.ScanLine(0), out.ScanLine(1), rowBytes);
-    if (y1 == h - 1) std::memcpy(out.ScanLine(h - 1), out.ScanLine(h - 2), rowBytes);
-#if defined(__x86_64__)
-    _mm_sfence();
-#endif
+  ParallelRows(0, h, static_cast<std::size_t>(w) * 12, [&](int y0, int y1) {
+    std::vector<std::uint8_t> level(static_cast<std::size_t>(w));
+    for (int y = y0; y < y1; ++y) {
+      EdgeRowLevels(stretch, source, y, 0, level.data());
+      pixels(level.data(), w, pixelOf, out.ScanLine(y));
+    }
+    EndStreamedRows();
   });
   return out;
 }

@@ -10,8 +10,9 @@ namespace quillane {
 // This effect's own gray value: Round(0.299 R + 0.587 G + 0.11 B) in extended precision. The
 // weights sum to 0.996, so white is 254.
 std::uint8_t InkGrayValue(int r, int g, int b);
-// InkGrayValue of count pixels, one byte each, the fast way.
-void InkGrayLevels(const Pixel* in, std::uint8_t* out, int count);
+// cells[x] = 0xFF (paper) where InkGrayValue of in[x] is above threshold, else 0 (ink), for the
+// first count pixels: in integers, many pixels at a time.
+void InkThresholdCells(const Pixel* in, int count, int threshold, std::uint8_t* cells);
 
 // Every pixel whose InkGrayValue is above threshold becomes paper (255, 255, 255, 255), every
 // other pixel ink (0, 0, 0, 255).

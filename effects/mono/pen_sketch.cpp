@@ -5,8 +5,10 @@
 
 #include "effects/registry.h"
 #include "imaging/edge_map.h"
+#include "imaging/ink_rows.h"
 #include "imaging/numeric.h"
 #include "imaging/parallel.h"
+#include "imaging/row_pass.h"
 #include "imaging/tone.h"
 
 namespace quillane {
@@ -26,9 +28,23 @@ void two_Value1Click(TBitmap32& bitmap, int level) {
 }
 
 TBitmap32 PenSketch(const TBitmap32& source, int pressure) {
-  TBitmap32 drawing = source;
-  picsobel(drawing);
-  two_Value1Click(drawing, pressure);
+  const int w = source.Width(), h = source.Height();
+  if (w < 3 || h < 3) {
+    // No interior pixel: the border rules alone, the plain way.
+    TBitmap32 drawing = source;
+    picsobel(drawing);
+    two_Value1Click(drawing, pressure);
+    return drawing;
+  }
+  TBitmap32 drawing = ScratchPicture(w, h);
+  ParallelRows(0, h, static_cast<std::size_t>(w) * 12, [&](int y0, int y1) {
+    std::vector<std::uint8_t> cells(static_cast<std::size_t>(w));
+    for (int y = y0; y < y1; ++y) {
+      GrayEdgeCells(source, y, pressure, cells.data());
+      InkPixels(cells.data(), w, drawing.ScanLine(y));
+    }
+    EndStreamedRows();
+  });
   return drawing;
 }
 

@@ -2,17 +2,16 @@
 #pragma once
 
 #include "imaging/bitmap32.h"
+#include "imaging/ink_rows.h"
 
 namespace quillane {
-
-inline constexpr Pixel kInk{0, 0, 0, 255};
-inline constexpr Pixel kPaper{255, 255, 255, 255};
 
 // Every pixel whose gray value (GrayValue) is above level becomes paper, every other pixel
 // ink; alpha 255 either way. A gray value equal to level is ink.
 void two_Value1Click(TBitmap32& bitmap, int level);
 
-// The edge map of a copy of source (picsobel), thresholded at pressure (0..255).
+// The edge map of a copy of source (picsobel), thresholded at pressure (0..255); made row by
+// row from the gray values of the edge map, without the edge map as a picture.
 TBitmap32 PenSketch(const TBitmap32& source, int pressure);
 
 // The pen sketch the plain way, pixel by pixel through GrayValue; the oracle that PenSketch's

@@ -3,15 +3,15 @@
 
 #include <algorithm>
 #include <stdexcept>
-#include <thread>
-#include <utility>
 #include <vector>
 
 #include "effects/mono/pen_sketch.h"
 #include "effects/registry.h"
 #include "imaging/edge_map.h"
+#include "imaging/ink_rows.h"
 #include "imaging/parallel.h"
-#include "imaging/tone.h"
+#include "imaging/row_pass.h"
+#include "imaging/vector_dispatch.h"
 
 namespace quillane {
 namespace {
@@ -38,16 +38,11 @@ bool IsInk(const Pixel& p) {
   return p.b == 0 && p.g == 0 && p.r == 0;
 }
 
-// Rows of a thresholded picture are kept as one byte per pixel, 0 for ink and 0xFF for paper,
-// so that a pass over a row is an AND of three shifted rows.
-void ThresholdRow(const Pixel* in, std::uint8_t* out, int w, int pressure) {
-  GrayLevels(in, out, w);
-  for (int x = 0; x < w; ++x) out[x] = out[x] > pressure ? 0xFF : 0;
-}
-
-// One dilation pass over interior row y from the rows above, at and below it before the pass.
-void DilateRow(const std::uint8_t* const rows[3], std::uint8_t* __restrict out, int w,
-               const Offsets& n) {
+// One dilation pass over an interior row, from the rows above, at and below it before the
+// pass (ink 0, paper 0xFF: ink spreads by AND). Compiled for any x86-64 and for AVX2.
+[[gnu::always_inline]] inline void DilateLoop(const std::uint8_t* const rows[3],
+                                              std::uint8_t* __restrict out, int w,
+                                              const Offsets& n) {
   const std::uint8_t* __restrict self = rows[1];
   const std::uint8_t* __restrict first = rows[1 + n.dy1];
   const std::uint8_t* __restrict second = rows[1 + n.dy2];
@@ -56,12 +51,32 @@ void DilateRow(const std::uint8_t* const rows[3], std::uint8_t* __restrict out, 
   out[w - 1] = self[w - 1];
 }
 
+void PlainDilate(const std::uint8_t* const rows[3], std::uint8_t* out, int w, const Offsets& n) {
+  DilateLoop(rows, out, w, n);
+}
+
+#if defined(__x86_64__) && defined(__GNUC__)
+[[gnu::target("avx2")]] void Avx2Dilate(const std::uint8_t* const rows[3], std::uint8_t* out, int w,
+                                        const Offsets& n) {
+  DilateLoop(rows, out, w, n);
+}
+#endif
+
+using Dilate = void (*)(const std::uint8_t* const[3], std::uint8_t*, int, const Offsets&);
+
+Dilate ChooseDilate() {
+#if defined(__x86_64__) && defined(__GNUC__)
+  if (UseAvx2()) return Avx2Dilate;
+#endif
+  return PlainDilate;
+}
+
 // All passes at once, row by row: pass k of row y needs only pass k - 1 of rows y - 1 to y + 1,
-// so each pass keeps its last three rows and the picture is read and written once, whatever
-// the scope. Output rows y0 to y1 - 1 replace the edge map in drawing; the thresholded rows
-// beyond them that the passes reach come from halo (rows lo to y0 - 1, then y1 to hi).
-void HatchBand(TBitmap32& drawing, int y0, int y1, int pressure, int scope, const Offsets& n,
-               const std::vector<std::uint8_t>& halo) {
+// so each pass keeps its last three rows, and the edge map's gray values, the thresholded rows
+// and every pass stay in cache; the source is read and the drawing written once, whatever the
+// scope. A band writes rows y0 to y1 - 1 and thresholds the scope rows beyond them itself.
+void HatchBand(const TBitmap32& source, TBitmap32& drawing, int y0, int y1, int pressure, int scope,
+               const Offsets& n, Dilate dilate) {
   const int w = drawing.Width(), h = drawing.Height();
   const auto lo = [&](int k) { return std::max(0, y0 - (scope - k)); };
   const auto hi = [&](int k) { return std::min(h - 1, y1 - 1 + (scope - k)); };
@@ -73,12 +88,7 @@ void HatchBand(TBitmap32& drawing, int y0, int y1, int pressure, int scope, cons
   };
   for (int t = lo(0); t <= hi(0) + scope; ++t) {
     if (t <= hi(0)) {
-      if (t >= y0 && t < y1) {
-        ThresholdRow(drawing.ScanLine(t), slot(0, t), w, pressure);
-      } else {
-        const int index = t < y0 ? t - lo(0) : y0 - lo(0) + t - y1;
-        std::copy_n(halo.data() + static_cast<std::size_t>(index) * width, width, slot(0, t));
-      }
+      GrayEdgeCells(source, t, pressure, slot(0, t));
     }
     for (int k = 1; k <= scope; ++k) {
       const int r = t - k;
@@ -88,16 +98,13 @@ void HatchBand(TBitmap32& drawing, int y0, int y1, int pressure, int scope, cons
       } else {
         const std::uint8_t* const rows[3] = {slot(k - 1, r - 1), slot(k - 1, r),
                                              slot(k - 1, r + 1)};
-        DilateRow(rows, slot(k, r), w, n);
+        dilate(rows, slot(k, r), w, n);
       }
     }
     const int r = t - scope;
-    if (r >= y0 && r < y1) {
-      Pixel* out = drawing.ScanLine(r);
-      const std::uint8_t* cells = slot(scope, r);
-      for (int x = 0; x < w; ++x) out[x] = cells[x] != 0 ? kPaper : kInk;
-    }
+    if (r >= y0 && r < y1) InkPixels(slot(scope, r), w, drawing.ScanLine(r));
   }
+  EndStreamedRows();
 }
 
 }  // namespace
@@ -119,37 +126,13 @@ void BitmapDilate(TBitmap32& bitmap, HatchDirection direction) {
 
 TBitmap32 Vuzorar(const TBitmap32& source, int pressure, int scope, HatchDirection direction) {
   const Offsets n = NeighboursOf(direction);
-  TBitmap32 drawing = source;
-  picsobel(drawing);
-  const int w = drawing.Width(), h = drawing.Height();
-  if (h < 3 || w < 3 || scope < 1) {
-    two_Value1Click(drawing, pressure);
-    return drawing;
-  }
-  // Bands rewrite their rows in place, so the thresholded rows each band reads beyond its own
-  // are taken before any band starts.
-  const int bands =
-      std::min(h, static_cast<int>(std::max(1u, std::thread::hardware_concurrency())));
-  const auto bandStart = [&](int i) {
-    return static_cast<int>(static_cast<long long>(h) * i / bands);
-  };
-  const auto width = static_cast<std::size_t>(w);
-  std::vector<std::vector<std::uint8_t>> halos(static_cast<std::size_t>(bands));
-  for (int i = 0; i < bands; ++i) {
-    const int y0 = bandStart(i), y1 = bandStart(i + 1);
-    std::vector<std::uint8_t>& halo = halos[static_cast<std::size_t>(i)];
-    const auto keep = [&](int y) {
-      halo.resize(halo.size() + width);
-      ThresholdRow(drawing.ScanLine(y), halo.data() + halo.size() - width, w, pressure);
-    };
-    for (int y = std::max(0, y0 - scope); y < y0; ++y) keep(y);
-    for (int y = y1; y < std::min(h, y1 + scope); ++y) keep(y);
-  }
-  ParallelRows(0, bands, width * static_cast<std::size_t>(h / bands + 1) * 4, [&](int b0, int b1) {
-    for (int i = b0; i < b1; ++i)
-      HatchBand(drawing, bandStart(i), bandStart(i + 1), pressure, scope, n,
-                halos[static_cast<std::size_t>(i)]);
-  });
+  const int w = source.Width(), h = source.Height();
+  if (h < 3 || w < 3 || scope < 1) return PenSketch(source, pressure);
+  TBitmap32 drawing = ScratchPicture(w, h);
+  const Dilate dilate = ChooseDilate();
+  ParallelRows(
+      0, h, static_cast<std::size_t>(w) * static_cast<std::size_t>(12 + scope),
+      [&](int y0, int y1) { HatchBand(source, drawing, y0, y1, pressure, scope, n, dilate); });
   return drawing;
 }
 

@@ -1,0 +1,114 @@
+// The row-by-row pen sketch, Vuzorar and pen and ink against their plain steps, on sizes that
+// break vector loops and bands, with and without the AVX2 variants.
+#include <gtest/gtest.h>
+
+#include <random>
+#include <vector>
+
+#include "effects/mono/pen_and_ink.h"
+#include "effects/mono/pen_sketch.h"
+#include "effects/mono/vuzorar.h"
+#include "imaging/edge_map.h"
+#include "imaging/numeric.h"
+#include "imaging/parallel.h"
+#include "imaging/vector_dispatch.h"
+#include "tests/imaging/random_picture.h"
+
+namespace quillane {
+namespace {
+
+class Variant {
+ public:
+  Variant(RowSplit split, bool avx2) {
+    SetRowSplit(split);
+    SetAvx2Allowed(avx2);
+  }
+  ~Variant() {
+    SetRowSplit({});
+    SetAvx2Allowed(true);
+  }
+};
+
+// Blotches of a few flat colours with a little grain: edge maps with strokes, flat paper and
+// mid-range values, and photographs with dark areas to outline.
+TBitmap32 Blotches(int w, int h, unsigned seed) {
+  std::mt19937 rng(seed);
+  TBitmap32 b(w, h);
+  for (int y = 0; y < h; ++y)
+    for (int x = 0; x < w; ++x) {
+      const int patch = (x / 5 + y / 4 + static_cast<int>(seed)) % 3;
+      const auto v = [&](int base) {
+        return static_cast<std::uint8_t>(ClampByte(base * patch + static_cast<int>(rng() % 5)));
+      };
+      b.At(x, y) = Pixel{v(60), v(90), v(110), static_cast<std::uint8_t>(rng())};
+    }
+  return b;
+}
+
+// Thresholds at a gray value the picture has, so that the "equal is ink" rule is met.
+int EdgeGrayAtCentre(const TBitmap32& in) {
+  TBitmap32 edges = in;
+  picsobel(edges);
+  const Pixel p = edges.At(in.Width() / 2, in.Height() / 2);
+  return GrayValue(p.r, p.g, p.b);
+}
+
+TEST(LineArtFastPath, EqualsThePlainStepsAtAwkwardSizes) {
+  const std::pair<int, int> sizes[] = {{1, 1},  {1, 6},    {6, 1},    {2, 5},  {5, 2},
+                                       {3, 3},  {4, 3},    {3, 9},    {33, 4}, {35, 3},
+                                       {66, 7}, {101, 13}, {1027, 4}, {40, 23}};
+  for (const auto& [split, avx2] : {std::pair{RowSplit{1, kParallelThreshold}, true},
+                                    {RowSplit{5, 0}, true},
+                                    {RowSplit{3, 0}, false}}) {
+    const Variant variant(split, avx2);
+    unsigned seed = 0;
+    for (const auto& [w, h] : sizes)
+      for (const TBitmap32& in : {Blotches(w, h, ++seed), RandomPicture(w, h, ++seed, true)}) {
+        SCOPED_TRACE(::testing::Message() << w << "x" << h << " threads " << split.threads
+                                          << " avx2 " << avx2 << " seed " << seed);
+        const int pressure = EdgeGrayAtCentre(in);
+        ASSERT_EQ(PenSketch(in, pressure), PenSketchReference(in, pressure));
+        for (int d = 1; d <= 4; ++d) {
+          const int scope = 1 + static_cast<int>(seed + 3 * static_cast<unsigned>(d)) % 10;
+          const auto direction = static_cast<HatchDirection>(d);
+          ASSERT_EQ(Vuzorar(in, pressure, scope, direction),
+                    VuzorarReference(in, pressure, scope, direction))
+              << "direction " << d << " scope " << scope;
+        }
+        const Pixel centre = in.At(w / 2, h / 2);
+        const int threshold = InkGrayValue(centre.r, centre.g, centre.b);
+        for (bool colour : {false, true})
+          ASSERT_EQ(Pen_and_Ink(in, threshold, colour), PenAndInkReference(in, threshold, colour))
+              << "colour " << colour;
+      }
+  }
+}
+
+// The integer threshold can only differ from the extended gray next to an exact half, where
+// the extended sum's own error might tip it: every such colour, the halves included, in one
+// row long enough for the vector loop, at every threshold.
+TEST(LineArtFastPath, InkThresholdIsTheExtendedGrayNextToEveryHalf) {
+  std::vector<Pixel> row;
+  for (int r = 0; r < 256; ++r)
+    for (int g = 0; g < 256; ++g)
+      for (int b = 0; b < 256; ++b) {
+        const int rest = (299 * r + 587 * g + 110 * b) % 1000;
+        if (rest >= 499 && rest <= 501)
+          row.push_back(Pixel{static_cast<std::uint8_t>(b), static_cast<std::uint8_t>(g),
+                              static_cast<std::uint8_t>(r), static_cast<std::uint8_t>(r ^ b)});
+      }
+  std::vector<std::uint8_t> gray(row.size()), cells(row.size());
+  for (std::size_t i = 0; i < row.size(); ++i) gray[i] = InkGrayValue(row[i].r, row[i].g, row[i].b);
+  for (bool avx2 : {true, false}) {
+    const Variant variant({}, avx2);
+    for (int t = 0; t < 256; ++t) {
+      InkThresholdCells(row.data(), static_cast<int>(row.size()), t, cells.data());
+      for (std::size_t i = 0; i < row.size(); ++i)
+        ASSERT_EQ(cells[i], gray[i] > t ? 0xFF : 0)
+            << "threshold " << t << " avx2 " << avx2 << " pixel " << i;
+    }
+  }
+}
+
+}  // namespace
+}  // namespace quillane
