@@ -41,37 +41,58 @@ void PlainStripeRow(const Pixel* in, Pixel* out, int n, const std::uint32_t* str
 }
 
 #if defined(__x86_64__) && defined(__GNUC__)
+struct TintVectors {
+  __m256i add, sub, clear, set;
+};
+
+// Pixels 0, stride, .., 7 stride of in tinted; with alphaOf, alpha from alphaOf[0 .. 7].
+[[gnu::target("avx2"), gnu::always_inline]] inline __m256i Tint8(const Pixel* in, int stride,
+                                                                 const Pixel* alphaOf,
+                                                                 const TintVectors& t) {
+  __m256i v;
+  if (stride == 1) {
+    v = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in));
+  } else {
+    // The even pixels of 16: 0 2 8 10 | 4 6 12 14 from the shuffle, then put in order.
+    const float* p = reinterpret_cast<const float*>(in);
+    const __m256 even = _mm256_shuffle_ps(_mm256_loadu_ps(p), _mm256_loadu_ps(p + 8), 0x88);
+    v = _mm256_permute4x64_epi64(_mm256_castps_si256(even), 0xD8);
+  }
+  v = _mm256_subs_epu8(_mm256_adds_epu8(v, t.add), t.sub);
+  v = _mm256_or_si256(_mm256_andnot_si256(t.clear, v), t.set);
+  if (alphaOf != nullptr)
+    v = _mm256_or_si256(
+        v, _mm256_and_si256(_mm256_loadu_si256(reinterpret_cast<const __m256i*>(alphaOf)),
+                            _mm256_set1_epi32(static_cast<int>(0xFF000000u))));
+  return v;
+}
+
 [[gnu::target("avx2")]] void Avx2TintRow(const Pixel* in, int stride, const Pixel* alphaOf,
                                          Pixel* out, int n, const ChannelTint& tint) {
   const std::uint32_t clearWord = tint.clear | (alphaOf != nullptr ? 0xFF000000u : 0u);
-  const __m256i add = _mm256_set1_epi32(static_cast<int>(tint.add));
-  const __m256i sub = _mm256_set1_epi32(static_cast<int>(tint.sub));
-  const __m256i clear = _mm256_set1_epi32(static_cast<int>(clearWord));
-  const __m256i set = _mm256_set1_epi32(static_cast<int>(tint.set));
-  const __m256i alpha = _mm256_set1_epi32(static_cast<int>(0xFF000000u));
+  const TintVectors t{_mm256_set1_epi32(static_cast<int>(tint.add)),
+                      _mm256_set1_epi32(static_cast<int>(tint.sub)),
+                      _mm256_set1_epi32(static_cast<int>(clearWord)),
+                      _mm256_set1_epi32(static_cast<int>(tint.set))};
   // The pairs of 16 pixels read with stride 2 end one pixel past the last one used.
   const int room = stride == 1 ? 8 : 9;
   int x = 0;
   for (; x + room <= n; x += 8) {
-    __m256i v;
-    if (stride == 1) {
-      v = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + x));
-    } else {
-      // The even pixels of 16: 0 2 8 10 | 4 6 12 14 from the shuffle, then put in order.
-      const float* p = reinterpret_cast<const float*>(in + 2 * x);
-      const __m256 even = _mm256_shuffle_ps(_mm256_loadu_ps(p), _mm256_loadu_ps(p + 8), 0x88);
-      v = _mm256_permute4x64_epi64(_mm256_castps_si256(even), 0xD8);
-    }
-    v = _mm256_subs_epu8(_mm256_adds_epu8(v, add), sub);
-    v = _mm256_or_si256(_mm256_andnot_si256(clear, v), set);
-    if (alphaOf != nullptr)
-      v = _mm256_or_si256(
-          v, _mm256_and_si256(_mm256_loadu_si256(reinterpret_cast<const __m256i*>(alphaOf + x)),
-                              alpha));
+    const __m256i v = Tint8(in + stride * x, stride, alphaOf != nullptr ? alphaOf + x : nullptr, t);
     _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + x), v);
   }
-  PlainTintRow(in + static_cast<std::ptrdiff_t>(stride) * x, stride,
-               alphaOf != nullptr ? alphaOf + x : nullptr, out + x, n - x, tint);
+  // The last pixels (runs between zone borders are often short) through copies of them.
+  const int rest = n - x;
+  if (rest == 0) return;
+  Pixel source[16] = {}, alphas[8] = {};
+  alignas(32) Pixel result[8];
+  std::memcpy(source, in + stride * x,
+              sizeof(Pixel) * static_cast<std::size_t>(stride * (rest - 1) + 1));
+  if (alphaOf != nullptr)
+    std::memcpy(alphas, alphaOf + x, sizeof(Pixel) * static_cast<std::size_t>(rest));
+  _mm256_store_si256(reinterpret_cast<__m256i*>(result),
+                     Tint8(source, stride, alphaOf != nullptr ? alphas : nullptr, t));
+  std::memcpy(out + x, result, sizeof(Pixel) * static_cast<std::size_t>(rest));
 }
 
 // 16-bit lanes of B, G, R, A: (t keep + colour) div 255, as (v * 0x8081) >> 23, which is exact

@@ -215,8 +215,8 @@ TBitmap32 Panel3x3Reference(const TBitmap32& source) {
   return out;
 }
 
-// The third-size copy is not made: each row picks its pixels from the source row it comes
-// from, as ZoomInandOut would, into a buffer that the three tiles of the row are tinted from.
+// The third-size copy is not made: each of its rows is picked from the source row it comes
+// from, as ZoomInandOut would, into a buffer that the nine tiles' rows are tinted from.
 TBitmap32 Panel3x3(const TBitmap32& source) {
   const int width = source.Width(), height = source.Height();
   // The size exactly as ZoomInandOut computes it.
@@ -235,16 +235,18 @@ TBitmap32 Panel3x3(const TBitmap32& source) {
       tiles[r][c].clear |= 0xFF000000u;
     }
   TBitmap32 out = ScratchPicture(3 * w, 3 * h);
-  ParallelRows(0, 3 * h, 3 * static_cast<std::size_t>(w), [&](int y0, int y1) {
+  // Each row of the small copy makes one row in each row of tiles.
+  ParallelRows(0, h, 9 * static_cast<std::size_t>(w), [&](int y0, int y1) {
     std::vector<Pixel> small(static_cast<std::size_t>(w));
     for (int y = y0; y < y1; ++y) {
       const Pixel* in =
-          source.ScanLine(static_cast<int>(static_cast<std::int64_t>(y % h) * height / h));
+          source.ScanLine(static_cast<int>(static_cast<std::int64_t>(y) * height / h));
       for (int x = 0; x < w; ++x)
         small[static_cast<std::size_t>(x)] = in[column[static_cast<std::size_t>(x)]];
-      Pixel* row = out.ScanLine(y);
-      for (int c = 0; c < 3; ++c)
-        TintRow(small.data(), 1, nullptr, row + c * w, w, tiles[y / h][c]);
+      for (int r = 0; r < 3; ++r) {
+        Pixel* row = out.ScanLine(r * h + y);
+        for (int c = 0; c < 3; ++c) TintRow(small.data(), 1, nullptr, row + c * w, w, tiles[r][c]);
+      }
     }
   });
   return out;
