@@ -1,5 +1,6 @@
-// The colour row kernels against their plain forms, with and without AVX2, at every alignment
-// of the result and lengths around the vector step.
+// The gray and tint row kernels against their plain forms, with and without AVX2, at every
+// alignment of the result and lengths around the vector step. (The stripe kernel is compared
+// through stria with its plain form in the effects' tests.)
 #include "imaging/colour_rows.h"
 
 #include <gtest/gtest.h>
@@ -19,7 +20,7 @@ struct Avx2Allowed {
   ~Avx2Allowed() { SetAvx2Allowed(true); }
 };
 
-// Alpha 0, 255 or anything, so that every case of the stripe shows up.
+// Alpha 0, 255 or anything.
 std::vector<Pixel> Pixels(int n, unsigned seed) {
   std::mt19937 rng(seed);
   std::vector<Pixel> p(static_cast<std::size_t>(n));
@@ -90,36 +91,6 @@ TEST(TintRow, EqualsTintedPixelByPixel) {
                     << "x " << x << " n " << n << " stride " << stride << " avx2 " << avx2;
               }
             }
-  }
-}
-
-TEST(TintRow, ChannelsStopAtTheirLimits) {
-  const ChannelTint tint{.add = 0x00000064, .sub = 0x00640000};
-  EXPECT_EQ(Tinted(Pixel{200, 7, 50, 9}, tint), (Pixel{255, 7, 0, 9}));
-  EXPECT_EQ(Tinted(Pixel{100, 7, 150, 9}, tint), (Pixel{200, 7, 50, 9}));
-}
-
-TEST(StripeRow, EqualsStripeOverAndGapsPixelByPixel) {
-  const std::vector<Pixel> in = Pixels(60, 4);
-  std::vector<std::uint32_t> stripe(60);
-  std::mt19937 rng(5);
-  for (std::uint32_t& s : stripe) s = rng() % 2 ? ~0u : 0u;
-  for (const bool avx2 : {true, false}) {
-    const Avx2Allowed allowed(avx2);
-    for (const Pixel o : {Pixel{0, 0, 0, 128}, Pixel{255, 128, 0, 255}, Pixel{9, 200, 77, 1}})
-      for (int offset = 0; offset < 8; ++offset)
-        for (int n = 0; n <= 40; ++n) {
-          std::vector<Pixel> out(48);
-          StripeRow(in.data(), out.data() + offset, n, stripe.data(), o);
-          for (int x = 0; x < n; ++x) {
-            const Pixel t = in[static_cast<std::size_t>(x)];
-            const Pixel want = stripe[static_cast<std::size_t>(x)] != 0 ? StripeOver(o, t)
-                               : t.a == 0                               ? Pixel{255, 255, 255, 0}
-                                                                        : t;
-            ASSERT_EQ(out[static_cast<std::size_t>(offset + x)], want)
-                << "x " << x << " n " << n << " avx2 " << avx2;
-          }
-        }
   }
 }
 
