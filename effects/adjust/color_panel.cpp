@@ -76,10 +76,10 @@ TBitmap32 ZonedReference(const TBitmap32& source, const Tint* tints, RowZones ro
   return out;
 }
 
-template <typename RowZones>
-TBitmap32 Zoned(const TBitmap32& source, const Tint* tints, RowZones rowZones) {
-  ChannelTint channelTints[9];
-  for (int i = 0; i < 9; ++i) channelTints[i] = ChannelTintOf(tints[i]);
+template <std::size_t kZones, typename RowZones>
+TBitmap32 Zoned(const TBitmap32& source, const Tint (&tints)[kZones], RowZones rowZones) {
+  ChannelTint channelTints[kZones];
+  for (std::size_t i = 0; i < kZones; ++i) channelTints[i] = ChannelTintOf(tints[i]);
   return MapRows(source, 1, [&](const Pixel* in, Pixel* row, int w, int y) {
     if (w == 0) return;
     if (y == 0) {
