@@ -1,31 +1,44 @@
 // Colour filter: a gray picture seen through a strong colour filter.
 #include "effects/adjust/color_filter.h"
 
+#include <bit>
+
 #include "effects/registry.h"
+#include "imaging/gray_row.h"
 #include "imaging/parallel.h"
+#include "imaging/row_pass.h"
 #include "imaging/tone.h"
 
 namespace quillane {
+namespace {
 
-TBitmap32 filter(const TBitmap32& base, ColorFilterKind kind) {
+// The channels a filter raises to 255, as a 0xAARRGGBB word.
+std::uint32_t Raised(ColorFilterKind kind) {
   const int k = static_cast<int>(kind);
   const bool red = k == 1 || k == 4 || k == 6;
   const bool green = k == 2 || k == 4 || k == 5;
   const bool blue = k == 3 || k == 5 || k == 6;
+  return (red ? 0x00FF0000u : 0u) | (green ? 0x0000FF00u : 0u) | (blue ? 0x000000FFu : 0u);
+}
+
+}  // namespace
+
+TBitmap32 filter(const TBitmap32& base, ColorFilterKind kind) {
+  const std::uint32_t set = Raised(kind);
+  return MapRows(base, 1,
+                 [set](const Pixel* in, Pixel* out, int w, int) { GrayRowInto(in, out, w, set); });
+}
+
+TBitmap32 FilterReference(const TBitmap32& base, ColorFilterKind kind) {
+  const std::uint32_t set = Raised(kind);
   TBitmap32 out = base;
   const int w = out.Width();
-  ParallelRows(0, out.Height(), static_cast<std::size_t>(w), [&](int y0, int y1) {
-    for (int y = y0; y < y1; ++y) {
-      Pixel* row = out.ScanLine(y);
-      ConvertRowToGray(row, w);
-      const std::uint8_t r = red ? 255 : 0, g = green ? 255 : 0, b = blue ? 255 : 0;
-      const int n = w;
-      for (int x = 0; x < n; ++x)
-        row[x] =
-            Pixel{static_cast<std::uint8_t>(row[x].b | b), static_cast<std::uint8_t>(row[x].g | g),
-                  static_cast<std::uint8_t>(row[x].r | r), 255};
-    }
-  });
+  for (int y = 0; y < out.Height(); ++y) {
+    Pixel* row = out.ScanLine(y);
+    ConvertRowToGray(row, w);
+    for (int x = 0; x < w; ++x)
+      row[x] = std::bit_cast<Pixel>(std::bit_cast<std::uint32_t>(row[x]) | set);
+  }
   return out;
 }
 

@@ -13,4 +13,7 @@ enum class ColorFilterKind { Red = 1, Green, Blue, Yellow, Cyan, Purple };
 // become 255: red; green; blue; red and green; green and blue; red and blue. Alpha 255.
 TBitmap32 filter(const TBitmap32& base, ColorFilterKind kind);
 
+// The same made the plain way, row by row in place on a copy: what filter must equal.
+TBitmap32 FilterReference(const TBitmap32& base, ColorFilterKind kind);
+
 }  // namespace quillane

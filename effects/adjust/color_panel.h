@@ -33,4 +33,8 @@ enum class PanelLayout {
 // Every layout but Panel3x3 keeps row 0 and column 0 of the source.
 TBitmap32 ColorPanel(const TBitmap32& source, PanelLayout layout);
 
+// The same made the plain way, pixel by pixel through the half- and third-size copies: what
+// ColorPanel must equal.
+TBitmap32 ColorPanelReference(const TBitmap32& source, PanelLayout layout);
+
 }  // namespace quillane

@@ -5,7 +5,7 @@
 #include <array>
 
 #include "effects/registry.h"
-#include "imaging/parallel.h"
+#include "imaging/row_pass.h"
 
 namespace quillane {
 namespace {
@@ -18,16 +18,10 @@ TBitmap32 Raised(const TBitmap32& picture, int red, int green, int blue) {
     for (int v = 0; v < 256; ++v)
       up[static_cast<std::size_t>(c)][static_cast<std::size_t>(v)] =
           static_cast<std::uint8_t>(std::min(255, v + raise[c]));
-  TBitmap32 out = picture;
-  const int w = out.Width();
-  ParallelRows(0, out.Height(), static_cast<std::size_t>(w), [&](int y0, int y1) {
-    for (int y = y0; y < y1; ++y) {
-      Pixel* row = out.ScanLine(y);
-      for (int x = 0; x < w; ++x)
-        row[x] = Pixel{up[0][row[x].b], up[1][row[x].g], up[2][row[x].r], 255};
-    }
+  // One pass from the picture's rows into the result's, not a copy changed in place.
+  return MapRows(picture, 1, [&up](const Pixel* in, Pixel* out, int w, int) {
+    for (int x = 0; x < w; ++x) out[x] = Pixel{up[0][in[x].b], up[1][in[x].g], up[2][in[x].r], 255};
   });
-  return out;
 }
 
 bool Names(int swatch, int channel) {  // channel 0 red, 1 green, 2 blue

@@ -2,12 +2,14 @@
 
 #include <algorithm>
 #include <array>
+#include <cstring>
 #include <vector>
 
 #include "effects/registry.h"
 #include "effects/surface/for_current.h"
+#include "imaging/colour_rows.h"
 #include "imaging/numeric.h"
-#include "imaging/parallel.h"
+#include "imaging/row_pass.h"
 
 namespace quillane {
 namespace {
@@ -48,40 +50,68 @@ OpaqueMix MixTables(Pixel o) {
   return mix;
 }
 
+Pixel StripeColour(std::uint32_t colour, int transparency) {
+  return PixelFromColorRef(colour, static_cast<std::uint8_t>(255 - ClampByte(transparency)));
+}
+
 }  // namespace
 
-TBitmap32 stria(const TBitmap32& base, int layerWidth, int layerHeight, StriaDirection direction,
-                int thickness, int space, int transparency, std::uint32_t colour) {
+TBitmap32 StriaReference(const TBitmap32& base, int layerWidth, int layerHeight,
+                         StriaDirection direction, int thickness, int space, int transparency,
+                         std::uint32_t colour) {
   TBitmap32 out = base;
   const int w = std::min(base.Width(), std::max(0, layerWidth));
   const int h = std::min(base.Height(), std::max(0, layerHeight));
   if (w == 0 || h == 0) return out;
   const int period = std::max(1, thickness + space);
-  const Pixel o =
-      PixelFromColorRef(colour, static_cast<std::uint8_t>(255 - ClampByte(transparency)));
+  const Pixel o = StripeColour(colour, transparency);
   const OpaqueMix mix = MixTables(o);
   std::vector<std::uint8_t> stripeColumn(static_cast<std::size_t>(w), 1);
   if (direction == StriaDirection::Vertical)
     for (int x = 0; x < w; ++x) stripeColumn[static_cast<std::size_t>(x)] = x % period < thickness;
-
-  ParallelRows(0, h, static_cast<std::size_t>(w), [&](int y0, int y1) {
-    for (int y = y0; y < y1; ++y) {
-      Pixel* row = out.ScanLine(y);
-      const bool stripeRow = direction == StriaDirection::Vertical || y % period < thickness;
-      for (int x = 0; x < w; ++x) {
-        Pixel& t = row[x];
-        if (stripeRow && stripeColumn[static_cast<std::size_t>(x)] && o.a != 0) {
-          if (t.a == 255)
-            t = Pixel{mix.b[t.b], mix.g[t.g], mix.r[t.r], 255};
-          else
-            CompositeOver(o, t);
-        } else if (t.a == 0) {
-          t = Pixel{255, 255, 255, 0};  // a transparent overlay pixel over a transparent one
-        }
+  for (int y = 0; y < h; ++y) {
+    Pixel* row = out.ScanLine(y);
+    const bool stripeRow = direction == StriaDirection::Vertical || y % period < thickness;
+    for (int x = 0; x < w; ++x) {
+      Pixel& t = row[x];
+      if (stripeRow && stripeColumn[static_cast<std::size_t>(x)] && o.a != 0) {
+        if (t.a == 255)
+          t = Pixel{mix.b[t.b], mix.g[t.g], mix.r[t.r], 255};
+        else
+          CompositeOver(o, t);
+      } else if (t.a == 0) {
+        t = Pixel{255, 255, 255, 0};  // a transparent overlay pixel over a transparent one
       }
     }
-  });
+  }
   return out;
+}
+
+// One pass from base into the result: each row of the layer through StripeRow with the mask of
+// its stripe columns (none on a gap row, or when the colour is fully transparent), the rest of
+// the row and the rows below the layer copied.
+TBitmap32 stria(const TBitmap32& base, int layerWidth, int layerHeight, StriaDirection direction,
+                int thickness, int space, int transparency, std::uint32_t colour) {
+  const int w = std::min(base.Width(), std::max(0, layerWidth));
+  const int h = std::min(base.Height(), std::max(0, layerHeight));
+  if (w == 0 || h == 0) return base;
+  const int period = std::max(1, thickness + space);
+  const Pixel o = StripeColour(colour, transparency);
+  std::vector<std::uint32_t> stripes(static_cast<std::size_t>(w), o.a != 0 ? ~0u : 0u);
+  if (direction == StriaDirection::Vertical && o.a != 0)
+    for (int x = 0; x < w; ++x)
+      stripes[static_cast<std::size_t>(x)] = x % period < thickness ? ~0u : 0u;
+  const std::vector<std::uint32_t> gaps(static_cast<std::size_t>(w), 0u);
+  return MapRows(base, 1, [&](const Pixel* in, Pixel* out, int width, int y) {
+    int x0 = 0;
+    if (y < h) {
+      const bool stripeRow = direction == StriaDirection::Vertical || y % period < thickness;
+      StripeRow(in, out, w, (stripeRow ? stripes : gaps).data(), o);
+      x0 = w;
+    }
+    if (width > x0)
+      std::memcpy(out + x0, in + x0, sizeof(Pixel) * static_cast<std::size_t>(width - x0));
+  });
 }
 
 const EffectSpec& StriaEffect() {

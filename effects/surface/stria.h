@@ -19,4 +19,10 @@ enum class StriaDirection { Vertical = 1, Horizontal = 2 };
 TBitmap32 stria(const TBitmap32& base, int layerWidth, int layerHeight, StriaDirection direction,
                 int thickness, int space, int transparency, std::uint32_t colour);
 
+// The same made the plain way, in place on a copy through tables of the colour: what stria must
+// equal.
+TBitmap32 StriaReference(const TBitmap32& base, int layerWidth, int layerHeight,
+                         StriaDirection direction, int thickness, int space, int transparency,
+                         std::uint32_t colour);
+
 }  // namespace quillane
