@@ -222,8 +222,7 @@ TEST_F(Export, HelpOpensTheReadmeAndShowsTheAboutBox) {
   auto* about = Main().findChild<TAboutus*>("TAboutus");
   ASSERT_NE(about, nullptr);
   EXPECT_TRUE(about->isVisible() && !about->isModal());
-  EXPECT_TRUE(
-      about->findChild<QPlainTextEdit*>("Memo1")->toPlainText().contains(QUILLANE_VERSION));
+  EXPECT_TRUE(about->findChild<QPlainTextEdit*>("Memo1")->toPlainText().contains(QUILLANE_VERSION));
   EXPECT_FALSE(about->findChild<QLabel*>("Image1")->pixmap().isNull());
   QApplication::setWindowIcon(QIcon());
 }
