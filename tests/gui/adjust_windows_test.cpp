@@ -36,7 +36,6 @@ TEST_F(AdjustWindows, EmbossAppliesOnButton2AndRecordsEachBatchPicture) {
   EXPECT_EQ(Text(kEmboss, "Label3"), "5");
   Press(kEmboss, "Button2");
   EXPECT_EQ(Working(), emboss(Source(), 100, 5));
-  EXPECT_EQ(Main().StatusText(), "Emboss");
   MakeInput({TestPicture(13, 9)});
   EXPECT_EQ(Convert(kEmboss), std::vector<std::string>{"a-Emboss.jpg"});
   EXPECT_TRUE(Main().BatchConvertOk().isVisible());
