@@ -32,6 +32,11 @@ TEST_F(BwWindows, OkDrawsRecordsAndSetsTheLineArtFlagWithTheSettingsShown) {
     EXPECT_TRUE(Main().LineArt());
     EXPECT_TRUE(Child<QToolButton>(tool, "Button2")->isEnabled());
   }
+  // Captions and steps as the effect table gives them, one of each kind of control.
+  EXPECT_EQ(Text(3, "Label2"), "Scope:");
+  EXPECT_EQ(Child<QRadioButton>(3, "RadioButton2")->text(), "\\\\\\");
+  EXPECT_EQ(Child<QCheckBox>(4, "CheckBox1")->text(), "Color Ink");
+  EXPECT_EQ(Child<QSlider>(3, "TrackBar1")->pageStep(), 10);
   // Vuzorar's direction goes back to rising on every showing; the other settings stay.
   Press(3, "RadioButton3");
   Slide(3, "TrackBar2", 5);

@@ -48,6 +48,12 @@ TEST_F(ColorWindows, KernelWindowsConvertTheCellsAsTypedAndRefuseWhatIsNoInteger
     const EffectSpec& spec = Open(tool);
     SCOPED_TRACE(spec.cliName);
     auto cell = [&](int i) { return Child<QLineEdit>(tool, ("Edit" + std::to_string(i)).c_str()); };
+    if (tool == 8) {  // the texts of the kernel windows, from the one that differs
+      EXPECT_EQ(Text(tool, "Label1"), "You can change the figures");
+      EXPECT_EQ(cell(1)->toolTip(), "Change the number to get different effect");
+      EXPECT_EQ(Child<QPushButton>(tool, "Button1")->toolTip(), "Convert with your setup");
+      EXPECT_EQ(Child<QPushButton>(tool, "Button3")->text(), "Default");
+    }
     const int steps = Steps();
     EffectParams::Values typed = spec.params[0].defaultList;
     typed[4] = 3;
