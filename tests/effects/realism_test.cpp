@@ -13,10 +13,6 @@ constexpr std::int64_t kMax = std::numeric_limits<std::int32_t>::max();
 constexpr std::int64_t kMin = std::numeric_limits<std::int32_t>::min();
 const Kernel kDefault{1, 2, 1, 0, 0, 0, -1, -1, -1};
 
-TBitmap32 Noise(int w, int h) {
-  return RandomPicture(w, h, 99);
-}
-
 TEST(Realism, SumsBeyondThirtyTwoBitsClamp) {
   TBitmap32 sparse(3, 3, Pixel{0, 0, 0, 255});
   sparse.At(0, 0) = Pixel{0, 1, 255, 255};
@@ -28,13 +24,13 @@ TEST(Realism, SumsBeyondThirtyTwoBitsClamp) {
 }
 
 TEST(Realism, SixteenBitRowSumsGiveTheReferenceBytes) {
-  const TBitmap32 noise = Noise(37, 11);
+  const TBitmap32 noise = RandomPicture(37, 11, 99);
   for (const Kernel& k : {kDefault, Kernel{}, Kernel{0, 0, 0, 0, 1}, Kernel{128},
                           Kernel{-50, 30, 0, 7, -9, 0, 0, 32}})
     EXPECT_EQ(realism(noise, k), ConvolveReference(noise, k, 1));
   EXPECT_EQ(Convolve(noise, kDefault, 3), ConvolveReference(noise, kDefault, 3));
   for (auto [w, h] : {std::pair{0, 0}, {1, 6}, {6, 1}, {2, 5}, {5, 2}})
-    EXPECT_EQ(realism(Noise(w, h), kDefault), Noise(w, h));
+    EXPECT_EQ(realism(RandomPicture(w, h, 99), kDefault), RandomPicture(w, h, 99));
 }
 
 }  // namespace

@@ -69,10 +69,6 @@ TEST(Stria, StripesStartAtTheFirstColumnOrRow) {
   const TBitmap32 white(7, 2, Gray(255));
   const TBitmap32 dark = stria(white, 7, 2, StriaDirection::Vertical, 1, 2, 128, 0);
   for (int x = 0; x < 7; ++x) EXPECT_EQ(dark.At(x, 1), Gray(x % 3 == 0 ? 128 : 255)) << x;
-  // Solid at transparency 0, nothing at 255.
-  EXPECT_EQ(stria(white, 7, 2, StriaDirection::Vertical, 1, 2, 0, 0x0080FF).At(3, 0),
-            (Pixel{0, 128, 255, 255}));
-  EXPECT_EQ(stria(white, 7, 2, StriaDirection::Vertical, 1, 2, 255, 0), white);
   // Thickness 100 and space 1 leave every 101st column.
   const TBitmap32 wide =
       stria(TBitmap32(203, 1, Gray(255)), 203, 1, StriaDirection::Vertical, 100, 1, 0, 0);

@@ -7,12 +7,8 @@
 namespace quillane {
 namespace {
 
-TBitmap32 Noise(int w, int h, unsigned seed) {
-  return RandomPicture(w, h, seed);
-}
-
 TEST(WaterColor, FastPassesGiveTheSelectionSortBytesAndKeepTheFrame) {
-  const TBitmap32 in = Noise(40, 9, 11);
+  const TBitmap32 in = RandomPicture(40, 9, 11);
   TBitmap32 median(40, 9);
   MedianPass(in, median);
   for (int y = 1; y < 8; ++y)
@@ -30,7 +26,7 @@ TEST(WaterColor, FastPassesGiveTheSelectionSortBytesAndKeepTheFrame) {
     for (int y = 0; y < 9; ++y) EXPECT_EQ(out.At(0, y), in.At(0, y));
   }
   for (auto [w, h] : {std::pair{0, 0}, {1, 6}, {6, 1}, {2, 5}, {5, 2}})
-    EXPECT_EQ(watercolor(Noise(w, h, 3), 3), Noise(w, h, 3));
+    EXPECT_EQ(watercolor(RandomPicture(w, h, 3), 3), RandomPicture(w, h, 3));
 }
 
 }  // namespace

@@ -36,7 +36,6 @@ TEST_F(AdjustWindows, EmbossAppliesOnButton2AndRecordsEachBatchPicture) {
   EXPECT_EQ(Text(kEmboss, "Label3"), "5");
   Press(kEmboss, "Button2");
   EXPECT_EQ(Working(), emboss(Source(), 100, 5));
-  EXPECT_EQ(Main().StatusText(), "Emboss");
   MakeInput({TestPicture(13, 9)});
   EXPECT_EQ(Convert(kEmboss), std::vector<std::string>{"a-Emboss.jpg"});
   EXPECT_TRUE(Main().BatchConvertOk().isVisible());
@@ -46,7 +45,6 @@ TEST_F(AdjustWindows, EmbossAppliesOnButton2AndRecordsEachBatchPicture) {
 
 TEST_F(AdjustWindows, HslAdjustShowsSignedNumbersAndStartsNeutralOnEveryShowing) {
   Open(kHsl);
-  EXPECT_EQ(ToolChild<QToolButton>(kHsl, "SpeedButton1"), nullptr);
   for (auto [position, shown] : {std::pair{0, "-100"}, {181, "1"}, {270, "50"}}) {
     Slide(kHsl, "TrackBar1", position);
     EXPECT_EQ(Text(kHsl, "Label4"), shown) << position;
@@ -96,13 +94,10 @@ TEST_F(AdjustWindows, StriaTakesItsColourFromTheDialogAndStartsFromTheSnapshot) 
 
 TEST_F(AdjustWindows, TextureTileClicksChooseAndOkStartsFromTheSnapshot) {
   Open(kTexture);
-  for (int n = 1; n <= kTextureTiles; ++n) {
-    EXPECT_EQ(Child(kTexture, qPrintable(QString("texture%1").arg(n)))->cursor().shape(),
-              n <= 4 ? Qt::PointingHandCursor : Qt::ArrowCursor);
+  for (int n = 1; n <= kTextureTiles; ++n)
     EXPECT_EQ(
         Child<QRadioButton>(kTexture, qPrintable(QString("RadioButton%1").arg(n)))->isChecked(),
         n == 4);
-  }
   Slide(kTexture, "TrackBar1", 80);
   ClickOn(Child(kTexture, "texture7"));
   EXPECT_TRUE(Child<QRadioButton>(kTexture, "RadioButton7")->isChecked());
@@ -143,7 +138,6 @@ TEST_F(AdjustWindows, SnapshotBatchesWorkOnEachSourceAndRefreshTheSnapshot) {
 
 TEST_F(AdjustWindows, ColorPanelAppliesALayoutWhenItBecomesSelected) {
   Open(kPanel);
-  EXPECT_EQ(ToolChild<QPushButton>(kPanel, "Button1"), nullptr);
   const std::tuple<const char*, PanelLayout, const char*> cases[] = {
       {"RadioButton5", PanelLayout::Pane3x3, "Color Pane"},
       {"RadioButton6", PanelLayout::Catercorner16, "Color Catercorner"},

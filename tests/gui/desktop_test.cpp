@@ -68,17 +68,6 @@ TEST_F(Desktop, StandardShortcutsRunTheirCommands) {
     EXPECT_TRUE(done());
   }
   EXPECT_EQ(MenuAction("Exit1")->shortcut(), QKeySequence(Qt::CTRL | Qt::Key_Q));  // shown
-}
-
-TEST_F(Desktop, MenusOpenWithTheirAltLetters) {
-  const std::pair<const char*, Qt::Key> cases[] = {
-      {"File1", Qt::Key_F},  {"Edit1", Qt::Key_E},        {"BW1", Qt::Key_B},
-      {"Color1", Qt::Key_C}, {"ColorAdjust1", Qt::Key_A}, {"Veins1", Qt::Key_V},
-      {"Help1", Qt::Key_H}};
-  for (const auto& [name, letter] : cases) {
-    const QString title = Main().menuBar()->findChild<QMenu*>(name)->title();
-    EXPECT_EQ(QKeySequence::mnemonic(title), QKeySequence(Qt::ALT | letter)) << name;
-  }
   // "B&W" shows its ampersand instead of underlining the W.
   EXPECT_TRUE(Main().menuBar()->findChild<QMenu*>("BW1")->title().contains("&&W"));
 }
