@@ -336,9 +336,12 @@ void WaterColorInto(const TBitmap32& source, int cycles, TBitmap32& out) {
   ParallelRows(1, h - 1, static_cast<std::size_t>(w) * 8 * static_cast<std::size_t>(passes),
                [&](int y0, int y1) {
                  std::vector<Pixel> rings(ringPixels);
+                 const auto tileStart = [&](int i) {
+                   return 1 + static_cast<int>(static_cast<long long>(w - 2) * i / tiles);
+                 };
                  for (int i = 0; i < tiles; ++i)
-                   PassesOnTile(kernels, source, passes, y0, y1, 1 + (w - 2) * i / tiles,
-                                1 + (w - 2) * (i + 1) / tiles, rings.data(), out);
+                   PassesOnTile(kernels, source, passes, y0, y1, tileStart(i), tileStart(i + 1),
+                                rings.data(), out);
                  // The frame keeps the source.
                  for (int y = y0; y < y1; ++y) {
                    out.ScanLine(y)[0] = source.ScanLine(y)[0];
