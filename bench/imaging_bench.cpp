@@ -204,9 +204,9 @@ void BM_MedianPass(benchmark::State& state) {
 QUILLANE_EFFECT_BENCHMARK(BM_MedianPass);
 
 void BM_WaterColor(benchmark::State& state) {
-  TBitmap32 out(kWidth, kHeight), scratch(kWidth, kHeight);
+  TBitmap32 out(kWidth, kHeight);
   for (auto _ : state) {
-    WaterColorInto(Photo(), 3, out, scratch);
+    WaterColorInto(Photo(), 3, out);
     benchmark::DoNotOptimize(out.Data());
   }
   SetBytes(state);

@@ -12,17 +12,20 @@ namespace quillane {
 // back unchanged.
 TBitmap32 watercolor(const TBitmap32& source, int cycles);
 
-// The same into out, with scratch as the second picture the passes need; both must already
-// have source's size (a caller that runs the effect again and again reuses them).
-void WaterColorInto(const TBitmap32& source, int cycles, TBitmap32& out, TBitmap32& scratch);
+// The same into out, which must already have source's size and be another picture. The passes
+// run fused over bands of rows and tiles of columns that stay in the cache, so no picture is
+// made in between.
+void WaterColorInto(const TBitmap32& source, int cycles, TBitmap32& out);
 
 // The interior of out becomes, per colour channel c of in:
 //   clamp(5 c(x, y) - c(x, y-1) - c(x-1, y) - c(x+1, y) - c(x, y+1)) to 0..255.
-// out must have in's size; its frame and alpha bytes are not written.
+// out must have in's size and be another picture; its frame is not written and the alpha of its
+// interior becomes in's.
 void SharpenPass(const TBitmap32& in, TBitmap32& out);
 
 // The interior of out becomes, per colour channel, the median of the nine values of in in the
-// 3 x 3 block around the pixel. out must have in's size; its frame and alpha are not written.
+// 3 x 3 block around the pixel. out must have in's size and be another picture; its frame is not
+// written and the alpha of its interior becomes in's.
 void MedianPass(const TBitmap32& in, TBitmap32& out);
 
 // The same effect as written out first: full copies per pass, nine values per channel gathered

@@ -1,0 +1,97 @@
+// Water colour and Brume on every path they can take (AVX2 or not, one band or many) against
+// their plain references, on pictures whose sizes leave odd remainders everywhere.
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <utility>
+
+#include "effects/paint/brume.h"
+#include "effects/paint/water_color.h"
+#include "imaging/parallel.h"
+#include "imaging/vector_dispatch.h"
+#include "tests/imaging/random_picture.h"
+
+namespace quillane {
+namespace {
+
+struct Path {
+  bool avx2;
+  RowSplit split;
+};
+// Many bands: up to 7 of them, whatever the picture's size.
+const Path kPaths[] = {{true, {}}, {false, {}}, {true, {7, 1}}, {false, {7, 1}}};
+
+class PaintFastPaths : public ::testing::Test {
+ protected:
+  void Use(const Path& path) {
+    SetAvx2Allowed(path.avx2);
+    SetRowSplit(path.split);
+  }
+  void TearDown() override { Use({true, {}}); }
+};
+
+const std::pair<int, int> kSizes[] = {{1, 1},  {1, 9},  {9, 1},  {3, 3},  {4, 3},   {11, 5},
+                                      {9, 13}, {17, 4}, {34, 6}, {45, 2}, {4101, 5}};
+
+TEST_F(PaintFastPaths, WaterColorGivesTheReferenceBytes) {
+  for (const Path& path : kPaths)
+    for (auto [w, h] : kSizes) {
+      Use(path);
+      const TBitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w * 31 + h));
+      for (int cycles : {1, 2, 5}) {
+        if (w > 100 && cycles == 5) continue;
+        ASSERT_EQ(watercolor(in, cycles), WaterColorReference(in, cycles))
+            << w << "x" << h << " cycles " << cycles << " avx2 " << path.avx2;
+      }
+    }
+}
+
+TEST_F(PaintFastPaths, EachPassGivesItsFormulaAndLeavesTheFrame) {
+  const Pixel untouched{1, 2, 3, 4};
+  for (const Path& path : kPaths)
+    for (int w = 3; w < 44; w += 5) {
+      Use(path);
+      // Random bytes, and the extremes that make the sharpening clamp both ways.
+      TBitmap32 in = RandomPicture(w, 4, static_cast<unsigned>(w));
+      for (int x = 0; x < w; x += 2) in.At(x, 1) = in.At(x, 2) = Pixel{0, 255, 0, 9};
+      TBitmap32 sharp(w, 4, untouched), median(w, 4, untouched);
+      SharpenPass(in, sharp);
+      MedianPass(in, median);
+      for (int y = 0; y < 4; ++y)
+        for (int x = 0; x < w; ++x) {
+          if (y == 0 || y == 3 || x == 0 || x == w - 1) {
+            ASSERT_EQ(sharp.At(x, y), untouched);
+            ASSERT_EQ(median.At(x, y), untouched);
+            continue;
+          }
+          ASSERT_EQ(sharp.At(x, y).a, in.At(x, y).a);
+          ASSERT_EQ(median.At(x, y).a, in.At(x, y).a);
+          for (std::uint8_t Pixel::*c : {&Pixel::r, &Pixel::g, &Pixel::b}) {
+            const auto at = [&](int dx, int dy) { return int{in.At(x + dx, y + dy).*c}; };
+            const int v = 5 * at(0, 0) - at(0, -1) - at(-1, 0) - at(1, 0) - at(0, 1);
+            ASSERT_EQ(sharp.At(x, y).*c, std::clamp(v, 0, 255)) << w << " " << x << "," << y;
+            int block[9];
+            for (int i = 0; i < 9; ++i) block[i] = at(i % 3 - 1, i / 3 - 1);
+            SelectionSort(block, 8);
+            ASSERT_EQ(median.At(x, y).*c, block[4]) << w << " " << x << "," << y;
+          }
+        }
+    }
+}
+
+TEST_F(PaintFastPaths, BrumeDrawsWhatThePlainLoopDraws) {
+  for (const Path& path : kPaths)
+    for (auto [w, h] : kSizes)
+      for (int scope : {1, 3, 10}) {
+        Use(path);
+        const TBitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w + h));
+        std::uint32_t fast = 0xDEADBEEF, plain = 0xDEADBEEF;
+        for (int run = 0; run < 2; ++run)  // the second run goes on from the first one's seed
+          ASSERT_EQ(Brume(in, scope, fast), BrumeReference(in, scope, plain))
+              << w << "x" << h << " scope " << scope << " avx2 " << path.avx2;
+        ASSERT_EQ(fast, plain);
+      }
+}
+
+}  // namespace
+}  // namespace quillane
