@@ -118,6 +118,12 @@ struct HslChange {
 // The tables that keep every component as it is.
 HslChange NoHslChange();
 
+// The new lightness that a per-pixel level (0..255, from a second picture) gives a colour's L:
+// at[level * 101 + L], each 0..100.
+struct LightnessByLevel {
+  std::array<std::uint8_t, 256 * 101 + 3> at{};  // vector reads take 4 bytes from any entry
+};
+
 // Applies a change row by row. Built once per picture (it holds tables of the change).
 class HslRowChanger {
  public:
@@ -129,10 +135,15 @@ class HslRowChanger {
   void Row(const Pixel* in, Pixel* out, int width,
            const std::int16_t* lightnessShift = nullptr) const;
 
+  // The same with L replaced by lightness.at[levels[x] * 101 + L] before the change.
+  void RowWithLevels(const Pixel* in, Pixel* out, int width, const std::uint8_t* levels,
+                     const LightnessByLevel& lightness) const;
+
  private:
-  // [H][S]: the pure hue of the changed H, blended by the changed S: 0x00RRGGBB.
+  // [H * 101 + S]: the pure hue of the changed H, blended by the changed S: 0x00RRGGBB.
   std::vector<std::uint32_t> hueSaturation_;
-  std::array<std::uint8_t, 101> lightness_{};
+  // [L * 256 + x]: x blended by the changed L, with 3 bytes to spare for vector reads.
+  std::vector<std::uint8_t> lightRows_;
 };
 
 }  // namespace quillane
