@@ -16,6 +16,7 @@
 #include <algorithm>
 #include <array>
 #include <cstdint>
+#include <cstdlib>
 #include <cstring>
 
 #if defined(__x86_64__)
@@ -23,6 +24,7 @@
 #endif
 
 #include "imaging/hsl_halves.h"
+#include "imaging/numeric.h"
 #include "imaging/tone.h"
 #include "imaging/vector_dispatch.h"
 
@@ -177,9 +179,9 @@ QUILLANE_AVX2_INLINE __m256d RoundProduct(__m256d v, double factor) {
   return _mm256_add_pd(k, _mm256_and_pd(up, one));
 }
 
-// H * 101 + S of 4 colours that are not gray (0x00RRGGBB), straight from the floating-point
-// formulas: the colours at an exact half.
-QUILLANE_AVX2_INLINE __m128i Avx2FloatingHueSaturation(__m128i colours) {
+// H (returned) and S of 4 colours that are not gray (0x00RRGGBB), straight from the
+// floating-point formulas: the colours at an exact half.
+QUILLANE_AVX2_INLINE __m128i Avx2FloatingHsl(__m128i colours, __m128i& saturation) {
   const __m128i byte = _mm_set1_epi32(0xFF);
   const __m256d d255 = _mm256_set1_pd(255.0);
   const __m256d b = _mm256_div_pd(_mm256_cvtepi32_pd(_mm_and_si128(colours, byte)), d255);
@@ -208,23 +210,24 @@ QUILLANE_AVX2_INLINE __m128i Avx2FloatingHueSaturation(__m128i colours) {
       h, _mm256_and_pd(_mm256_cmp_pd(h, _mm256_setzero_pd(), _CMP_LT_OQ), _mm256_set1_pd(1)));
   __m128i hue = _mm256_cvtpd_epi32(RoundProduct(h, 360));
   hue = _mm_andnot_si128(_mm_cmpeq_epi32(hue, _mm_set1_epi32(360)), hue);
-  return _mm_add_epi32(_mm_mullo_epi32(hue, _mm_set1_epi32(101)),
-                       _mm256_cvtpd_epi32(RoundProduct(s, 100)));
+  saturation = _mm256_cvtpd_epi32(RoundProduct(s, 100));
+  return hue;
 }
 
 // Puts the floating-point H * 101 + S of the listed pixels into colour, four at a time.
 QUILLANE_AVX2_INLINE void PutHalves(const Pixel* in, std::int16_t* halves, int count,
-                                    std::int32_t* colour) {
+                                    std::uint16_t* colour) {
   if (count == 0) return;
   for (int k = count; k % 4 != 0; ++k) halves[k] = halves[count - 1];
   for (int k = 0; k < count; k += 4) {
     std::uint32_t words[4];
     for (int j = 0; j < 4; ++j) std::memcpy(&words[j], in + halves[k + j], 4);
+    __m128i s;
+    const __m128i h = Avx2FloatingHsl(_mm_loadu_si128(reinterpret_cast<const __m128i*>(words)), s);
     alignas(16) std::int32_t found[4];
-    _mm_store_si128(
-        reinterpret_cast<__m128i*>(found),
-        Avx2FloatingHueSaturation(_mm_loadu_si128(reinterpret_cast<const __m128i*>(words))));
-    for (int j = 0; j < 4; ++j) colour[halves[k + j]] = found[j];
+    _mm_store_si128(reinterpret_cast<__m128i*>(found),
+                    _mm_add_epi32(_mm_mullo_epi32(h, _mm_set1_epi32(101)), s));
+    for (int j = 0; j < 4; ++j) colour[halves[k + j]] = static_cast<std::uint16_t>(found[j]);
   }
 }
 
@@ -239,20 +242,121 @@ constexpr auto kSetBits = [] {
   return t;
 }();
 
-// Pixels per chunk: the chunk's colour indices, lightness rows and result take about 3 KB.
+// Where the lightness factor (L - 50) / 50, held in double, lies below its true value: there a
+// half of the blend rounds down, elsewhere up, except where the factor is exact (L = 25, 75)
+// and a half goes to the even neighbour. Words of 16 bits: L in word L / 16 at bit L % 16.
+const std::array<std::uint16_t, 8>& LightnessBelow() {
+  static const auto words = [] {
+    std::array<std::uint16_t, 8> w{};
+    for (int l = 0; l <= 100; ++l)
+      // The product is exact in extended precision.
+      if (static_cast<Extended>((l - 50) / 50.0) * 50 < l - 50)
+        w[static_cast<std::size_t>(l / 16)] |= static_cast<std::uint16_t>(1u << (l % 16));
+    return w;
+  }();
+  return words;
+}
+
+// All ones in the 16-bit lanes whose value v (0..127) has its bit set in words.
+QUILLANE_AVX2_INLINE __m256i BitSet(const std::array<std::uint16_t, 8>& words, __m256i v) {
+  const __m256i low = _mm256_and_si256(v, _mm256_set1_epi16(15));
+  const __m256i lowBits = _mm256_setr_epi8(1, 2, 4, 8, 16, 32, 64, -128, 0, 0, 0, 0, 0, 0, 0, 0, 1,
+                                           2, 4, 8, 16, 32, 64, -128, 0, 0, 0, 0, 0, 0, 0, 0);
+  const __m256i highBits = _mm256_setr_epi8(0, 0, 0, 0, 0, 0, 0, 0, 1, 2, 4, 8, 16, 32, 64, -128, 0,
+                                            0, 0, 0, 0, 0, 0, 0, 1, 2, 4, 8, 16, 32, 64, -128);
+  const __m256i both = _mm256_mullo_epi16(low, _mm256_set1_epi16(0x0101));
+  const __m256i bit = _mm256_or_si256(
+      _mm256_and_si256(_mm256_shuffle_epi8(lowBits, both), _mm256_set1_epi16(0x00FF)),
+      _mm256_and_si256(_mm256_shuffle_epi8(highBits, both), _mm256_set1_epi16(-256)));
+  const __m256i wordIndex =
+      _mm256_add_epi16(_mm256_mullo_epi16(_mm256_srli_epi16(v, 4), _mm256_set1_epi16(0x0202)),
+                       _mm256_set1_epi16(0x0100));
+  const __m256i table =
+      _mm256_broadcastsi128_si256(_mm_loadu_si128(reinterpret_cast<const __m128i*>(words.data())));
+  return _mm256_cmpeq_epi16(_mm256_and_si256(_mm256_shuffle_epi8(table, wordIndex), bit), bit);
+}
+
+// The lightness blend of 16-bit lanes x: Round(x + (255 - x) t) above L = 50 and Round(x + x t)
+// below, t = (L - 50) / 50, is (x m + c) / 50 in whole numbers with m = 100 - L and
+// c = 255 (L - 50) above, m = L and c = 0 below. It is rounded by adding 25 before dividing,
+// or 24 where a half rounds down; at L = 25 and 75 the value is y / 2 with y = x + c / 25, and
+// 24 plus bit 1 of y takes a half to even.
+struct LightTerms {
+  __m256i m, c, exactOffset, exactBit;
+};
+
+QUILLANE_AVX2_INLINE LightTerms LightTermsOf(__m256i l) {
+  LightTerms t;
+  const __m256i bright = _mm256_cmpgt_epi16(l, _mm256_set1_epi16(50));
+  t.m = _mm256_blendv_epi8(l, _mm256_sub_epi16(_mm256_set1_epi16(100), l), bright);
+  const __m256i exact = _mm256_or_si256(_mm256_cmpeq_epi16(l, _mm256_set1_epi16(25)),
+                                        _mm256_cmpeq_epi16(l, _mm256_set1_epi16(75)));
+  const __m256i down = _mm256_or_si256(BitSet(LightnessBelow(), l), exact);
+  t.c = _mm256_add_epi16(
+      _mm256_and_si256(bright, _mm256_mullo_epi16(_mm256_sub_epi16(l, _mm256_set1_epi16(50)),
+                                                  _mm256_set1_epi16(255))),
+      _mm256_add_epi16(_mm256_set1_epi16(25), down));
+  t.exactOffset = _mm256_and_si256(_mm256_and_si256(exact, bright), _mm256_set1_epi16(255));
+  t.exactBit = _mm256_and_si256(exact, _mm256_set1_epi16(1));
+  return t;
+}
+
+QUILLANE_AVX2_INLINE __m256i LightBlend(__m256i x, const LightTerms& t) {
+  const __m256i evenHalf =
+      _mm256_and_si256(_mm256_srli_epi16(_mm256_add_epi16(x, t.exactOffset), 1), t.exactBit);
+  const __m256i n = _mm256_add_epi16(_mm256_add_epi16(_mm256_mullo_epi16(x, t.m), t.c), evenHalf);
+  // floor(n / 50) for n up to 12775.
+  return _mm256_srli_epi16(_mm256_mulhi_epu16(n, _mm256_set1_epi16(-23592)), 5);  // 41944
+}
+
+// 16 pixels from their blended hue and saturation (0x00RRGGBB, pixels 0..7 in first and 8..15
+// in second) and lightness (16-bit lanes): two registers of pixels 0xFFRRGGBB.
+QUILLANE_AVX2_INLINE void Avx2Lighten16(__m256i first, __m256i second, __m256i l, __m256i& out0,
+                                        __m256i& out1) {
+  // Packing keeps 128-bit halves apart: the channels come out as pixels 0-3, 8-11, 4-7, 12-15,
+  // so the lightness is put in that order too, and unpacking at the end restores it.
+  const __m256i byte = _mm256_set1_epi32(0xFF);
+  const __m256i blue =
+      _mm256_packus_epi32(_mm256_and_si256(first, byte), _mm256_and_si256(second, byte));
+  const __m256i green = _mm256_packus_epi32(_mm256_and_si256(_mm256_srli_epi32(first, 8), byte),
+                                            _mm256_and_si256(_mm256_srli_epi32(second, 8), byte));
+  const __m256i red =
+      _mm256_packus_epi32(_mm256_srli_epi32(first, 16), _mm256_srli_epi32(second, 16));
+  const LightTerms t = LightTermsOf(_mm256_permute4x64_epi64(l, 0xD8));
+  const __m256i blueGreen =
+      _mm256_or_si256(LightBlend(blue, t), _mm256_slli_epi16(LightBlend(green, t), 8));
+  const __m256i redAlpha = _mm256_or_si256(LightBlend(red, t), _mm256_set1_epi16(-256));
+  out0 = _mm256_unpacklo_epi16(blueGreen, redAlpha);
+  out1 = _mm256_unpackhi_epi16(blueGreen, redAlpha);
+}
+
+// 8 values of 32-bit lanes as 16-bit numbers.
+QUILLANE_AVX2_INLINE void Store16(std::uint16_t* to, __m256i v) {
+  _mm_storeu_si128(reinterpret_cast<__m128i*>(to),
+                   _mm_packus_epi32(_mm256_castsi256_si128(v), _mm256_extracti128_si256(v, 1)));
+}
+
+QUILLANE_AVX2_INLINE __m256i Load256(const void* p) {
+  return _mm256_loadu_si256(static_cast<const __m256i*>(p));
+}
+
+// Pixels per chunk: the chunk's colours, lightness and result take about 4 KB.
 constexpr int kChunk = 256;
 
-// The vector part works out each pixel's place in the two tables; the look-ups themselves are
-// plain loads, which here beat the processor's gathers.
+// A chunk of a row at a time: H, S and L of every pixel (the halves put right) and the
+// lightness from its source; then the changed hue and saturation from the table, and the
+// lightness blend 16 pixels per step.
 template <LightnessFrom kFrom>
-QUILLANE_AVX2 void Avx2Row(const std::uint32_t* hueSaturation, const std::uint8_t* lightRows,
+QUILLANE_AVX2 void Avx2Row(const HslChange& change, const std::uint32_t* hueSaturation,
                            const Pixel* in, Pixel* out, int width, const LightnessSource& source) {
-  alignas(32) std::int32_t colour[kChunk];
-  alignas(32) std::int32_t light[kChunk];
-  alignas(32) std::uint32_t pixels[kChunk];
+  alignas(32) std::uint16_t colour[kChunk + 16];  // H * 101 + S
+  alignas(32) std::uint16_t lightness[kChunk + 16];
+  alignas(32) std::uint32_t coloured[kChunk + 16];
+  alignas(32) std::uint32_t pixels[kChunk + 16];
+  std::int16_t halves[kChunk + 16];
+  const __m256i moveL = _mm256_set1_epi16(static_cast<std::int16_t>(change.lightnessShift));
   for (int x0 = 0; x0 < width; x0 += kChunk) {
     const int n = std::min(kChunk, width - x0);
-    std::int16_t halves[kChunk + 16];
     int halfCount = 0;
     int i = 0;
     for (; i + 8 <= n; i += 8) {
@@ -263,14 +367,9 @@ QUILLANE_AVX2 void Avx2Row(const std::uint32_t* hueSaturation, const std::uint8_
             _mm_loadu_si128(reinterpret_cast<const __m128i*>(source.shift + x0 + i)));
         l = _mm256_min_epi32(_mm256_max_epi32(_mm256_add_epi32(l, shift), _mm256_setzero_si256()),
                              _mm256_set1_epi32(100));
-      } else if constexpr (kFrom == LightnessFrom::Levelled) {
-        const __m256i level = _mm256_cvtepu8_epi32(
-            _mm_loadl_epi64(reinterpret_cast<const __m128i*>(source.level + x0 + i)));
-        l = _mm256_add_epi32(_mm256_mullo_epi32(level, _mm256_set1_epi32(101)), l);
       }
-      _mm256_store_si256(reinterpret_cast<__m256i*>(colour + i),
-                         _mm256_add_epi32(_mm256_mullo_epi32(c.h, _mm256_set1_epi32(101)), c.s));
-      _mm256_store_si256(reinterpret_cast<__m256i*>(light + i), l);
+      Store16(colour + i, _mm256_add_epi32(_mm256_mullo_epi32(c.h, _mm256_set1_epi32(101)), c.s));
+      Store16(lightness + i, l);
       // The positions of the halves are listed without a branch per pixel.
       _mm_storeu_si128(
           reinterpret_cast<__m128i*>(halves + halfCount),
@@ -283,17 +382,24 @@ QUILLANE_AVX2 void Avx2Row(const std::uint32_t* hueSaturation, const std::uint8_
     for (; i < n; ++i) {
       const Pixel p = in[x0 + i];
       const Hsl c = RgbToHsl(p.r, p.g, p.b);
-      colour[i] = c.h * 101 + c.s;
-      light[i] = kFrom == LightnessFrom::Levelled ? source.level[x0 + i] * 101 + c.l
-                                                  : LightnessAt<kFrom>(source, x0 + i, c.l);
+      colour[i] = static_cast<std::uint16_t>(c.h * 101 + c.s);
+      lightness[i] = static_cast<std::uint16_t>(
+          kFrom == LightnessFrom::Shifted ? LightnessAt<kFrom>(source, x0 + i, c.l) : c.l);
     }
-    for (i = 0; i < n; ++i) {
-      const std::uint32_t c = hueSaturation[colour[i]];
-      const std::uint8_t* row =
-          lightRows +
-          256 * (kFrom == LightnessFrom::Levelled ? source.byLevel[light[i]] : light[i]);
-      pixels[i] = 0xFF000000u | static_cast<std::uint32_t>(row[c >> 16]) << 16 |
-                  static_cast<std::uint32_t>(row[(c >> 8) & 0xFF]) << 8 | row[c & 0xFF];
+    if constexpr (kFrom == LightnessFrom::Levelled)
+      for (i = 0; i < n; ++i)
+        lightness[i] = source.byLevel[source.level[x0 + i] * 101 + lightness[i]];
+    for (i = n; i < n + 16; ++i) colour[i] = lightness[i] = 0;
+    for (i = 0; i < n; ++i) coloured[i] = hueSaturation[colour[i]];
+
+    for (i = 0; i < n; i += 16) {
+      const __m256i l = _mm256_min_epi16(
+          _mm256_max_epi16(_mm256_add_epi16(Load256(lightness + i), moveL), _mm256_setzero_si256()),
+          _mm256_set1_epi16(100));
+      __m256i first, second;
+      Avx2Lighten16(Load256(coloured + i), Load256(coloured + i + 8), l, first, second);
+      _mm256_store_si256(reinterpret_cast<__m256i*>(pixels + i), first);
+      _mm256_store_si256(reinterpret_cast<__m256i*>(pixels + i + 8), second);
     }
     // The result goes past the caches: streaming stores spare reading each line of it before
     // writing it.
@@ -302,8 +408,7 @@ QUILLANE_AVX2 void Avx2Row(const std::uint32_t* hueSaturation, const std::uint8_
     for (; i < n && reinterpret_cast<std::uintptr_t>(dst + 4 * i) % 32 != 0; ++i)
       std::memcpy(dst + 4 * i, pixels + i, 4);
     for (; i + 8 <= n; i += 8)
-      _mm256_stream_si256(reinterpret_cast<__m256i*>(dst + 4 * i),
-                          _mm256_loadu_si256(reinterpret_cast<const __m256i*>(pixels + i)));
+      _mm256_stream_si256(reinterpret_cast<__m256i*>(dst + 4 * i), Load256(pixels + i));
     for (; i < n; ++i) std::memcpy(dst + 4 * i, pixels + i, 4);
   }
   _mm_sfence();
@@ -311,10 +416,11 @@ QUILLANE_AVX2 void Avx2Row(const std::uint32_t* hueSaturation, const std::uint8_
 #endif
 
 template <LightnessFrom kFrom>
-void ChangeRow(const std::uint32_t* hueSaturation, const std::uint8_t* lightRows, const Pixel* in,
-               Pixel* out, int width, const LightnessSource& source) {
+void ChangeRow(const HslChange& change, const std::uint32_t* hueSaturation,
+               const std::uint8_t* lightRows, const Pixel* in, Pixel* out, int width,
+               const LightnessSource& source) {
 #if defined(__x86_64__) && defined(__GNUC__)
-  if (UseAvx2()) return Avx2Row<kFrom>(hueSaturation, lightRows, in, out, width, source);
+  if (UseAvx2()) return Avx2Row<kFrom>(change, hueSaturation, in, out, width, source);
 #endif
   PlainRow<kFrom>(hueSaturation, lightRows, in, out, 0, width, source);
 }
@@ -328,13 +434,19 @@ void RgbToHslRow(const Pixel* in, Hsl* out, int n) {
   PlainHslRow(in, out, n);
 }
 
-HslRowChanger::HslRowChanger(const HslChange& change)
-    : hueSaturation_(360 * 101), lightRows_(101 * 256 + 3) {
+HslRowChanger::HslRowChanger(const HslChange& wanted)
+    : hueSaturation_(360 * 101), lightRows_(101 * 256) {
+  // Shifts beyond 100 either way leave every value at a limit, as 100 does.
+  change_.hueTurn = (wanted.hueTurn % 360 + 360) % 360;
+  change_.saturationShift = std::clamp(wanted.saturationShift, -100, 100);
+  change_.lightnessShift = std::clamp(wanted.lightnessShift, -100, 100);
+  const HslChange& change = change_;
   const HslTables& t = HslToRgbTables();
+  const auto limited = [](int v) { return std::clamp(v, 0, 100); };
   for (int h = 0; h < 360; ++h) {
-    const std::uint8_t* hue = t.hue[change.hue[static_cast<std::size_t>(h)]];
+    const std::uint8_t* hue = t.hue[((h + change.hueTurn) % 360 + 360) % 360];
     for (int s = 0; s < 101; ++s) {
-      const std::uint8_t* sat = t.saturation[change.saturation[static_cast<std::size_t>(s)]];
+      const std::uint8_t* sat = t.saturation[limited(s + change.saturationShift)];
       hueSaturation_[static_cast<std::size_t>(h * 101 + s)] =
           static_cast<std::uint32_t>(sat[hue[0]]) << 16 |
           static_cast<std::uint32_t>(sat[hue[1]]) << 8 | sat[hue[2]];
@@ -342,7 +454,7 @@ HslRowChanger::HslRowChanger(const HslChange& change)
   }
   for (int l = 0; l <= 100; ++l)
     std::memcpy(&lightRows_[static_cast<std::size_t>(l) * 256],
-                t.lightness[change.lightness[static_cast<std::size_t>(l)]], 256);
+                t.lightness[limited(l + change.lightnessShift)], 256);
 }
 
 void HslRowChanger::Row(const Pixel* in, Pixel* out, int width,
@@ -350,10 +462,11 @@ void HslRowChanger::Row(const Pixel* in, Pixel* out, int width,
   LightnessSource source;
   source.shift = lightnessShift;
   if (lightnessShift == nullptr)
-    ChangeRow<LightnessFrom::Own>(hueSaturation_.data(), lightRows_.data(), in, out, width, source);
+    ChangeRow<LightnessFrom::Own>(change_, hueSaturation_.data(), lightRows_.data(), in, out, width,
+                                  source);
   else
-    ChangeRow<LightnessFrom::Shifted>(hueSaturation_.data(), lightRows_.data(), in, out, width,
-                                      source);
+    ChangeRow<LightnessFrom::Shifted>(change_, hueSaturation_.data(), lightRows_.data(), in, out,
+                                      width, source);
 }
 
 void HslRowChanger::RowWithLevels(const Pixel* in, Pixel* out, int width,
@@ -362,8 +475,8 @@ void HslRowChanger::RowWithLevels(const Pixel* in, Pixel* out, int width,
   LightnessSource source;
   source.level = levels;
   source.byLevel = lightness.at.data();
-  ChangeRow<LightnessFrom::Levelled>(hueSaturation_.data(), lightRows_.data(), in, out, width,
-                                     source);
+  ChangeRow<LightnessFrom::Levelled>(change_, hueSaturation_.data(), lightRows_.data(), in, out,
+                                     width, source);
 }
 
 }  // namespace quillane

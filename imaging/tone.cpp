@@ -430,15 +430,4 @@ void ConvertRowToGray(Pixel* row, int width) {
   GrayRow(row, row, width, 0);
 }
 
-HslChange NoHslChange() {
-  HslChange change{};
-  for (int h = 0; h < 360; ++h)
-    change.hue[static_cast<std::size_t>(h)] = static_cast<std::uint16_t>(h);
-  for (int v = 0; v <= 100; ++v) {
-    change.saturation[static_cast<std::size_t>(v)] = static_cast<std::uint8_t>(v);
-    change.lightness[static_cast<std::size_t>(v)] = static_cast<std::uint8_t>(v);
-  }
-  return change;
-}
-
 }  // namespace quillane

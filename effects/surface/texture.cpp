@@ -47,7 +47,7 @@ TBitmap32 texture(const TBitmap32& base, const TBitmap32& tile, int pressure) {
           Shift(RgbToHsl(tileRow[x].r, tileRow[x].g, tileRow[x].b).l, pressure));
     for (int x = tw; x < w; ++x) row[x] = row[x - tw];
   }
-  const HslRowChanger changer(NoHslChange());
+  const HslRowChanger changer(HslChange{});
   return MapRows(base, 8, [&](const Pixel* in, Pixel* out, int width, int y) {
     changer.Row(in, out, width,
                 &shifts[static_cast<std::size_t>(y % rows) * static_cast<std::size_t>(width)]);

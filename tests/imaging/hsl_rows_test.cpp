@@ -26,9 +26,9 @@ Pixel Colour(int r, int g, int b) {
 Pixel ChangedByPlainConversions(Pixel p, const HslChange& change, int shift) {
   const Hsl c = RgbToHslReference(p.r, p.g, p.b);
   const int l = std::clamp(c.l + shift, 0, 100);
-  const Rgb o = HslToRgbReference(change.hue[static_cast<std::size_t>(c.h)],
-                                  change.saturation[static_cast<std::size_t>(c.s)],
-                                  change.lightness[static_cast<std::size_t>(l)]);
+  const Rgb o = HslToRgbReference((c.h + change.hueTurn) % 360,
+                                  std::clamp(c.s + change.saturationShift, 0, 100),
+                                  std::clamp(l + change.lightnessShift, 0, 100));
   return Pixel{static_cast<std::uint8_t>(o.b), static_cast<std::uint8_t>(o.g),
                static_cast<std::uint8_t>(o.r), 255};
 }
@@ -39,7 +39,7 @@ INSTANTIATE_TEST_SUITE_P(RedLevels, EveryColourInRows, ::testing::Range(0, 256, 
 
 TEST_P(EveryColourInRows, BothVariantsEqualThePlainConversions) {
   AllowAvx2Afterwards restore;
-  const HslRowChanger unchanged(NoHslChange());
+  const HslRowChanger unchanged(HslChange{});
   std::vector<Pixel> row(256 * 256);
   std::vector<Hsl> expected(row.size()), hsl(row.size());
   std::vector<Pixel> back(row.size()), out(row.size());
@@ -65,17 +65,47 @@ TEST_P(EveryColourInRows, BothVariantsEqualThePlainConversions) {
   }
 }
 
-HslChange Turned(int turn, int saturation, int lightness) {
-  HslChange change{};
-  for (int h = 0; h < 360; ++h)
-    change.hue[static_cast<std::size_t>(h)] = static_cast<std::uint16_t>((h + turn) % 360);
-  for (int v = 0; v <= 100; ++v) {
-    change.saturation[static_cast<std::size_t>(v)] =
-        static_cast<std::uint8_t>(std::clamp(v + saturation, 0, 100));
-    change.lightness[static_cast<std::size_t>(v)] =
-        static_cast<std::uint8_t>(std::clamp(v + lightness, 0, 100));
+// Every H, S and L the conversion back can meet: a saturated colour of each hue, its S moved
+// down by the change and its L set through the levels.
+TEST(HslRowChanger, EveryHslComesBackAsTheTablesGiveIt) {
+  AllowAvx2Afterwards restore;
+  std::vector<Pixel> hues(360);
+  std::vector<bool> found(360);
+  for (int c = 0; c < 6 * 256; ++c) {
+    const int v = c % 256, order = c / 256;
+    const int channels[6][3] = {{255, v, 0}, {v, 255, 0}, {0, 255, v},
+                                {0, v, 255}, {v, 0, 255}, {255, 0, v}};
+    const auto [r, g, b] = channels[order];
+    const Hsl hsl = RgbToHsl(r, g, b);
+    if (hsl.s != 100 || found[static_cast<std::size_t>(hsl.h)]) continue;
+    found[static_cast<std::size_t>(hsl.h)] = true;
+    hues[static_cast<std::size_t>(hsl.h)] = Colour(r, g, b);
   }
-  return change;
+  ASSERT_EQ(std::count(found.begin(), found.end(), true), 360);
+  std::vector<Pixel> in, out(360 * 101);
+  std::vector<std::uint8_t> level;
+  LightnessByLevel asLevel;
+  for (int l = 0; l <= 100; ++l) {
+    in.insert(in.end(), hues.begin(), hues.end());
+    level.insert(level.end(), 360, static_cast<std::uint8_t>(l));
+  }
+  for (int level0 = 0; level0 <= 100; ++level0)
+    for (int l = 0; l <= 100; ++l)
+      asLevel.at[static_cast<std::size_t>(level0 * 101 + l)] = static_cast<std::uint8_t>(level0);
+  for (bool avx2 : kVariants) {
+    SetAvx2Allowed(avx2);
+    for (int s = 0; s <= 100; ++s) {
+      HslRowChanger(HslChange{0, s - 100, 0})
+          .RowWithLevels(in.data(), out.data(), static_cast<int>(in.size()), level.data(), asLevel);
+      for (std::size_t i = 0; i < out.size(); ++i) {
+        const int h = static_cast<int>(i % 360), l = static_cast<int>(i / 360);
+        const Rgb e = HslToRgb(h, s, l);
+        ASSERT_EQ(out[i], (Pixel{static_cast<std::uint8_t>(e.b), static_cast<std::uint8_t>(e.g),
+                                 static_cast<std::uint8_t>(e.r), 255}))
+            << h << "," << s << "," << l << " avx2=" << avx2;
+      }
+    }
+  }
 }
 
 // Widths around the vector and chunk sizes, rows starting off the vector alignment, rows
@@ -83,10 +113,10 @@ HslChange Turned(int turn, int saturation, int lightness) {
 TEST(HslRowChanger, RowsOfAwkwardWidthsMatchThePlainConversions) {
   AllowAvx2Afterwards restore;
   unsigned seed = 1;
-  for (const HslChange& change : {NoHslChange(), Turned(123, -40, 17), Turned(359, 60, -70)}) {
+  for (const HslChange& change : {HslChange{}, HslChange{123, -40, 17}, HslChange{359, 60, -70}}) {
     const HslRowChanger changer(change);
     LightnessByLevel byLevel;
-    for (std::size_t i = 0; i < byLevel.at.size() - 3; ++i)
+    for (std::size_t i = 0; i < byLevel.at.size(); ++i)
       byLevel.at[i] = static_cast<std::uint8_t>((i * 37 + i / 101) % 101);
     for (int width : {1, 2, 7, 8, 9, 31, 255, 256, 257, 700})
       for (int offset : {0, 1, 5}) {
