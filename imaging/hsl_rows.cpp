@@ -179,16 +179,19 @@ QUILLANE_AVX2_INLINE __m256d RoundProduct(__m256d v, double factor) {
   return _mm256_add_pd(k, _mm256_and_pd(up, one));
 }
 
-// H (returned) and S of 4 colours that are not gray (0x00RRGGBB), straight from the
+// The channel at shift of 4 colours as the fractions v / 255.
+QUILLANE_AVX2_INLINE __m256d Fractions(const std::uint32_t* colours, int shift) {
+  const auto& f = hsl_halves::kFractions;
+  return _mm256_setr_pd(f[(colours[0] >> shift) & 0xFF], f[(colours[1] >> shift) & 0xFF],
+                        f[(colours[2] >> shift) & 0xFF], f[(colours[3] >> shift) & 0xFF]);
+}
+
+// H (returned) and S of 4 colours that are not gray (0xAARRGGBB), straight from the
 // floating-point formulas: the colours at an exact half.
-QUILLANE_AVX2_INLINE __m128i Avx2FloatingHsl(__m128i colours, __m128i& saturation) {
-  const __m128i byte = _mm_set1_epi32(0xFF);
-  const __m256d d255 = _mm256_set1_pd(255.0);
-  const __m256d b = _mm256_div_pd(_mm256_cvtepi32_pd(_mm_and_si128(colours, byte)), d255);
-  const __m256d g =
-      _mm256_div_pd(_mm256_cvtepi32_pd(_mm_and_si128(_mm_srli_epi32(colours, 8), byte)), d255);
-  const __m256d r =
-      _mm256_div_pd(_mm256_cvtepi32_pd(_mm_and_si128(_mm_srli_epi32(colours, 16), byte)), d255);
+QUILLANE_AVX2_INLINE __m128i Avx2FloatingHsl(const std::uint32_t* colours, __m128i& saturation) {
+  const __m256d b = Fractions(colours, 0);
+  const __m256d g = Fractions(colours, 8);
+  const __m256d r = Fractions(colours, 16);
   const __m256d mx = _mm256_max_pd(r, _mm256_max_pd(g, b));
   const __m256d mn = _mm256_min_pd(r, _mm256_min_pd(g, b));
   const __m256d d = _mm256_sub_pd(mx, mn);
@@ -223,7 +226,7 @@ QUILLANE_AVX2_INLINE void PutHalves(const Pixel* in, std::int16_t* halves, int c
     std::uint32_t words[4];
     for (int j = 0; j < 4; ++j) std::memcpy(&words[j], in + halves[k + j], 4);
     __m128i s;
-    const __m128i h = Avx2FloatingHsl(_mm_loadu_si128(reinterpret_cast<const __m128i*>(words)), s);
+    const __m128i h = Avx2FloatingHsl(words, s);
     alignas(16) std::int32_t found[4];
     _mm_store_si128(reinterpret_cast<__m128i*>(found),
                     _mm_add_epi32(_mm_mullo_epi32(h, _mm_set1_epi32(101)), s));
