@@ -1,5 +1,5 @@
 // Whole rows through the colour model: RGB to HSL, a change of H, S and L, and back, in one
-// walk over the row with nothing between source and result but tables.
+// walk over each stretch of a row with nothing between source and result but small arrays.
 //
 // RGB to HSL in whole numbers: with mx, mn the largest and smallest channel, d = mx - mn and
 // sum = mx + mn,
@@ -9,10 +9,10 @@
 //       other two channels, a negative hue taken a turn round.
 // Away from an exact half of those quotients the floating-point formulas land on the same
 // whole number (their error is below 1e-12, the distance to a half at least 1 / 510). At an
-// exact half their rounding errors decide, so such colours (about one in fifty) take the
-// scalar conversion, which forms the floating-point value. The AVX2 variant takes the
-// quotients in single precision: every numerator is below 2^16 and every divisor at most
-// 510, so the quotient's floor is exact.
+// exact half their rounding errors decide, so such colours (one in twenty-five of a
+// photograph) go through the floating-point formulas themselves. The AVX2 variant takes the
+// quotients in single precision: every numerator is below 2^16 and every divisor at most 510,
+// so the quotient's floor is exact.
 #include <algorithm>
 #include <array>
 #include <cstdint>
@@ -389,11 +389,16 @@ QUILLANE_AVX2 void Avx2Row(const HslChange& change, const std::uint32_t* hueSatu
       lightness[i] = static_cast<std::uint16_t>(
           kFrom == LightnessFrom::Shifted ? LightnessAt<kFrom>(source, x0 + i, c.l) : c.l);
     }
-    if constexpr (kFrom == LightnessFrom::Levelled)
-      for (i = 0; i < n; ++i)
+    for (i = 0; i < n; ++i) {
+      coloured[i] = hueSaturation[colour[i]];
+      if constexpr (kFrom == LightnessFrom::Levelled)
         lightness[i] = source.byLevel[source.level[x0 + i] * 101 + lightness[i]];
-    for (i = n; i < n + 16; ++i) colour[i] = lightness[i] = 0;
-    for (i = 0; i < n; ++i) coloured[i] = hueSaturation[colour[i]];
+    }
+    // The last step of 16 may reach past the chunk's end: it works on zeros there.
+    for (i = n; i < n + 16; ++i) {
+      coloured[i] = 0;
+      lightness[i] = 0;
+    }
 
     for (i = 0; i < n; i += 16) {
       const __m256i l = _mm256_min_epi16(
