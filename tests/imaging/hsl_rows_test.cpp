@@ -1,5 +1,6 @@
 // The row passes of the colour model in both variants (AVX2 and plain) against the plain
-// conversions: every colour there is, and random rows of awkward widths and offsets.
+// conversions, for every colour there is and every H, S and L that comes back; the effects'
+// tests take them through awkward sizes and bands.
 #include <gtest/gtest.h>
 
 #include <algorithm>
@@ -7,7 +8,6 @@
 
 #include "imaging/tone.h"
 #include "imaging/vector_dispatch.h"
-#include "tests/imaging/random_picture.h"
 
 namespace quillane {
 namespace {
@@ -21,16 +21,6 @@ struct AllowAvx2Afterwards {
 Pixel Colour(int r, int g, int b) {
   return Pixel{static_cast<std::uint8_t>(b), static_cast<std::uint8_t>(g),
                static_cast<std::uint8_t>(r), 9};
-}
-
-Pixel ChangedByPlainConversions(Pixel p, const HslChange& change, int shift) {
-  const Hsl c = RgbToHslReference(p.r, p.g, p.b);
-  const int l = std::clamp(c.l + shift, 0, 100);
-  const Rgb o = HslToRgbReference((c.h + change.hueTurn) % 360,
-                                  std::clamp(c.s + change.saturationShift, 0, 100),
-                                  std::clamp(l + change.lightnessShift, 0, 100));
-  return Pixel{static_cast<std::uint8_t>(o.b), static_cast<std::uint8_t>(o.g),
-               static_cast<std::uint8_t>(o.r), 255};
 }
 
 // Red levels in shards of 32 so that the shards can run side by side.
@@ -105,61 +95,6 @@ TEST(HslRowChanger, EveryHslComesBackAsTheTablesGiveIt) {
             << h << "," << s << "," << l << " avx2=" << avx2;
       }
     }
-  }
-}
-
-// Widths around the vector and chunk sizes, rows starting off the vector alignment, rows
-// changed in place, with and without lightness shifts and levels.
-TEST(HslRowChanger, RowsOfAwkwardWidthsMatchThePlainConversions) {
-  AllowAvx2Afterwards restore;
-  unsigned seed = 1;
-  for (const HslChange& change : {HslChange{}, HslChange{123, -40, 17}, HslChange{359, 60, -70}}) {
-    const HslRowChanger changer(change);
-    LightnessByLevel byLevel;
-    for (std::size_t i = 0; i < byLevel.at.size(); ++i)
-      byLevel.at[i] = static_cast<std::uint8_t>((i * 37 + i / 101) % 101);
-    for (int width : {1, 2, 7, 8, 9, 31, 255, 256, 257, 700})
-      for (int offset : {0, 1, 5}) {
-        ++seed;
-        const TBitmap32 picture = RandomPicture(width + offset, 1, seed, seed % 2 == 0);
-        const Pixel* in = picture.ScanLine(0) + offset;
-        std::vector<std::int16_t> shift(static_cast<std::size_t>(width));
-        std::vector<std::uint8_t> level(static_cast<std::size_t>(width) + 8);
-        for (int x = 0; x < width; ++x) {
-          shift[static_cast<std::size_t>(x)] =
-              static_cast<std::int16_t>((x * 29 + seed) % 241 - 120);
-          level[static_cast<std::size_t>(x)] = static_cast<std::uint8_t>(x * 53 + seed);
-        }
-        for (bool avx2 : kVariants) {
-          SetAvx2Allowed(avx2);
-          std::vector<Pixel> plain(static_cast<std::size_t>(width) + 1), shifted(plain),
-              levelled(plain);
-          TBitmap32 inPlace = picture;
-          changer.Row(in, plain.data() + offset % 2, width);
-          changer.Row(in, shifted.data(), width, shift.data());
-          changer.RowWithLevels(in, levelled.data(), width, level.data(), byLevel);
-          changer.Row(inPlace.ScanLine(0) + offset, inPlace.ScanLine(0) + offset, width);
-          for (int x = 0; x < width; ++x) {
-            const Pixel p = in[x];
-            const Hsl c = RgbToHslReference(p.r, p.g, p.b);
-            const int fromLevel =
-                byLevel
-                    .at[static_cast<std::size_t>(level[static_cast<std::size_t>(x)] * 101 + c.l)];
-            const auto where = ::testing::Message()
-                               << width << "+" << offset << " x=" << x << " avx2=" << avx2;
-            ASSERT_EQ(plain[static_cast<std::size_t>(x + offset % 2)],
-                      ChangedByPlainConversions(p, change, 0))
-                << where;
-            ASSERT_EQ(inPlace.At(x + offset, 0), ChangedByPlainConversions(p, change, 0)) << where;
-            ASSERT_EQ(shifted[static_cast<std::size_t>(x)],
-                      ChangedByPlainConversions(p, change, shift[static_cast<std::size_t>(x)]))
-                << where;
-            ASSERT_EQ(levelled[static_cast<std::size_t>(x)],
-                      ChangedByPlainConversions(p, change, fromLevel - c.l))
-                << where;
-          }
-        }
-      }
   }
 }
 
