@@ -35,14 +35,20 @@ TBitmap32 colorsketch(const TBitmap32& source, int pressure) {
 void ColorSketchInto(const TBitmap32& source, int pressure, TBitmap32& out) {
   const int w = source.Width(), h = source.Height();
   if (source.Empty()) return;
-  // The new lightness depends on the edge gray and L alone: one table for the picture.
-  std::array<int, 256> tone{};
-  for (int g = 0; g < 256; ++g) tone[static_cast<std::size_t>(g)] = EdgeTone(g, pressure);
+  // The new lightness depends on the edge gray and L alone: one table for the picture, its
+  // rows taken from one of every tone and L, which does not depend on the pressure.
+  static const auto byTone = [] {
+    std::array<std::array<std::uint8_t, 101>, 101> t{};
+    for (int e = 0; e <= 100; ++e)
+      for (int l = 0; l <= 100; ++l)
+        t[static_cast<std::size_t>(e)][static_cast<std::size_t>(l)] =
+            static_cast<std::uint8_t>(NewLightness(e, l));
+    return t;
+  }();
   LightnessByLevel lightness;
   for (int g = 0; g < 256; ++g)
-    for (int l = 0; l <= 100; ++l)
-      lightness.at[static_cast<std::size_t>(g * 101 + l)] =
-          static_cast<std::uint8_t>(NewLightness(tone[static_cast<std::size_t>(g)], l));
+    std::memcpy(&lightness.at[static_cast<std::size_t>(g * 101)],
+                byTone[static_cast<std::size_t>(EdgeTone(g, pressure))].data(), 101);
   const HslRowChanger changer(HslChange{});
 
   if (w < 3 || h < 3) {
