@@ -138,9 +138,9 @@ class HslRowChanger {
 
  private:
   HslChange change_;
-  // For the plain variant: [H * 101 + S], the pure hue of the changed H blended by the changed
-  // S as 0x00RRGGBB, and [L * 256 + x], x blended by the changed L.
+  // [H * 101 + S]: the pure hue of the changed H blended by the changed S, 0x00RRGGBB.
   std::vector<std::uint32_t> hueSaturation_;
+  // [L * 256 + x]: x blended by the changed L, for the plain variant (the AVX2 one computes it).
   std::vector<std::uint8_t> lightRows_;
 };
 
