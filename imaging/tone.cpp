@@ -7,6 +7,7 @@
 #include <cstdlib>
 #include <cstring>
 
+#include "imaging/hsl_halves.h"
 #include "imaging/numeric.h"
 #include "imaging/parallel.h"
 
@@ -93,8 +94,9 @@ inline Hsl FastRgbToHsl(int r, int g, int b) {
   // Below l = 0.5 the saturation is d / (mx + mn), from it d / (510 - mx - mn) (in 255ths);
   // at mx + mn = 255 both are the same.
   const int sum = mx + mn;
-  out.s = RoundQuotient(100 * d, sum < 255 ? sum : 510 - sum,
-                        [&] { return static_cast<Extended>(HslFractionsOf(r, g, b).s) * 100; });
+  out.s = RoundQuotient(100 * d, sum < 255 ? sum : 510 - sum, [&] {
+    return static_cast<Extended>(hsl_halves::SaturationFraction(r, g, b)) * 100;
+  });
   // Hue in degrees: 60 (g - b) / d, 120 + 60 (b - r) / d or 240 + 60 (r - g) / d by the
   // largest channel (red before green before blue), a negative one taken a turn round. All
   // three are formed and one chosen, which photographs' colours favour over branching.
@@ -102,8 +104,8 @@ inline Hsl FastRgbToHsl(int r, int g, int b) {
   const int fromGreen = 120 * d + 60 * (b - r);
   const int fromBlue = 240 * d + 60 * (r - g);
   const int num = r == mx ? fromRed : (g == mx ? fromGreen : fromBlue);
-  out.h =
-      RoundQuotient(num, d, [&] { return static_cast<Extended>(HslFractionsOf(r, g, b).h) * 360; });
+  out.h = RoundQuotient(
+      num, d, [&] { return static_cast<Extended>(hsl_halves::HueFraction(r, g, b)) * 360; });
   if (out.h == 360) out.h = 0;
   return out;
 }
@@ -251,10 +253,6 @@ std::uint8_t GrayValueOfHalf(int r, int g, int b) {
 Hsl RgbToHsl(int r, int g, int b) {
   if (!IsByte(r) || !IsByte(g) || !IsByte(b)) return PlainRgbToHsl(r, g, b);
   return FastRgbToHsl(r, g, b);
-}
-
-void RgbToHslRow(const Pixel* in, Hsl* out, int n) {
-  for (int i = 0; i < n; ++i) out[i] = FastRgbToHsl(in[i].r, in[i].g, in[i].b);
 }
 
 const HslTables& HslToRgbTables() {
@@ -430,45 +428,6 @@ TBitmap32 PencilContrastPassReference(const TBitmap32& input, int c) {
 
 void ConvertRowToGray(Pixel* row, int width) {
   GrayRow(row, row, width, 0);
-}
-
-HslRowChanger::HslRowChanger(const HslChange& change)
-    : hueSaturation_(360 * 101), lightness_(change.lightness) {
-  const HslTables& t = Tables();
-  for (int h = 0; h < 360; ++h) {
-    const std::uint8_t* hue = t.hue[change.hue[static_cast<std::size_t>(h)]];
-    for (int s = 0; s < 101; ++s) {
-      const std::uint8_t* sat = t.saturation[change.saturation[static_cast<std::size_t>(s)]];
-      hueSaturation_[static_cast<std::size_t>(h * 101 + s)] =
-          static_cast<std::uint32_t>(sat[hue[0]]) << 16 |
-          static_cast<std::uint32_t>(sat[hue[1]]) << 8 | sat[hue[2]];
-    }
-  }
-}
-
-void HslRowChanger::Row(const Pixel* in, Pixel* out, int width,
-                        const std::int16_t* lightnessShift) const {
-  const HslTables& toRgb = Tables();
-  for (int x = 0; x < width; ++x) {
-    const Pixel p = in[x];
-    const Hsl hsl = FastRgbToHsl(p.r, p.g, p.b);
-    int l = hsl.l;
-    if (lightnessShift != nullptr) l = std::clamp(l + lightnessShift[x], 0, 100);
-    const std::uint8_t* light = toRgb.lightness[lightness_[static_cast<std::size_t>(l)]];
-    const std::uint32_t c = hueSaturation_[static_cast<std::size_t>(hsl.h * 101 + hsl.s)];
-    out[x] = Pixel{light[c & 0xFF], light[(c >> 8) & 0xFF], light[c >> 16], 255};
-  }
-}
-
-HslChange NoHslChange() {
-  HslChange change{};
-  for (int h = 0; h < 360; ++h)
-    change.hue[static_cast<std::size_t>(h)] = static_cast<std::uint16_t>(h);
-  for (int v = 0; v <= 100; ++v) {
-    change.saturation[static_cast<std::size_t>(v)] = static_cast<std::uint8_t>(v);
-    change.lightness[static_cast<std::size_t>(v)] = static_cast<std::uint8_t>(v);
-  }
-  return change;
 }
 
 }  // namespace quillane

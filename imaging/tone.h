@@ -107,16 +107,19 @@ void GrayLevels(const Pixel* in, std::uint8_t* out, int count);
 // The same for the first width pixels of one row.
 void ConvertRowToGray(Pixel* row, int width);
 
-// A change of every colour through the model: H, S and L of a colour are mapped through the
-// tables (each entry within the range of its component).
+// A change of every colour through the model: H turned by hueTurn degrees (0..359) round the
+// wheel, S and L moved by saturationShift and lightnessShift (-100..100) and limited to 0..100.
 struct HslChange {
-  std::array<std::uint16_t, 360> hue;
-  std::array<std::uint8_t, 101> saturation;
-  std::array<std::uint8_t, 101> lightness;
+  int hueTurn = 0;
+  int saturationShift = 0;
+  int lightnessShift = 0;
 };
 
-// The tables that keep every component as it is.
-HslChange NoHslChange();
+// The new lightness that a per-pixel level (0..255, from a second picture) gives a colour's L:
+// at[level * 101 + L], each 0..100.
+struct LightnessByLevel {
+  std::array<std::uint8_t, 256 * 101> at{};
+};
 
 // Applies a change row by row. Built once per picture (it holds tables of the change).
 class HslRowChanger {
@@ -129,10 +132,16 @@ class HslRowChanger {
   void Row(const Pixel* in, Pixel* out, int width,
            const std::int16_t* lightnessShift = nullptr) const;
 
+  // The same with L replaced by lightness.at[levels[x] * 101 + L] before the change.
+  void RowWithLevels(const Pixel* in, Pixel* out, int width, const std::uint8_t* levels,
+                     const LightnessByLevel& lightness) const;
+
  private:
-  // [H][S]: the pure hue of the changed H, blended by the changed S: 0x00RRGGBB.
+  HslChange change_;
+  // [H * 101 + S]: the pure hue of the changed H blended by the changed S, 0x00RRGGBB.
   std::vector<std::uint32_t> hueSaturation_;
-  std::array<std::uint8_t, 101> lightness_{};
+  // [L * 256 + x]: x blended by the changed L, for the plain variant (the AVX2 one computes it).
+  std::vector<std::uint8_t> lightRows_;
 };
 
 }  // namespace quillane

@@ -11,16 +11,10 @@
 namespace quillane {
 
 TBitmap32 HslAdjust(const TBitmap32& source, int hue, int saturation, int lighting) {
-  HslChange change{};
-  for (int h = 0; h < 360; ++h)
-    change.hue[static_cast<std::size_t>(h)] =
-        static_cast<std::uint16_t>(((h + hue + 180) % 360 + 360) % 360);
-  for (int v = 0; v <= 100; ++v) {
-    change.saturation[static_cast<std::size_t>(v)] =
-        static_cast<std::uint8_t>(std::clamp(v + saturation - 100, 0, 100));
-    change.lightness[static_cast<std::size_t>(v)] =
-        static_cast<std::uint8_t>(std::clamp(v + lighting - 100, 0, 100));
-  }
+  HslChange change;
+  change.hueTurn = (hue % 360 + 180) % 360;
+  change.saturationShift = std::clamp(saturation, 0, 200) - 100;  // beyond, all S are 0 or 100
+  change.lightnessShift = std::clamp(lighting, 0, 200) - 100;
   const HslRowChanger changer(change);
   return MapRows(source, 8,
                  [&](const Pixel* in, Pixel* out, int w, int) { changer.Row(in, out, w); });

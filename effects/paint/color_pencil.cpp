@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "effects/registry.h"
+#include "imaging/edge_gray_rows.h"
 #include "imaging/edge_map.h"
 #include "imaging/numeric.h"
 #include "imaging/parallel.h"
@@ -32,18 +33,11 @@ TBitmap32 colorsketch(const TBitmap32& source, int pressure) {
 }
 
 void ColorSketchInto(const TBitmap32& source, int pressure, TBitmap32& out) {
-  // The edge map is made gray in place and then overwritten pixel by pixel with the result,
-  // so the run needs no bitmap beyond it.
+  const int w = source.Width(), h = source.Height();
   if (source.Empty()) return;
-  std::memcpy(out.Data(), source.Data(), source.PixelCount() * sizeof(Pixel));
-  picsobel(out);
-  ConvertToGray(out);
-
-  // Both steps between the edge gray and the new lightness depend on few inputs: tables.
-  std::array<std::uint8_t, 256> tone{};
-  for (int g = 0; g < 256; ++g)
-    tone[static_cast<std::size_t>(g)] = static_cast<std::uint8_t>(EdgeTone(g, pressure));
-  static const auto lightness = [] {
+  // The new lightness depends on the edge gray and L alone: one table for the picture, its
+  // rows taken from one of every tone and L, which does not depend on the pressure.
+  static const auto byTone = [] {
     std::array<std::array<std::uint8_t, 101>, 101> t{};
     for (int e = 0; e <= 100; ++e)
       for (int l = 0; l <= 100; ++l)
@@ -51,23 +45,30 @@ void ColorSketchInto(const TBitmap32& source, int pressure, TBitmap32& out) {
             static_cast<std::uint8_t>(NewLightness(e, l));
     return t;
   }();
+  LightnessByLevel lightness;
+  for (int g = 0; g < 256; ++g)
+    std::memcpy(&lightness.at[static_cast<std::size_t>(g * 101)],
+                byTone[static_cast<std::size_t>(EdgeTone(g, pressure))].data(), 101);
+  const HslRowChanger changer(HslChange{});
 
-  const HslTables& hsl = HslToRgbTables();
-  const int w = out.Width();
-  ParallelRows(0, out.Height(), static_cast<std::size_t>(w) * 8, [&](int y0, int y1) {
-    std::vector<Hsl> colours(static_cast<std::size_t>(w));
+  if (w < 3 || h < 3) {
+    // No interior pixel: the edge map's border rules alone, from a whole edge map.
+    TBitmap32 edges = source;
+    picsobel(edges);
+    std::vector<std::uint8_t> gray(static_cast<std::size_t>(w));
+    for (int y = 0; y < h; ++y) {
+      GrayLevels(edges.ScanLine(y), gray.data(), w);
+      changer.RowWithLevels(source.ScanLine(y), out.ScanLine(y), w, gray.data(), lightness);
+    }
+    return;
+  }
+  // Each row's edge grays are made from three source rows just before the row is converted,
+  // so the edge map never exists as a picture.
+  ParallelRows(0, h, static_cast<std::size_t>(w) * 16, [&](int y0, int y1) {
+    std::vector<std::uint8_t> gray(static_cast<std::size_t>(w));
     for (int y = y0; y < y1; ++y) {
-      Pixel* row = out.ScanLine(y);
-      RgbToHslRow(source.ScanLine(y), colours.data(), w);
-      for (int x = 0; x < w; ++x) {
-        const Hsl c = colours[static_cast<std::size_t>(x)];
-        const std::uint8_t* light =
-            hsl.lightness[lightness[tone[row[x].r]][static_cast<std::size_t>(c.l)]];
-        const std::uint8_t* saturated = hsl.saturation[c.s];
-        const std::uint8_t* hue = hsl.hue[c.h];
-        row[x] = Pixel{light[saturated[hue[2]]], light[saturated[hue[1]]], light[saturated[hue[0]]],
-                       255};
-      }
+      EdgeGrayRow(source, y, gray.data());
+      changer.RowWithLevels(source.ScanLine(y), out.ScanLine(y), w, gray.data(), lightness);
     }
   });
 }

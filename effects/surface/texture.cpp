@@ -1,6 +1,7 @@
 #include "effects/surface/texture.h"
 
 #include <algorithm>
+#include <array>
 #include <cstdint>
 #include <string>
 #include <vector>
@@ -38,16 +39,19 @@ TBitmap32 texture(const TBitmap32& base, const TBitmap32& tile, int pressure) {
   const bool plain = tile.Width() == 0 || tile.Height() == 0;
   // One row of shifts per tile row, already repeated across the picture's width.
   const int rows = std::min(th, h);
+  std::array<std::int16_t, 101> shiftOf{};  // by the tile's lightness
+  for (int l = 0; l <= 100; ++l)
+    shiftOf[static_cast<std::size_t>(l)] = static_cast<std::int16_t>(Shift(l, pressure));
   std::vector<std::int16_t> shifts(static_cast<std::size_t>(rows) * static_cast<std::size_t>(w));
   for (int ty = 0; ty < rows && !plain; ++ty) {
     std::int16_t* row = &shifts[static_cast<std::size_t>(ty) * static_cast<std::size_t>(w)];
     const Pixel* tileRow = tile.ScanLine(ty);
     for (int x = 0; x < std::min(tw, w); ++x)
-      row[x] = static_cast<std::int16_t>(
-          Shift(RgbToHsl(tileRow[x].r, tileRow[x].g, tileRow[x].b).l, pressure));
+      row[x] =
+          shiftOf[static_cast<std::size_t>(RgbToHsl(tileRow[x].r, tileRow[x].g, tileRow[x].b).l)];
     for (int x = tw; x < w; ++x) row[x] = row[x - tw];
   }
-  const HslRowChanger changer(NoHslChange());
+  const HslRowChanger changer(HslChange{});
   return MapRows(base, 8, [&](const Pixel* in, Pixel* out, int width, int y) {
     changer.Row(in, out, width,
                 &shifts[static_cast<std::size_t>(y % rows) * static_cast<std::size_t>(width)]);

@@ -1,0 +1,489 @@
+// Whole rows through the colour model: RGB to HSL, a change of H, S and L, and back, in one
+// walk over each stretch of a row with nothing between source and result but small arrays.
+//
+// RGB to HSL in whole numbers: with mx, mn the largest and smallest channel, d = mx - mn and
+// sum = mx + mn,
+//   L = Round(100 sum / 510), never an exact half, so floor((20 sum + 51) / 102);
+//   S = Round(100 d / den) with den = sum below 255 and 510 - sum from it;
+//   H = the sector's base (0, 120, 240) plus or minus Round(60 a / d), a the distance of the
+//       other two channels, a negative hue taken a turn round.
+// Away from an exact half of those quotients the floating-point formulas land on the same
+// whole number (their error is below 1e-12, the distance to a half at least 1 / 510). At an
+// exact half their rounding errors decide, so such colours (one in twenty-five of a
+// photograph) go through the floating-point formulas themselves. The AVX2 variant takes the
+// quotients in single precision: every numerator is below 2^16 and every divisor at most 510,
+// so the quotient's floor is exact.
+#include <algorithm>
+#include <array>
+#include <cstdint>
+#include <cstring>
+
+#if defined(__x86_64__)
+#include <immintrin.h>
+#endif
+
+#include "imaging/hsl_halves.h"
+#include "imaging/numeric.h"
+#include "imaging/tone.h"
+#include "imaging/vector_dispatch.h"
+
+namespace quillane {
+namespace {
+
+// How a pass finds the lightness it converts back with, from the L of each colour.
+enum class LightnessFrom {
+  Own,       // L itself
+  Shifted,   // L + shift[x], limited to 0..100
+  Levelled,  // byLevel[level[x] * 101 + L]
+};
+
+struct LightnessSource {
+  const std::int16_t* shift = nullptr;
+  const std::uint8_t* level = nullptr;
+  const std::uint8_t* byLevel = nullptr;
+};
+
+template <LightnessFrom kFrom>
+inline int LightnessAt(const LightnessSource& source, int x, int l) {
+  if constexpr (kFrom == LightnessFrom::Shifted) return std::clamp(l + source.shift[x], 0, 100);
+  if constexpr (kFrom == LightnessFrom::Levelled) return source.byLevel[source.level[x] * 101 + l];
+  return l;
+}
+
+// The pixel of a colour's changed hue and saturation (0x00RRGGBB, from hueSaturation) at the
+// changed lightness row.
+inline Pixel ColourPixel(std::uint32_t c, const std::uint8_t* light) {
+  return Pixel{light[c & 0xFF], light[(c >> 8) & 0xFF], light[c >> 16], 255};
+}
+
+template <LightnessFrom kFrom>
+void PlainRow(const std::uint32_t* hueSaturation, const std::uint8_t* lightRows, const Pixel* in,
+              Pixel* out, int x0, int x1, const LightnessSource& source) {
+  for (int x = x0; x < x1; ++x) {
+    const Pixel p = in[x];
+    const Hsl c = RgbToHsl(p.r, p.g, p.b);
+    const int l = LightnessAt<kFrom>(source, x, c.l);
+    out[x] = ColourPixel(hueSaturation[c.h * 101 + c.s], lightRows + l * 256);
+  }
+}
+
+void PlainHslRow(const Pixel* in, Hsl* out, int n) {
+  for (int i = 0; i < n; ++i) out[i] = RgbToHsl(in[i].r, in[i].g, in[i].b);
+}
+
+#if defined(__x86_64__) && defined(__GNUC__)
+#define QUILLANE_AVX2 [[gnu::target("avx2")]]
+#define QUILLANE_AVX2_INLINE [[gnu::target("avx2"), gnu::always_inline]] inline
+
+// floor(num / den) of whole numbers below 2^24, den > 0.
+QUILLANE_AVX2_INLINE __m256i Quotient(__m256i num, __m256i den) {
+  return _mm256_cvttps_epi32(_mm256_div_ps(_mm256_cvtepi32_ps(num), _mm256_cvtepi32_ps(den)));
+}
+
+// H, S and L of 8 pixels in 32-bit lanes; H and S hold for the pixels not marked in halves.
+struct HslLanes {
+  __m256i h, s, l;
+  unsigned halves;
+};
+
+QUILLANE_AVX2_INLINE HslLanes Avx2Hsl8(const Pixel* in) {
+  const __m256i p = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in));
+  const __m256i byte = _mm256_set1_epi32(0xFF);
+  const __m256i b = _mm256_and_si256(p, byte);
+  const __m256i g = _mm256_and_si256(_mm256_srli_epi32(p, 8), byte);
+  const __m256i r = _mm256_and_si256(_mm256_srli_epi32(p, 16), byte);
+  const __m256i mx = _mm256_max_epi32(r, _mm256_max_epi32(g, b));
+  const __m256i mn = _mm256_min_epi32(r, _mm256_min_epi32(g, b));
+  const __m256i one = _mm256_set1_epi32(1);
+  const __m256i d = _mm256_sub_epi32(mx, mn);
+  const __m256i sum = _mm256_add_epi32(mx, mn);
+  HslLanes out;
+  // (20 sum + 51) * 41121 >> 22 is floor((20 sum + 51) / 102) for sums up to 510.
+  out.l = _mm256_srli_epi32(
+      _mm256_mullo_epi32(
+          _mm256_add_epi32(_mm256_mullo_epi32(sum, _mm256_set1_epi32(20)), _mm256_set1_epi32(51)),
+          _mm256_set1_epi32(41121)),
+      22);
+
+  // Saturation: floor((200 d + den) / (2 den)) rounds half up; a gray (d = 0) gets 0, with den
+  // kept from 0 so that black and white divide by something.
+  const __m256i den =
+      _mm256_max_epi32(_mm256_min_epi32(sum, _mm256_sub_epi32(_mm256_set1_epi32(510), sum)), one);
+  const __m256i twiceDen = _mm256_add_epi32(den, den);
+  const __m256i numS = _mm256_add_epi32(_mm256_mullo_epi32(d, _mm256_set1_epi32(200)), den);
+  out.s = Quotient(numS, twiceDen);
+  const __m256i halfS = _mm256_cmpeq_epi32(_mm256_mullo_epi32(out.s, twiceDen), numS);
+
+  // Hue: the largest channel picks the sector, red before green before blue.
+  const __m256i redMax = _mm256_cmpeq_epi32(r, mx);
+  const __m256i greenMax = _mm256_andnot_si256(redMax, _mm256_cmpeq_epi32(g, mx));
+  const __m256i signedDistance = _mm256_blendv_epi8(
+      _mm256_blendv_epi8(_mm256_sub_epi32(r, g), _mm256_sub_epi32(b, r), greenMax),
+      _mm256_sub_epi32(g, b), redMax);
+  const __m256i base = _mm256_blendv_epi8(
+      _mm256_blendv_epi8(_mm256_set1_epi32(240), _mm256_set1_epi32(120), greenMax),
+      _mm256_setzero_si256(), redMax);
+  const __m256i span = _mm256_max_epi32(d, one);
+  const __m256i twiceSpan = _mm256_add_epi32(span, span);
+  const __m256i numH = _mm256_add_epi32(
+      _mm256_mullo_epi32(_mm256_abs_epi32(signedDistance), _mm256_set1_epi32(120)), span);
+  const __m256i steps = Quotient(numH, twiceSpan);
+  const __m256i halfH = _mm256_cmpeq_epi32(_mm256_mullo_epi32(steps, twiceSpan), numH);
+  const __m256i h = _mm256_add_epi32(base, _mm256_sign_epi32(steps, signedDistance));
+  out.h = _mm256_add_epi32(
+      h, _mm256_and_si256(_mm256_cmpgt_epi32(_mm256_setzero_si256(), h), _mm256_set1_epi32(360)));
+
+  out.halves =
+      static_cast<unsigned>(_mm256_movemask_ps(_mm256_castsi256_ps(_mm256_or_si256(halfS, halfH))));
+  return out;
+}
+
+QUILLANE_AVX2 void Avx2HslRow(const Pixel* in, Hsl* out, int n) {
+  int x = 0;
+  for (; x + 8 <= n; x += 8) {
+    const HslLanes c = Avx2Hsl8(in + x);
+    alignas(32) std::int32_t hs[8], ss[8], ls[8];
+    _mm256_store_si256(reinterpret_cast<__m256i*>(hs), c.h);
+    _mm256_store_si256(reinterpret_cast<__m256i*>(ss), c.s);
+    _mm256_store_si256(reinterpret_cast<__m256i*>(ls), c.l);
+    for (int i = 0; i < 8; ++i) out[x + i] = Hsl{hs[i], ss[i], ls[i]};
+    for (unsigned halves = c.halves; halves != 0; halves &= halves - 1) {
+      const int i = x + __builtin_ctz(halves);
+      out[i] = RgbToHsl(in[i].r, in[i].g, in[i].b);
+    }
+  }
+  PlainHslRow(in + x, out + x, n - x);
+}
+
+// Round(v * factor) of 4 fractions 0 <= v <= 1, with factor 100 or 360, exactly as in extended
+// precision (where the product is exact): v is split into halves of 26 bits whose products
+// with factor are exact, so the sign of v * factor - (k + 1/2) comes out right.
+QUILLANE_AVX2_INLINE __m256d RoundProduct(__m256d v, double factor) {
+  const __m256d f = _mm256_set1_pd(factor);
+  const __m256d split = _mm256_mul_pd(v, _mm256_set1_pd(134217729.0));  // 2^27 + 1
+  const __m256d high = _mm256_sub_pd(split, _mm256_sub_pd(split, v));
+  const __m256d low = _mm256_sub_pd(v, high);
+  const __m256d k = _mm256_floor_pd(_mm256_mul_pd(v, f));
+  const __m256d beyondHalf =
+      _mm256_add_pd(_mm256_sub_pd(_mm256_mul_pd(high, f), _mm256_add_pd(k, _mm256_set1_pd(0.5))),
+                    _mm256_mul_pd(low, f));
+  const __m256d one = _mm256_set1_pd(1);
+  const __m256d odd = _mm256_cmp_pd(
+      _mm256_sub_pd(k, _mm256_mul_pd(_mm256_floor_pd(_mm256_mul_pd(k, _mm256_set1_pd(0.5))),
+                                     _mm256_set1_pd(2))),
+      one, _CMP_EQ_OQ);
+  const __m256d zero = _mm256_setzero_pd();
+  const __m256d up = _mm256_or_pd(_mm256_cmp_pd(beyondHalf, zero, _CMP_GT_OQ),
+                                  _mm256_and_pd(_mm256_cmp_pd(beyondHalf, zero, _CMP_EQ_OQ), odd));
+  return _mm256_add_pd(k, _mm256_and_pd(up, one));
+}
+
+// The channel at shift of 4 colours as the fractions v / 255.
+QUILLANE_AVX2_INLINE __m256d Fractions(const std::uint32_t* colours, int shift) {
+  const auto& f = hsl_halves::kFractions;
+  return _mm256_setr_pd(f[(colours[0] >> shift) & 0xFF], f[(colours[1] >> shift) & 0xFF],
+                        f[(colours[2] >> shift) & 0xFF], f[(colours[3] >> shift) & 0xFF]);
+}
+
+// H (returned) and S of 4 colours that are not gray (0xAARRGGBB), straight from the
+// floating-point formulas: the colours at an exact half.
+QUILLANE_AVX2_INLINE __m128i Avx2FloatingHsl(const std::uint32_t* colours, __m128i& saturation) {
+  const __m256d b = Fractions(colours, 0);
+  const __m256d g = Fractions(colours, 8);
+  const __m256d r = Fractions(colours, 16);
+  const __m256d mx = _mm256_max_pd(r, _mm256_max_pd(g, b));
+  const __m256d mn = _mm256_min_pd(r, _mm256_min_pd(g, b));
+  const __m256d d = _mm256_sub_pd(mx, mn);
+  const __m256d sum = _mm256_add_pd(mx, mn);
+  const __m256d lowLight =
+      _mm256_cmp_pd(_mm256_div_pd(sum, _mm256_set1_pd(2)), _mm256_set1_pd(0.5), _CMP_LT_OQ);
+  const __m256d s = _mm256_div_pd(
+      d, _mm256_blendv_pd(_mm256_sub_pd(_mm256_sub_pd(_mm256_set1_pd(2), mx), mn), sum, lowLight));
+  const __m256d redMax = _mm256_cmp_pd(r, mx, _CMP_EQ_OQ);
+  const __m256d greenMax = _mm256_andnot_pd(redMax, _mm256_cmp_pd(g, mx, _CMP_EQ_OQ));
+  const __m256d num =
+      _mm256_blendv_pd(_mm256_blendv_pd(_mm256_sub_pd(r, g), _mm256_sub_pd(b, r), greenMax),
+                       _mm256_sub_pd(g, b), redMax);
+  const __m256d sector =
+      _mm256_blendv_pd(_mm256_blendv_pd(_mm256_set1_pd(4), _mm256_set1_pd(2), greenMax),
+                       _mm256_setzero_pd(), redMax);
+  __m256d h = _mm256_div_pd(_mm256_add_pd(sector, _mm256_div_pd(num, d)), _mm256_set1_pd(6));
+  h = _mm256_add_pd(
+      h, _mm256_and_pd(_mm256_cmp_pd(h, _mm256_setzero_pd(), _CMP_LT_OQ), _mm256_set1_pd(1)));
+  __m128i hue = _mm256_cvtpd_epi32(RoundProduct(h, 360));
+  hue = _mm_andnot_si128(_mm_cmpeq_epi32(hue, _mm_set1_epi32(360)), hue);
+  saturation = _mm256_cvtpd_epi32(RoundProduct(s, 100));
+  return hue;
+}
+
+// Puts the floating-point H * 101 + S of the listed pixels into colour, four at a time.
+QUILLANE_AVX2_INLINE void PutHalves(const Pixel* in, std::int16_t* halves, int count,
+                                    std::uint16_t* colour) {
+  if (count == 0) return;
+  for (int k = count; k % 4 != 0; ++k) halves[k] = halves[count - 1];
+  for (int k = 0; k < count; k += 4) {
+    std::uint32_t words[4];
+    for (int j = 0; j < 4; ++j) std::memcpy(&words[j], in + halves[k + j], 4);
+    __m128i s;
+    const __m128i h = Avx2FloatingHsl(words, s);
+    alignas(16) std::int32_t found[4];
+    _mm_store_si128(reinterpret_cast<__m128i*>(found),
+                    _mm_add_epi32(_mm_mullo_epi32(h, _mm_set1_epi32(101)), s));
+    for (int j = 0; j < 4; ++j) colour[halves[k + j]] = static_cast<std::uint16_t>(found[j]);
+  }
+}
+
+// For each 8-bit mask, the positions of its set bits.
+constexpr auto kSetBits = [] {
+  std::array<std::array<std::uint8_t, 8>, 256> t{};
+  for (int m = 0; m < 256; ++m)
+    for (int bit = 0, n = 0; bit < 8; ++bit)
+      if ((m >> bit) & 1)
+        t[static_cast<std::size_t>(m)][static_cast<std::size_t>(n++)] =
+            static_cast<std::uint8_t>(bit);
+  return t;
+}();
+
+// Where the lightness factor (L - 50) / 50, held in double, lies below its true value: there a
+// half of the blend rounds down, elsewhere up, except where the factor is exact (L = 25, 75)
+// and a half goes to the even neighbour. Words of 16 bits: L in word L / 16 at bit L % 16.
+const std::array<std::uint16_t, 8>& LightnessBelow() {
+  static const auto words = [] {
+    std::array<std::uint16_t, 8> w{};
+    for (int l = 0; l <= 100; ++l)
+      // The product is exact in extended precision.
+      if (static_cast<Extended>((l - 50) / 50.0) * 50 < l - 50)
+        w[static_cast<std::size_t>(l / 16)] |= static_cast<std::uint16_t>(1u << (l % 16));
+    return w;
+  }();
+  return words;
+}
+
+// All ones in the 16-bit lanes whose value v (0..127) has its bit set in words.
+QUILLANE_AVX2_INLINE __m256i BitSet(const std::array<std::uint16_t, 8>& words, __m256i v) {
+  const __m256i low = _mm256_and_si256(v, _mm256_set1_epi16(15));
+  const __m256i lowBits = _mm256_setr_epi8(1, 2, 4, 8, 16, 32, 64, -128, 0, 0, 0, 0, 0, 0, 0, 0, 1,
+                                           2, 4, 8, 16, 32, 64, -128, 0, 0, 0, 0, 0, 0, 0, 0);
+  const __m256i highBits = _mm256_setr_epi8(0, 0, 0, 0, 0, 0, 0, 0, 1, 2, 4, 8, 16, 32, 64, -128, 0,
+                                            0, 0, 0, 0, 0, 0, 0, 1, 2, 4, 8, 16, 32, 64, -128);
+  const __m256i both = _mm256_mullo_epi16(low, _mm256_set1_epi16(0x0101));
+  const __m256i bit = _mm256_or_si256(
+      _mm256_and_si256(_mm256_shuffle_epi8(lowBits, both), _mm256_set1_epi16(0x00FF)),
+      _mm256_and_si256(_mm256_shuffle_epi8(highBits, both), _mm256_set1_epi16(-256)));
+  const __m256i wordIndex =
+      _mm256_add_epi16(_mm256_mullo_epi16(_mm256_srli_epi16(v, 4), _mm256_set1_epi16(0x0202)),
+                       _mm256_set1_epi16(0x0100));
+  const __m256i table =
+      _mm256_broadcastsi128_si256(_mm_loadu_si128(reinterpret_cast<const __m128i*>(words.data())));
+  return _mm256_cmpeq_epi16(_mm256_and_si256(_mm256_shuffle_epi8(table, wordIndex), bit), bit);
+}
+
+// The lightness blend of 16-bit lanes x: Round(x + (255 - x) t) above L = 50 and Round(x + x t)
+// below, t = (L - 50) / 50, is (x m + c) / 50 in whole numbers with m = 100 - L and
+// c = 255 (L - 50) above, m = L and c = 0 below. It is rounded by adding 25 before dividing,
+// or 24 where a half rounds down; at L = 25 and 75 the value is y / 2 with y = x + c / 25, and
+// 24 plus bit 1 of y takes a half to even.
+struct LightTerms {
+  __m256i m, c, exactOffset, exactBit;
+};
+
+QUILLANE_AVX2_INLINE LightTerms LightTermsOf(__m256i l) {
+  LightTerms t;
+  const __m256i bright = _mm256_cmpgt_epi16(l, _mm256_set1_epi16(50));
+  t.m = _mm256_blendv_epi8(l, _mm256_sub_epi16(_mm256_set1_epi16(100), l), bright);
+  const __m256i exact = _mm256_or_si256(_mm256_cmpeq_epi16(l, _mm256_set1_epi16(25)),
+                                        _mm256_cmpeq_epi16(l, _mm256_set1_epi16(75)));
+  const __m256i down = _mm256_or_si256(BitSet(LightnessBelow(), l), exact);
+  t.c = _mm256_add_epi16(
+      _mm256_and_si256(bright, _mm256_mullo_epi16(_mm256_sub_epi16(l, _mm256_set1_epi16(50)),
+                                                  _mm256_set1_epi16(255))),
+      _mm256_add_epi16(_mm256_set1_epi16(25), down));
+  t.exactOffset = _mm256_and_si256(_mm256_and_si256(exact, bright), _mm256_set1_epi16(255));
+  t.exactBit = _mm256_and_si256(exact, _mm256_set1_epi16(1));
+  return t;
+}
+
+QUILLANE_AVX2_INLINE __m256i LightBlend(__m256i x, const LightTerms& t) {
+  const __m256i evenHalf =
+      _mm256_and_si256(_mm256_srli_epi16(_mm256_add_epi16(x, t.exactOffset), 1), t.exactBit);
+  const __m256i n = _mm256_add_epi16(_mm256_add_epi16(_mm256_mullo_epi16(x, t.m), t.c), evenHalf);
+  // floor(n / 50) for n up to 12775.
+  return _mm256_srli_epi16(_mm256_mulhi_epu16(n, _mm256_set1_epi16(-23592)), 5);  // 41944
+}
+
+// 16 pixels from their blended hue and saturation (0x00RRGGBB, pixels 0..7 in first and 8..15
+// in second) and lightness (16-bit lanes): two registers of pixels 0xFFRRGGBB.
+QUILLANE_AVX2_INLINE void Avx2Lighten16(__m256i first, __m256i second, __m256i l, __m256i& out0,
+                                        __m256i& out1) {
+  // Packing keeps 128-bit halves apart: the channels come out as pixels 0-3, 8-11, 4-7, 12-15,
+  // so the lightness is put in that order too, and unpacking at the end restores it.
+  const __m256i byte = _mm256_set1_epi32(0xFF);
+  const __m256i blue =
+      _mm256_packus_epi32(_mm256_and_si256(first, byte), _mm256_and_si256(second, byte));
+  const __m256i green = _mm256_packus_epi32(_mm256_and_si256(_mm256_srli_epi32(first, 8), byte),
+                                            _mm256_and_si256(_mm256_srli_epi32(second, 8), byte));
+  const __m256i red =
+      _mm256_packus_epi32(_mm256_srli_epi32(first, 16), _mm256_srli_epi32(second, 16));
+  const LightTerms t = LightTermsOf(_mm256_permute4x64_epi64(l, 0xD8));
+  const __m256i blueGreen =
+      _mm256_or_si256(LightBlend(blue, t), _mm256_slli_epi16(LightBlend(green, t), 8));
+  const __m256i redAlpha = _mm256_or_si256(LightBlend(red, t), _mm256_set1_epi16(-256));
+  out0 = _mm256_unpacklo_epi16(blueGreen, redAlpha);
+  out1 = _mm256_unpackhi_epi16(blueGreen, redAlpha);
+}
+
+// 8 values of 32-bit lanes as 16-bit numbers.
+QUILLANE_AVX2_INLINE void Store16(std::uint16_t* to, __m256i v) {
+  _mm_storeu_si128(reinterpret_cast<__m128i*>(to),
+                   _mm_packus_epi32(_mm256_castsi256_si128(v), _mm256_extracti128_si256(v, 1)));
+}
+
+QUILLANE_AVX2_INLINE __m256i Load256(const void* p) {
+  return _mm256_loadu_si256(static_cast<const __m256i*>(p));
+}
+
+// Pixels per chunk: the chunk's colours, lightness and result take about 4 KB.
+constexpr int kChunk = 256;
+
+// A chunk of a row at a time: H, S and L of every pixel (the halves put right) and the
+// lightness from its source; then the changed hue and saturation from the table, and the
+// lightness blend 16 pixels per step.
+template <LightnessFrom kFrom>
+QUILLANE_AVX2 void Avx2Row(const HslChange& change, const std::uint32_t* hueSaturation,
+                           const Pixel* in, Pixel* out, int width, const LightnessSource& source) {
+  alignas(32) std::uint16_t colour[kChunk + 16];  // H * 101 + S
+  alignas(32) std::uint16_t lightness[kChunk + 16];
+  alignas(32) std::uint32_t coloured[kChunk + 16];
+  alignas(32) std::uint32_t pixels[kChunk + 16];
+  std::int16_t halves[kChunk + 16];
+  const __m256i moveL = _mm256_set1_epi16(static_cast<std::int16_t>(change.lightnessShift));
+  for (int x0 = 0; x0 < width; x0 += kChunk) {
+    const int n = std::min(kChunk, width - x0);
+    int halfCount = 0;
+    int i = 0;
+    for (; i + 8 <= n; i += 8) {
+      const HslLanes c = Avx2Hsl8(in + x0 + i);
+      __m256i l = c.l;
+      if constexpr (kFrom == LightnessFrom::Shifted) {
+        const __m256i shift = _mm256_cvtepi16_epi32(
+            _mm_loadu_si128(reinterpret_cast<const __m128i*>(source.shift + x0 + i)));
+        l = _mm256_min_epi32(_mm256_max_epi32(_mm256_add_epi32(l, shift), _mm256_setzero_si256()),
+                             _mm256_set1_epi32(100));
+      }
+      Store16(colour + i, _mm256_add_epi32(_mm256_mullo_epi32(c.h, _mm256_set1_epi32(101)), c.s));
+      Store16(lightness + i, l);
+      // The positions of the halves are listed without a branch per pixel.
+      _mm_storeu_si128(
+          reinterpret_cast<__m128i*>(halves + halfCount),
+          _mm_add_epi16(_mm_cvtepu8_epi16(_mm_loadl_epi64(
+                            reinterpret_cast<const __m128i*>(kSetBits[c.halves].data()))),
+                        _mm_set1_epi16(static_cast<std::int16_t>(i))));
+      halfCount += __builtin_popcount(c.halves);
+    }
+    PutHalves(in + x0, halves, halfCount, colour);
+    for (; i < n; ++i) {
+      const Pixel p = in[x0 + i];
+      const Hsl c = RgbToHsl(p.r, p.g, p.b);
+      colour[i] = static_cast<std::uint16_t>(c.h * 101 + c.s);
+      lightness[i] = static_cast<std::uint16_t>(
+          kFrom == LightnessFrom::Shifted ? LightnessAt<kFrom>(source, x0 + i, c.l) : c.l);
+    }
+    for (i = 0; i < n; ++i) {
+      coloured[i] = hueSaturation[colour[i]];
+      if constexpr (kFrom == LightnessFrom::Levelled)
+        lightness[i] = source.byLevel[source.level[x0 + i] * 101 + lightness[i]];
+    }
+    // The last step of 16 may reach past the chunk's end: it works on zeros there.
+    for (i = n; i < n + 16; ++i) {
+      coloured[i] = 0;
+      lightness[i] = 0;
+    }
+
+    for (i = 0; i < n; i += 16) {
+      const __m256i l = _mm256_min_epi16(
+          _mm256_max_epi16(_mm256_add_epi16(Load256(lightness + i), moveL), _mm256_setzero_si256()),
+          _mm256_set1_epi16(100));
+      __m256i first, second;
+      Avx2Lighten16(Load256(coloured + i), Load256(coloured + i + 8), l, first, second);
+      _mm256_store_si256(reinterpret_cast<__m256i*>(pixels + i), first);
+      _mm256_store_si256(reinterpret_cast<__m256i*>(pixels + i + 8), second);
+    }
+    // The result goes past the caches: streaming stores spare reading each line of it before
+    // writing it.
+    auto* dst = reinterpret_cast<std::uint8_t*>(out + x0);
+    i = 0;
+    for (; i < n && reinterpret_cast<std::uintptr_t>(dst + 4 * i) % 32 != 0; ++i)
+      std::memcpy(dst + 4 * i, pixels + i, 4);
+    for (; i + 8 <= n; i += 8)
+      _mm256_stream_si256(reinterpret_cast<__m256i*>(dst + 4 * i), Load256(pixels + i));
+    for (; i < n; ++i) std::memcpy(dst + 4 * i, pixels + i, 4);
+  }
+  _mm_sfence();
+}
+#endif
+
+template <LightnessFrom kFrom>
+void ChangeRow(const HslChange& change, const std::uint32_t* hueSaturation,
+               const std::uint8_t* lightRows, const Pixel* in, Pixel* out, int width,
+               const LightnessSource& source) {
+#if defined(__x86_64__) && defined(__GNUC__)
+  if (UseAvx2()) return Avx2Row<kFrom>(change, hueSaturation, in, out, width, source);
+#endif
+  PlainRow<kFrom>(hueSaturation, lightRows, in, out, 0, width, source);
+}
+
+}  // namespace
+
+void RgbToHslRow(const Pixel* in, Hsl* out, int n) {
+#if defined(__x86_64__) && defined(__GNUC__)
+  if (UseAvx2()) return Avx2HslRow(in, out, n);
+#endif
+  PlainHslRow(in, out, n);
+}
+
+HslRowChanger::HslRowChanger(const HslChange& wanted)
+    : hueSaturation_(360 * 101), lightRows_(101 * 256) {
+  // Shifts beyond 100 either way leave every value at a limit, as 100 does.
+  change_.hueTurn = (wanted.hueTurn % 360 + 360) % 360;
+  change_.saturationShift = std::clamp(wanted.saturationShift, -100, 100);
+  change_.lightnessShift = std::clamp(wanted.lightnessShift, -100, 100);
+  const HslChange& change = change_;
+  const HslTables& t = HslToRgbTables();
+  const auto limited = [](int v) { return std::clamp(v, 0, 100); };
+  for (int h = 0; h < 360; ++h) {
+    const std::uint8_t* hue = t.hue[((h + change.hueTurn) % 360 + 360) % 360];
+    for (int s = 0; s < 101; ++s) {
+      const std::uint8_t* sat = t.saturation[limited(s + change.saturationShift)];
+      hueSaturation_[static_cast<std::size_t>(h * 101 + s)] =
+          static_cast<std::uint32_t>(sat[hue[0]]) << 16 |
+          static_cast<std::uint32_t>(sat[hue[1]]) << 8 | sat[hue[2]];
+    }
+  }
+  for (int l = 0; l <= 100; ++l)
+    std::memcpy(&lightRows_[static_cast<std::size_t>(l) * 256],
+                t.lightness[limited(l + change.lightnessShift)], 256);
+}
+
+void HslRowChanger::Row(const Pixel* in, Pixel* out, int width,
+                        const std::int16_t* lightnessShift) const {
+  LightnessSource source;
+  source.shift = lightnessShift;
+  if (lightnessShift == nullptr)
+    ChangeRow<LightnessFrom::Own>(change_, hueSaturation_.data(), lightRows_.data(), in, out, width,
+                                  source);
+  else
+    ChangeRow<LightnessFrom::Shifted>(change_, hueSaturation_.data(), lightRows_.data(), in, out,
+                                      width, source);
+}
+
+void HslRowChanger::RowWithLevels(const Pixel* in, Pixel* out, int width,
+                                  const std::uint8_t* levels,
+                                  const LightnessByLevel& lightness) const {
+  LightnessSource source;
+  source.level = levels;
+  source.byLevel = lightness.at.data();
+  ChangeRow<LightnessFrom::Levelled>(change_, hueSaturation_.data(), lightRows_.data(), in, out,
+                                     width, source);
+}
+
+}  // namespace quillane
