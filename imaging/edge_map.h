@@ -32,6 +32,11 @@ TBitmap32 GrayEdgeLevels(const TBitmap32& source, const std::array<std::uint8_t,
 // edge map or its gray values. For sources of at least 3 by 3.
 void GrayEdgeCells(const TBitmap32& source, int y, int level, std::uint8_t* cells);
 
+// Row y of the edge map's gray values (GrayValue of what picsobel makes of a copy of source)
+// into gray[0 .. width - 1], from source's rows y - 1 to y + 1 alone, for passes that use them
+// beside the picture itself. For sources of at least 3 by 3; any thread, any order of rows.
+void GrayEdgeRow(const TBitmap32& source, int y, std::uint8_t* gray);
+
 // The same edge map computed the plain way, pixel by pixel and channel by channel from a
 // snapshot, border columns, border rows, then the inversion. picsobel must equal it byte for
 // byte, alpha included; it is kept as the oracle for the banded, threaded fast path. For

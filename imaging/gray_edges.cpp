@@ -290,6 +290,10 @@ void GrayEdgeCells(const TBitmap32& source, int y, int level, std::uint8_t* cell
   EdgeRowLevels(ChooseCells(), source, y, std::clamp(level, -1, 255), cells);
 }
 
+void GrayEdgeRow(const TBitmap32& source, int y, std::uint8_t* gray) {
+  EdgeRowLevels(ChooseLevels(), source, y, 0, gray);
+}
+
 TBitmap32 GrayEdgeLevels(const TBitmap32& source, const std::array<std::uint8_t, 256>& levels) {
   const int w = source.Width();
   const int h = source.Height();

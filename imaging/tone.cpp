@@ -173,9 +173,9 @@ inline Rgb TableHslToRgb(const HslTables& t, int h, int s, int l) {
 // For each red and green level, whether an exact half rounds up, for the (at most three) blue
 // levels that make one: bit i for the blue level 100 i + (the smallest such level). Filled
 // once; every entry compares the extended-precision sum with the half as Round would.
-const std::array<std::uint8_t, 65536>& HalfRoundsUp() {
+const std::array<std::uint8_t, 65536 + 4>& HalfRoundsUp() {
   static const auto table = [] {
-    std::array<std::uint8_t, 65536> t{};
+    std::array<std::uint8_t, 65536 + 4> t{};
     for (int r = 0; r < 256; ++r)
       for (int g = 0; g < 256; ++g) {
         // 11 b = 50 - 30 r - 59 g (mod 100), and 91 is the inverse of 11 modulo 100.
@@ -243,6 +243,10 @@ bool IsByte(int v) {
 }
 
 }  // namespace
+
+const std::uint8_t* GrayHalfRoundsUp() {
+  return HalfRoundsUp().data();
+}
 
 std::uint8_t GrayValueOfHalf(int r, int g, int b) {
   const int k = (30 * r + 59 * g + 11 * b) / 100;

@@ -101,6 +101,10 @@ void ConvertToGray(TBitmap32& bitmap);
 // where only the extended-precision sum's own rounding decides; from a table.
 std::uint8_t GrayValueOfHalf(int r, int g, int b);
 
+// What GrayValueOfHalf reads: entry R * 256 + G has bit b / 100 set when the exact half of the
+// blue level b rounds up. Padded so that four bytes can be read at any entry.
+const std::uint8_t* GrayHalfRoundsUp();
+
 // The gray values (GrayValue) of count pixels, one byte each.
 void GrayLevels(const Pixel* in, std::uint8_t* out, int count);
 

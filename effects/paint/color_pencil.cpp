@@ -6,7 +6,6 @@
 #include <vector>
 
 #include "effects/registry.h"
-#include "imaging/edge_gray_rows.h"
 #include "imaging/edge_map.h"
 #include "imaging/numeric.h"
 #include "imaging/parallel.h"
@@ -67,7 +66,7 @@ void ColorSketchInto(const TBitmap32& source, int pressure, TBitmap32& out) {
   ParallelRows(0, h, static_cast<std::size_t>(w) * 16, [&](int y0, int y1) {
     std::vector<std::uint8_t> gray(static_cast<std::size_t>(w));
     for (int y = y0; y < y1; ++y) {
-      EdgeGrayRow(source, y, gray.data());
+      GrayEdgeRow(source, y, gray.data());
       changer.RowWithLevels(source.ScanLine(y), out.ScanLine(y), w, gray.data(), lightness);
     }
   });

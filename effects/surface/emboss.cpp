@@ -4,7 +4,6 @@
 #include "effects/surface/emboss.h"
 
 #include <algorithm>
-#include <array>
 #include <cstdint>
 #include <cstdlib>
 #include <cstring>
@@ -41,23 +40,6 @@ void PlainReliefRow(const Pixel* p, const Pixel* q, int n, int lift, Pixel* out)
 }
 
 #if defined(__x86_64__) && defined(__GNUC__)
-// For each red and green level, whether an exact half of the gray sum rounds up, for the (at
-// most three) blue levels that make one: bit b / 100 for the blue level b. Padded for reading
-// four bytes at any entry.
-const std::uint8_t* HalfRoundsUp() {
-  static const auto table = [] {
-    std::array<std::uint8_t, 65536 + 4> t{};
-    for (int r = 0; r < 256; ++r)
-      for (int g = 0; g < 256; ++g)
-        // 11 b = 50 - 30 r - 59 g (mod 100), and 91 is the inverse of 11 modulo 100.
-        for (int b = (((50 - 30 * r - 59 * g) % 100 + 100) * 91) % 100; b < 256; b += 100)
-          if (GrayValueOfHalf(r, g, b) > (30 * r + 59 * g + 11 * b) / 100)
-            t[static_cast<std::size_t>(r << 8 | g)] |= static_cast<std::uint8_t>(1 << (b / 100));
-    return t;
-  }();
-  return table.data();
-}
-
 // The relief bytes of eight pixels. In saturating byte arithmetic, with lift 0..255, exactly
 // one of (p -sat q +sat lift) -sat (q -sat p) and (q -sat p) -sat lift can be above 0, and it
 // is min(255, |p - q + lift|).
@@ -144,7 +126,7 @@ const std::uint8_t* HalfRoundsUp() {
   const auto* pb = reinterpret_cast<const std::uint8_t*>(p);
   const auto* qb = reinterpret_cast<const std::uint8_t*>(q);
   auto* dst = reinterpret_cast<std::uint8_t*>(out);
-  const std::uint8_t* table = HalfRoundsUp();
+  const std::uint8_t* table = GrayHalfRoundsUp();
   const __m256i l = _mm256_set1_epi8(static_cast<char>(lift));
   const int end = 4 * n;
   __m256i gray0, gray1;
@@ -169,10 +151,7 @@ using ReliefRow = void (*)(const Pixel*, const Pixel*, int, int, Pixel*);
 // variant.
 ReliefRow ChooseReliefRow(int lift) {
 #if defined(__x86_64__) && defined(__GNUC__)
-  if (UseAvx2() && lift >= 0 && lift <= 255) {
-    HalfRoundsUp();
-    return Avx2ReliefRow;
-  }
+  if (UseAvx2() && lift >= 0 && lift <= 255) return Avx2ReliefRow;
 #endif
   (void)lift;
   return PlainReliefRow;

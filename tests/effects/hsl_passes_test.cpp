@@ -9,7 +9,6 @@
 #include "effects/adjust/hsl_adjust.h"
 #include "effects/paint/color_pencil.h"
 #include "effects/surface/texture.h"
-#include "imaging/edge_gray_rows.h"
 #include "imaging/edge_map.h"
 #include "imaging/numeric.h"
 #include "imaging/parallel.h"
@@ -123,7 +122,7 @@ TEST(HslPasses, EdgeGrayRowsAreTheGrayOfTheEdgeMap) {
       SetAvx2Allowed(avx2);
       std::vector<std::uint8_t> gray(static_cast<std::size_t>(w));
       for (int y = 0; y < h; ++y) {
-        EdgeGrayRow(source, y, gray.data());
+        GrayEdgeRow(source, y, gray.data());
         for (int x = 0; x < w; ++x) {
           const Pixel e = edges.At(x, y);
           ASSERT_EQ(gray[static_cast<std::size_t>(x)], GrayValue(e.r, e.g, e.b))
