@@ -61,6 +61,11 @@ TEST(LineArtFastPath, EqualsThePlainStepsAtAwkwardSizes) {
               << "colour " << colour;
       }
   });
+  const TBitmap32 none;
+  EXPECT_EQ(PenSketch(none, 9), PenSketchReference(none, 9));
+  EXPECT_EQ(Vuzorar(none, 9, 3, HatchDirection(2)),
+            VuzorarReference(none, 9, 3, HatchDirection(2)));
+  EXPECT_EQ(Pen_and_Ink(none, 9, true), PenAndInkReference(none, 9, true));
 }
 
 // The integer threshold can only differ from the extended gray next to an exact half, where
