@@ -24,26 +24,17 @@ TBitmap32 Picture(int w, int h, unsigned seed) {
   return b;
 }
 
-TEST(ColourFastPath, FilterEqualsThePlainOne) {
+// Six filter kinds and six panel layouts, each against its plain form.
+TEST(ColourFastPath, FilterAndPanelEqualThePlainOnes) {
   ForEachSplit([&] {
     unsigned seed = 0;
     for (const auto& [w, h] : kAwkwardSizes) {
       const TBitmap32 in = Picture(w, h, ++seed);
-      for (int k = 1; k <= 6; ++k)
-        ASSERT_EQ(filter(in, ColorFilterKind(k)), FilterReference(in, ColorFilterKind(k)))
-            << w << "x" << h << " kind " << k;
-    }
-  });
-}
-
-TEST(ColourFastPath, PanelEqualsThePlainOneInEveryLayout) {
-  ForEachSplit([&] {
-    unsigned seed = 100;
-    for (const auto& [w, h] : kAwkwardSizes) {
-      const TBitmap32 in = Picture(w, h, ++seed);
-      for (int layout = 1; layout <= 6; ++layout)
-        ASSERT_EQ(ColorPanel(in, PanelLayout(layout)), ColorPanelReference(in, PanelLayout(layout)))
-            << w << "x" << h << " layout " << layout;
+      for (int k = 1; k <= 6; ++k) {
+        SCOPED_TRACE(::testing::Message() << w << "x" << h << " kind or layout " << k);
+        ASSERT_EQ(filter(in, ColorFilterKind(k)), FilterReference(in, ColorFilterKind(k)));
+        ASSERT_EQ(ColorPanel(in, PanelLayout(k)), ColorPanelReference(in, PanelLayout(k)));
+      }
     }
   });
 }
