@@ -1,4 +1,4 @@
-// JPEG decoding of every kind of file libjpeg can write, and refusal of broken ones.
+// JPEG decoding of baseline, progressive, gray and ink files, and refusal of broken ones.
 #include <cstddef>
 #include <cstdio>
 // clang-format off
@@ -97,18 +97,13 @@ void ExpectQuadrants(const TBitmap32& picture, int tolerance) {
   }
 }
 
-TEST(JpegDecoder, ReadsBaselineProgressiveSubsampledAndRestartFiles) {
+TEST(JpegDecoder, ReadsBaselineAndProgressiveFiles) {
   constexpr int w = 64, h = 48;
   const auto rgb = [](int x, int y, int c) { return RgbQuadrant(x, y, c, w, h); };
-  std::vector<JpegOptions> kinds;
-  kinds.push_back({});                        // baseline 4:2:0
-  kinds.push_back({.progressive = true});     // progressive
-  kinds.push_back({.lumaH = 1, .lumaV = 1});  // 4:4:4
-  kinds.push_back({.lumaH = 2, .lumaV = 1});  // 4:2:2
-  kinds.push_back({.lumaH = 1, .lumaV = 2});  // 4:4:0
-  kinds.push_back({.restartRows = 1});        // restart markers every MCU row
-  kinds.push_back({.progressive = true, .lumaH = 1, .lumaV = 2, .restartRows = 2});
-  kinds.push_back({.stored = JCS_RGB, .lumaH = 1, .lumaV = 1});  // RGB without conversion
+  // Progressive files are sized with their coefficient buffer; the other samplings, restart
+  // intervals and stored colour spaces are libjpeg's own business.
+  const JpegOptions kinds[] = {
+      {}, {.progressive = true}, {.progressive = true, .lumaH = 1, .lumaV = 2, .restartRows = 2}};
   for (const JpegOptions& options : kinds) {
     const TBitmap32 picture = DecodeJpeg(WriteJpeg(w, h, options, rgb));
     ASSERT_EQ(picture.Width(), w);
@@ -118,15 +113,13 @@ TEST(JpegDecoder, ReadsBaselineProgressiveSubsampledAndRestartFiles) {
 }
 
 TEST(JpegDecoder, GrayscaleGivesEqualChannels) {
-  const auto ramp = [](int x, int, int) { return x * 4; };
   const TBitmap32 picture =
-      DecodeJpeg(WriteJpeg(64, 8, {.input = JCS_GRAYSCALE, .stored = JCS_GRAYSCALE}, ramp));
+      DecodeJpeg(WriteJpeg(64, 8, {.input = JCS_GRAYSCALE, .stored = JCS_GRAYSCALE},
+                           [](int x, int, int) { return x * 4; }));
   for (int x = 0; x < 64; ++x) {
     const Pixel p = picture.At(x, 3);
-    EXPECT_EQ(p.r, p.g);
-    EXPECT_EQ(p.g, p.b);
+    EXPECT_EQ(p, (Pixel{p.r, p.r, p.r, 255})) << x;
     EXPECT_NEAR(p.r, x * 4, 3);
-    EXPECT_EQ(p.a, 255);
   }
 }
 

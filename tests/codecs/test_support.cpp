@@ -153,8 +153,7 @@ void LimitAddressSpaceGrowth(std::uint64_t extraBytes) {
 
 std::vector<std::uint8_t> GifFile(int screenWidth, int screenHeight, int left, int top, int width,
                                   int height, const std::vector<std::uint8_t>& paletteRgb,
-                                  const std::vector<std::uint8_t>& indices, int transparent,
-                                  bool interlaced) {
+                                  const std::vector<std::uint8_t>& indices, int transparent) {
   int sizeBits = 1;
   while ((3u << sizeBits) < paletteRgb.size()) ++sizeBits;
   std::vector<std::uint8_t> palette = paletteRgb;
@@ -165,7 +164,7 @@ std::vector<std::uint8_t> GifFile(int screenWidth, int screenHeight, int left, i
   if (transparent >= 0) {
     w.U8(0x21).U8(0xF9).U8(4).U8(1).U16(0).U8(transparent).U8(0);
   }
-  w.U8(0x2C).U16(left).U16(top).U16(width).U16(height).U8(interlaced ? 0x40 : 0);
+  w.U8(0x2C).U16(left).U16(top).U16(width).U16(height).U8(0);
   const int minCodeSize = std::max(2, sizeBits);
   w.U8(minCodeSize);
   const std::vector<std::uint8_t> data = LzwLiterals(indices, minCodeSize);

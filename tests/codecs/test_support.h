@@ -102,7 +102,6 @@ std::vector<std::uint8_t> BmpInfoHeader(int headerSize, int width, int height, i
 // GIF: a palette of RGB triples, indices row by row; transparent < 0 for none.
 std::vector<std::uint8_t> GifFile(int screenWidth, int screenHeight, int left, int top, int width,
                                   int height, const std::vector<std::uint8_t>& paletteRgb,
-                                  const std::vector<std::uint8_t>& indices, int transparent,
-                                  bool interlaced);
+                                  const std::vector<std::uint8_t>& indices, int transparent);
 
 }  // namespace quillane::testing

@@ -7,24 +7,10 @@
 #include "effects/adjust/color_filter.h"
 #include "effects/adjust/color_panel.h"
 #include "effects/surface/stria.h"
-#include "imaging/parallel.h"
-#include "imaging/vector_dispatch.h"
-#include "tests/imaging/random_picture.h"
+#include "tests/imaging/fast_path_support.h"
 
 namespace quillane {
 namespace {
-
-class Variant {
- public:
-  Variant(RowSplit split, bool avx2) {
-    SetRowSplit(split);
-    SetAvx2Allowed(avx2);
-  }
-  ~Variant() {
-    SetRowSplit({});
-    SetAvx2Allowed(true);
-  }
-};
 
 // Random colours; alpha 0 or 255 in most pixels, so that stria meets every case.
 TBitmap32 Picture(int w, int h, unsigned seed) {
@@ -38,36 +24,19 @@ TBitmap32 Picture(int w, int h, unsigned seed) {
   return b;
 }
 
-constexpr std::pair<int, int> kSizes[] = {{1, 1},   {1, 9},  {9, 1},   {2, 2},  {3, 3},
-                                          {4, 5},   {5, 4},  {6, 7},   {17, 9}, {18, 3},
-                                          {33, 31}, {40, 6}, {71, 12}, {3, 70}, {100, 100}};
-constexpr std::pair<RowSplit, bool> kVariants[] = {
-    {RowSplit{1, kParallelThreshold}, true}, {RowSplit{7, 0}, true}, {RowSplit{4, 0}, false}};
-
-TEST(ColourFastPath, FilterEqualsThePlainOne) {
-  for (const auto& [split, avx2] : kVariants) {
-    const Variant variant(split, avx2);
+// Six filter kinds and six panel layouts, each against its plain form.
+TEST(ColourFastPath, FilterAndPanelEqualThePlainOnes) {
+  ForEachSplit([&] {
     unsigned seed = 0;
-    for (const auto& [w, h] : kSizes) {
+    for (const auto& [w, h] : kAwkwardSizes) {
       const TBitmap32 in = Picture(w, h, ++seed);
-      for (int k = 1; k <= 6; ++k)
-        ASSERT_EQ(filter(in, ColorFilterKind(k)), FilterReference(in, ColorFilterKind(k)))
-            << w << "x" << h << " kind " << k << " avx2 " << avx2;
+      for (int k = 1; k <= 6; ++k) {
+        SCOPED_TRACE(::testing::Message() << w << "x" << h << " kind or layout " << k);
+        ASSERT_EQ(filter(in, ColorFilterKind(k)), FilterReference(in, ColorFilterKind(k)));
+        ASSERT_EQ(ColorPanel(in, PanelLayout(k)), ColorPanelReference(in, PanelLayout(k)));
+      }
     }
-  }
-}
-
-TEST(ColourFastPath, PanelEqualsThePlainOneInEveryLayout) {
-  for (const auto& [split, avx2] : kVariants) {
-    const Variant variant(split, avx2);
-    unsigned seed = 100;
-    for (const auto& [w, h] : kSizes) {
-      const TBitmap32 in = Picture(w, h, ++seed);
-      for (int layout = 1; layout <= 6; ++layout)
-        ASSERT_EQ(ColorPanel(in, PanelLayout(layout)), ColorPanelReference(in, PanelLayout(layout)))
-            << w << "x" << h << " layout " << layout << " avx2 " << avx2;
-    }
-  }
+  });
 }
 
 TEST(ColourFastPath, StriaEqualsThePlainOne) {
@@ -82,19 +51,18 @@ TEST(ColourFastPath, StriaEqualsThePlainOne) {
                         {StriaDirection::Horizontal, 2, 1, 200, 0xFFFFFF, 0},
                         {StriaDirection::Horizontal, 1, 1, 255, 0x123456, 1},
                         {StriaDirection::Vertical, 100, 255, 77, 0x00FF00, -3}};
-  for (const auto& [split, avx2] : kVariants) {
-    const Variant variant(split, avx2);
+  ForEachSplit([&] {
     unsigned seed = 200;
-    for (const auto& [w, h] : kSizes) {
+    for (const auto& [w, h] : kAwkwardSizes) {
       const TBitmap32 in = Picture(w, h, ++seed);
       for (const Case& c : cases)
         ASSERT_EQ(stria(in, w - c.layerShrink, h - c.layerShrink, c.direction, c.thickness, c.space,
                         c.transparency, c.colour),
                   StriaReference(in, w - c.layerShrink, h - c.layerShrink, c.direction, c.thickness,
                                  c.space, c.transparency, c.colour))
-            << w << "x" << h << " thickness " << c.thickness << " avx2 " << avx2;
+            << w << "x" << h << " thickness " << c.thickness;
     }
-  }
+  });
 }
 
 }  // namespace

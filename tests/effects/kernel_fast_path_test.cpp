@@ -10,32 +10,10 @@
 #include "effects/paint/realism.h"
 #include "effects/surface/emboss.h"
 #include "imaging/numeric.h"
-#include "imaging/parallel.h"
-#include "imaging/vector_dispatch.h"
-#include "tests/imaging/random_picture.h"
+#include "tests/imaging/fast_path_support.h"
 
 namespace quillane {
 namespace {
-
-// Splits rows as given, with or without the AVX2 variants, while it lives.
-struct Variant {
-  Variant(RowSplit split, bool avx2) {
-    SetRowSplit(split);
-    SetAvx2Allowed(avx2);
-  }
-  ~Variant() {
-    SetRowSplit({});
-    SetAvx2Allowed(true);
-  }
-};
-const std::pair<RowSplit, bool> kVariants[] = {
-    {{1, kParallelThreshold}, true}, {{7, 0}, true}, {{3, 0}, false}};
-
-// Widths around the 8- and 16-pixel vectors and the plain variant's 256-pixel rounds; heights
-// below the number of bands.
-const std::pair<int, int> kSizes[] = {{1, 1},  {1, 7},  {7, 1},  {2, 5},   {5, 2},   {3, 3},
-                                      {9, 4},  {10, 3}, {11, 9}, {17, 2},  {18, 5},  {19, 3},
-                                      {40, 6}, {45, 8}, {77, 3}, {259, 4}, {300, 11}};
 
 // Black and white in stripes and checks: the largest sums of either sign.
 TBitmap32 Extremes(int w, int h) {
@@ -63,32 +41,30 @@ TEST(KernelFastPath, EqualsTheReferencesAtAwkwardSizes) {
                             {200, 0, 0, 0, -90},
                             {8421504},
                             {-4210752, 0, 0, 0, 0, 0, 0, 0, -4210752}};
-  for (const auto& [split, avx2] : kVariants) {
-    const Variant variant(split, avx2);
+  ForEachSplit([&] {
     unsigned seed = 0;
-    for (const auto& [w, h] : kSizes)
+    for (const auto& [w, h] : kAwkwardSizes)
       for (const TBitmap32& in : {RandomPicture(w, h, ++seed), Extremes(w, h)})
         for (const Kernel& k : kernels) {
-          ASSERT_EQ(realism(in, k), ConvolveReference(in, k, 1))
-              << w << "x" << h << " avx2 " << avx2 << " k0 " << k[0];
+          SCOPED_TRACE(::testing::Message() << w << "x" << h << " k0 " << k[0]);
+          ASSERT_EQ(realism(in, k), ConvolveReference(in, k, 1));
           ASSERT_EQ(doabstract(in, k), KernelGradientReference(in, k, Gradient::LeftMinusRight));
           ASSERT_EQ(popart(in, k), KernelGradientReference(in, k, Gradient::RightMinusLeftSobel));
         }
-  }
+  });
 }
 
 TEST(EmbossFastPath, EqualsTheReferenceAtAwkwardSizes) {
-  for (const auto& [split, avx2] : kVariants) {
-    const Variant variant(split, avx2);
-    for (const auto& [w, h] : kSizes)
+  ForEachSplit([] {
+    for (const auto& [w, h] : kAwkwardSizes)
       for (int depth : {1, 2, 5})
         // The window's lightings, and beyond them those the byte arithmetic cannot take.
         for (int lighting : {0, 100, 200, 205, -51, 206}) {
           const TBitmap32 in = RandomPicture(w + depth, h + depth, static_cast<unsigned>(w + h));
           ASSERT_EQ(emboss(in, lighting, depth), EmbossReference(in, lighting, depth))
-              << w << "x" << h << " avx2 " << avx2 << " depth " << depth << " " << lighting;
+              << w << "x" << h << " depth " << depth << " " << lighting;
         }
-  }
+  });
 }
 
 // Every relief byte for lightings across the range the byte arithmetic takes, and the gray
@@ -105,7 +81,7 @@ TEST(EmbossFastPath, EveryReliefByteAndEveryGrayValueAsThePlainVariant) {
   };
   const auto same = [&in](int lighting) {
     const TBitmap32 fast = emboss(in, lighting, 1);
-    const Variant plain({}, false);
+    const FastPathVariant plain(false);
     return fast == emboss(in, lighting, 1);
   };
   const auto gray = [](int v) {

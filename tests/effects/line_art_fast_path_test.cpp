@@ -10,24 +10,10 @@
 #include "effects/mono/vuzorar.h"
 #include "imaging/edge_map.h"
 #include "imaging/numeric.h"
-#include "imaging/parallel.h"
-#include "imaging/vector_dispatch.h"
-#include "tests/imaging/random_picture.h"
+#include "tests/imaging/fast_path_support.h"
 
 namespace quillane {
 namespace {
-
-class Variant {
- public:
-  Variant(RowSplit split, bool avx2) {
-    SetRowSplit(split);
-    SetAvx2Allowed(avx2);
-  }
-  ~Variant() {
-    SetRowSplit({});
-    SetAvx2Allowed(true);
-  }
-};
 
 // Blotches of a few flat colours with a little grain: edge maps with strokes, flat paper and
 // mid-range values, and photographs with dark areas to outline.
@@ -54,18 +40,11 @@ int EdgeGrayAtCentre(const TBitmap32& in) {
 }
 
 TEST(LineArtFastPath, EqualsThePlainStepsAtAwkwardSizes) {
-  const std::pair<int, int> sizes[] = {{1, 1},  {1, 6},    {6, 1},    {2, 5},  {5, 2},
-                                       {3, 3},  {4, 3},    {3, 9},    {33, 4}, {35, 3},
-                                       {66, 7}, {101, 13}, {1027, 4}, {40, 23}};
-  for (const auto& [split, avx2] : {std::pair{RowSplit{1, kParallelThreshold}, true},
-                                    {RowSplit{5, 0}, true},
-                                    {RowSplit{3, 0}, false}}) {
-    const Variant variant(split, avx2);
+  ForEachSplit([] {
     unsigned seed = 0;
-    for (const auto& [w, h] : sizes)
+    for (const auto& [w, h] : kAwkwardSizes)
       for (const TBitmap32& in : {Blotches(w, h, ++seed), RandomPicture(w, h, ++seed, true)}) {
-        SCOPED_TRACE(::testing::Message() << w << "x" << h << " threads " << split.threads
-                                          << " avx2 " << avx2 << " seed " << seed);
+        SCOPED_TRACE(::testing::Message() << w << "x" << h << " seed " << seed);
         const int pressure = EdgeGrayAtCentre(in);
         ASSERT_EQ(PenSketch(in, pressure), PenSketchReference(in, pressure));
         for (int d = 1; d <= 4; ++d) {
@@ -81,7 +60,12 @@ TEST(LineArtFastPath, EqualsThePlainStepsAtAwkwardSizes) {
           ASSERT_EQ(Pen_and_Ink(in, threshold, colour), PenAndInkReference(in, threshold, colour))
               << "colour " << colour;
       }
-  }
+  });
+  const TBitmap32 none;
+  EXPECT_EQ(PenSketch(none, 9), PenSketchReference(none, 9));
+  EXPECT_EQ(Vuzorar(none, 9, 3, HatchDirection(2)),
+            VuzorarReference(none, 9, 3, HatchDirection(2)));
+  EXPECT_EQ(Pen_and_Ink(none, 9, true), PenAndInkReference(none, 9, true));
 }
 
 // The integer threshold can only differ from the extended gray next to an exact half, where
@@ -99,15 +83,13 @@ TEST(LineArtFastPath, InkThresholdIsTheExtendedGrayNextToEveryHalf) {
       }
   std::vector<std::uint8_t> gray(row.size()), cells(row.size());
   for (std::size_t i = 0; i < row.size(); ++i) gray[i] = InkGrayValue(row[i].r, row[i].g, row[i].b);
-  for (bool avx2 : {true, false}) {
-    const Variant variant({}, avx2);
+  ForEachAvx2([&] {
     for (int t = 0; t < 256; ++t) {
       InkThresholdCells(row.data(), static_cast<int>(row.size()), t, cells.data());
       for (std::size_t i = 0; i < row.size(); ++i)
-        ASSERT_EQ(cells[i], gray[i] > t ? 0xFF : 0)
-            << "threshold " << t << " avx2 " << avx2 << " pixel " << i;
+        ASSERT_EQ(cells[i], gray[i] > t ? 0xFF : 0) << "threshold " << t << " pixel " << i;
     }
-  }
+  });
 }
 
 }  // namespace

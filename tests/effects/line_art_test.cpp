@@ -1,47 +1,14 @@
-// Pen sketch, Vuzorar and Pen and ink: their documented cases, and the fast routines against
-// the plain steps at every awkward size.
+// Pen sketch, Vuzorar and Pen and ink: their documented cases. The fast routines are compared
+// with the plain steps in the fast-path tests.
 #include <gtest/gtest.h>
-
-#include <random>
 
 #include "effects/mono/pen_and_ink.h"
 #include "effects/mono/pen_sketch.h"
 #include "effects/mono/vuzorar.h"
+#include "tests/imaging/random_picture.h"
 
 namespace quillane {
 namespace {
-
-// Few levels per channel, so that thresholds and edges fall on every kind of pixel.
-TBitmap32 RandomPicture(int w, int h, unsigned seed, int levels) {
-  std::mt19937 rng(seed);
-  TBitmap32 b(w, h);
-  const auto v = [&] { return static_cast<std::uint8_t>(rng() % levels * (255 / (levels - 1))); };
-  for (Pixel* p = b.Data(); p != b.Data() + b.PixelCount(); ++p) *p = Pixel{v(), v(), v(), v()};
-  return b;
-}
-
-// Empty, single lines, no interior, one interior pixel, and large enough for several threads.
-const std::pair<int, int> kSizes[] = {{0, 0}, {1, 1}, {1, 7}, {7, 1},   {2, 5},    {5, 2},
-                                      {3, 3}, {3, 9}, {9, 3}, {37, 23}, {640, 480}};
-
-TEST(LineArt, FastRoutinesMatchThePlainSteps) {
-  unsigned seed = 0;
-  for (auto [w, h] : kSizes) {
-    SCOPED_TRACE(std::to_string(w) + "x" + std::to_string(h));
-    ++seed;
-    const TBitmap32 in = RandomPicture(w, h, seed, 2 + static_cast<int>(seed % 5));
-    const int level = static_cast<int>(seed * 37 % 256);
-    EXPECT_EQ(PenSketch(in, level), PenSketchReference(in, level));
-    for (int d = 1; d <= 4; ++d) {
-      const int scope = w > 100 ? 2 : 1 + (static_cast<int>(seed) + 3 * d) % 10;
-      const auto direction = static_cast<HatchDirection>(d);
-      EXPECT_EQ(Vuzorar(in, level, scope, direction), VuzorarReference(in, level, scope, direction))
-          << d;
-    }
-    for (bool colour : {false, true})
-      EXPECT_EQ(Pen_and_Ink(in, level, colour), PenAndInkReference(in, level, colour)) << colour;
-  }
-}
 
 TEST(PenSketch, AGrayValueEqualToThePressureIsInk) {
   TBitmap32 levels(3, 1);
@@ -96,7 +63,7 @@ TEST(PenAndInk, InkAreasBecomeTheirRim) {
   EXPECT_EQ(rim.At(4, 8), kPaper);
   EXPECT_EQ(Pen_and_Ink(line, 128, false), line);
   // Everything inked at 254: a frame, in the source's colours with colour ink.
-  const TBitmap32 in = RandomPicture(7, 5, 5, 256);
+  const TBitmap32 in = RandomPicture(7, 5, 5);
   const TBitmap32 frame = Pen_and_Ink(in, 254, true);
   for (int y = 0; y < 5; ++y)
     for (int x = 0; x < 7; ++x) {

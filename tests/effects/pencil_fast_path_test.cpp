@@ -6,10 +6,8 @@
 #include "effects/mono/bw_sketch.h"
 #include "imaging/edge_map.h"
 #include "imaging/numeric.h"
-#include "imaging/parallel.h"
 #include "imaging/tone.h"
-#include "imaging/vector_dispatch.h"
-#include "tests/imaging/random_picture.h"
+#include "tests/imaging/fast_path_support.h"
 
 namespace quillane {
 namespace {
@@ -29,19 +27,6 @@ TBitmap32 SoftPicture(int w, int h, unsigned seed) {
   return b;
 }
 
-// Splits rows as given, with or without the AVX2 variants, while it lives.
-class Variant {
- public:
-  Variant(RowSplit split, bool avx2) {
-    SetRowSplit(split);
-    SetAvx2Allowed(avx2);
-  }
-  ~Variant() {
-    SetRowSplit({});
-    SetAvx2Allowed(true);
-  }
-};
-
 struct Tone {
   PencilToneMode mode;
   int contrast;
@@ -52,24 +37,17 @@ constexpr Tone kTones[] = {{PencilToneMode::Contrast, 45, 0},  {PencilToneMode::
                            {PencilToneMode::Lighting, 0, 170}, {PencilToneMode::Lighting, 0, 90}};
 
 TEST(PencilFastPath, EqualsThePlainSketchAtAwkwardSizes) {
-  // Widths around the 32-pixel vector step and the 1024-pixel stretch (interior = width - 2);
-  // heights below the number of bands.
-  const std::pair<int, int> sizes[] = {{3, 3},    {4, 3},    {3, 9},   {5, 4},  {9, 5},
-                                       {33, 4},   {34, 5},   {35, 3},  {66, 7}, {101, 13},
-                                       {1026, 3}, {1027, 4}, {1060, 6}};
-  for (const auto& [split, avx2] : {std::pair{RowSplit{1, kParallelThreshold}, true},
-                                    {RowSplit{5, 0}, true},
-                                    {RowSplit{3, 0}, false}}) {
-    const Variant variant(split, avx2);
+  ForEachSplit([] {
     unsigned seed = 0;
-    for (const auto& [w, h] : sizes)
+    for (const auto& [w, h] : kAwkwardSizes) {
+      if (w < 3 || h < 3) continue;  // the next test takes those without an interior
       for (const TBitmap32& in : {SoftPicture(w, h, ++seed), RandomPicture(w, h, ++seed)})
         for (const Tone& t : kTones)
           ASSERT_EQ(peccilsketch(in, t.mode, t.contrast, t.lighting),
                     PencilSketchReference(in, t.mode, t.contrast, t.lighting))
-              << w << "x" << h << " threads " << split.threads << " avx2 " << avx2 << " lighting "
-              << t.lighting << " contrast " << t.contrast;
-  }
+              << w << "x" << h << " lighting " << t.lighting << " contrast " << t.contrast;
+    }
+  });
 }
 
 // Pictures without an interior pixel keep the results the passes gave them one by one.

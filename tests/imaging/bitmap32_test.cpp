@@ -6,7 +6,6 @@
 #include <cmath>
 #include <limits>
 #include <set>
-#include <tuple>
 
 namespace quillane {
 namespace {
@@ -47,8 +46,7 @@ TEST(TBitmap32, NewPixelsAreZeroAndResizeDiscardsContent) {
 TEST(TBitmap32, RowAccessOutsideTheRowsThrows) {
   TBitmap32 b(4, 3);
   const TBitmap32& cb = b;
-  EXPECT_NO_THROW(b.ScanLine(0));
-  EXPECT_NO_THROW(cb.ScanLine(2));
+  EXPECT_EQ(cb.ScanLine(2), b.ScanLine(0) + 8);
   for (int y : {-1, 3, INT_MIN, INT_MAX}) {
     EXPECT_THROW(b.ScanLine(y), ScanLineError) << y;
     EXPECT_THROW(cb.ScanLine(y), ScanLineError) << y;
@@ -60,7 +58,6 @@ TEST(TBitmap32, RowAccessOutsideTheRowsThrows) {
     EXPECT_STREQ(e.what(), "Scan line index out of range");
   }
   // Rows are contiguous and follow each other without padding.
-  EXPECT_EQ(b.ScanLine(1), b.ScanLine(0) + 4);
   EXPECT_EQ(b.ScanLine(0), b.Data());
   EXPECT_THROW(b.At(4, 0), std::out_of_range);
   EXPECT_THROW(b.At(-1, 0), std::out_of_range);
@@ -146,19 +143,6 @@ TEST(DrawOver, ClipsAtEverySide) {
   EXPECT_TRUE(target.Empty());
 }
 
-TEST(ZoomInandOut, UnitFactorsKeepThePictureAndNewSizesAreTruncated) {
-  TBitmap32 b = Numbered(7, 4);
-  ZoomInandOut(b, 1.0L, 1.0L);
-  EXPECT_EQ(b, Numbered(7, 4));
-  for (const auto& [w, h, hf, wf, nw, nh] :
-       {std::tuple{5, 3, 1.0L, 0.5L, 2, 3}, {10, 10, 0.99L, 1.55L, 15, 9}}) {
-    TBitmap32 c = Numbered(w, h);
-    ZoomInandOut(c, hf, wf);
-    EXPECT_EQ(c.Width(), nw);
-    EXPECT_EQ(c.Height(), nh);
-  }
-}
-
 TEST(ZoomInandOut, SizesOfZeroOrBelowOrNotANumberGiveEmpty) {
   const long double nan = std::numeric_limits<long double>::quiet_NaN();
   const long double inf = std::numeric_limits<long double>::infinity();
@@ -226,9 +210,9 @@ void ExpectNearestPixelResample(long double hf, long double wf) {
 }
 
 TEST(ZoomInandOut, NearestPixelCoversTheSource) {
-  // The last: two columns of 101.
-  const long double factors[][2] = {
-      {2.0L, 2.0L}, {0.5L, 0.5L}, {1.37L, 0.73L}, {0.3L, 2.49L}, {1.0L, 0.02L}};
+  // Unit factors keep every pixel; new sizes are truncated; the last: two columns of 101.
+  const long double factors[][2] = {{1.0L, 1.0L},   {2.0L, 2.0L},  {0.5L, 0.5L},
+                                    {1.37L, 0.73L}, {0.3L, 2.49L}, {1.0L, 0.02L}};
   for (auto [hf, wf] : factors) ExpectNearestPixelResample(hf, wf);
 }
 

@@ -10,15 +10,10 @@
 
 #include "imaging/gray_row.h"
 #include "imaging/numeric.h"
-#include "imaging/vector_dispatch.h"
+#include "tests/imaging/fast_path_support.h"
 
 namespace quillane {
 namespace {
-
-struct Avx2Allowed {
-  explicit Avx2Allowed(bool allowed) { SetAvx2Allowed(allowed); }
-  ~Avx2Allowed() { SetAvx2Allowed(true); }
-};
 
 // Alpha 0, 255 or anything.
 std::vector<Pixel> Pixels(int n, unsigned seed) {
@@ -36,8 +31,7 @@ std::vector<Pixel> Pixels(int n, unsigned seed) {
 TEST(GrayRow, EveryColourHasItsGrayValue) {
   // One row per red level, holding every green and blue level.
   std::vector<Pixel> in(65536), out(65536);
-  for (const bool avx2 : {true, false}) {
-    const Avx2Allowed allowed(avx2);
+  ForEachAvx2([&] {
     for (int r = 0; r < 256; ++r) {
       for (int i = 0; i < 65536; ++i)
         in[static_cast<std::size_t>(i)] =
@@ -47,25 +41,24 @@ TEST(GrayRow, EveryColourHasItsGrayValue) {
       for (int i = 0; i < 65536; ++i) {
         const std::uint8_t v = GrayValue(r, i >> 8, i & 0xFF);
         ASSERT_EQ(out[static_cast<std::size_t>(i)], (Pixel{v, v, v, 255}))
-            << "r " << r << " g " << (i >> 8) << " b " << (i & 0xFF) << " avx2 " << avx2;
+            << "r " << r << " g " << (i >> 8) << " b " << (i & 0xFF);
       }
     }
-  }
+  });
 }
 
 TEST(GrayRow, RaisedChannelsAtEveryAlignmentAndLength) {
   const std::vector<Pixel> in = Pixels(80, 1);
-  for (const bool avx2 : {true, false}) {
-    const Avx2Allowed allowed(avx2);
+  ForEachAvx2([&] {
     for (const std::uint32_t set : {0x00FF0000u, 0x0000FFFFu, 0x00FF00FFu})
       for (int offset = 0; offset < 8; ++offset)
         for (int n = 0; n <= 40; ++n) {
           std::vector<Pixel> fast(56, Pixel{1, 2, 3, 4}), plain = fast;
           GrayRowInto(in.data() + offset, fast.data() + offset, n, set);
           GrayRowIntoReference(in.data() + offset, plain.data() + offset, n, set);
-          ASSERT_EQ(fast, plain) << "offset " << offset << " n " << n << " avx2 " << avx2;
+          ASSERT_EQ(fast, plain) << "offset " << offset << " n " << n;
         }
-  }
+  });
 }
 
 TEST(TintRow, EqualsTintedPixelByPixel) {
@@ -74,8 +67,7 @@ TEST(TintRow, EqualsTintedPixelByPixel) {
                                {.add = 0x00505000, .clear = 0xFF0000FF},
                                {.add = 0x00000032, .set = 0x0000FF00}};
   const std::vector<Pixel> in = Pixels(100, 2), alphas = Pixels(50, 3);
-  for (const bool avx2 : {true, false}) {
-    const Avx2Allowed allowed(avx2);
+  ForEachAvx2([&] {
     for (const ChannelTint& tint : tints)
       for (const int stride : {1, 2})
         for (const bool withAlpha : {false, true})
@@ -88,10 +80,10 @@ TEST(TintRow, EqualsTintedPixelByPixel) {
                 Pixel want = Tinted(in[static_cast<std::size_t>(stride * x)], tint);
                 if (withAlpha) want.a = alphas[static_cast<std::size_t>(x)].a;
                 ASSERT_EQ(out[static_cast<std::size_t>(offset + x)], want)
-                    << "x " << x << " n " << n << " stride " << stride << " avx2 " << avx2;
+                    << "x " << x << " n " << n << " stride " << stride;
               }
             }
-  }
+  });
 }
 
 }  // namespace
