@@ -370,6 +370,15 @@ QUILLANE_AVX2 void Avx2Row(const HslChange& change, const std::uint32_t* hueSatu
         l = _mm256_min_epi32(_mm256_max_epi32(_mm256_add_epi32(l, shift), _mm256_setzero_si256()),
                              _mm256_set1_epi32(100));
       }
+      if constexpr (kFrom == LightnessFrom::Levelled) {
+        // Four bytes from each entry (the table is padded for it), the first of them kept.
+        const __m256i level = _mm256_cvtepu8_epi32(
+            _mm_loadl_epi64(reinterpret_cast<const __m128i*>(source.level + x0 + i)));
+        const __m256i at = _mm256_add_epi32(_mm256_mullo_epi32(level, _mm256_set1_epi32(101)), l);
+        l = _mm256_and_si256(
+            _mm256_i32gather_epi32(reinterpret_cast<const int*>(source.byLevel), at, 1),
+            _mm256_set1_epi32(0xFF));
+      }
       Store16(colour + i, _mm256_add_epi32(_mm256_mullo_epi32(c.h, _mm256_set1_epi32(101)), c.s));
       Store16(lightness + i, l);
       // The positions of the halves are listed without a branch per pixel.
@@ -385,14 +394,9 @@ QUILLANE_AVX2 void Avx2Row(const HslChange& change, const std::uint32_t* hueSatu
       const Pixel p = in[x0 + i];
       const Hsl c = RgbToHsl(p.r, p.g, p.b);
       colour[i] = static_cast<std::uint16_t>(c.h * 101 + c.s);
-      lightness[i] = static_cast<std::uint16_t>(
-          kFrom == LightnessFrom::Shifted ? LightnessAt<kFrom>(source, x0 + i, c.l) : c.l);
+      lightness[i] = static_cast<std::uint16_t>(LightnessAt<kFrom>(source, x0 + i, c.l));
     }
-    for (i = 0; i < n; ++i) {
-      coloured[i] = hueSaturation[colour[i]];
-      if constexpr (kFrom == LightnessFrom::Levelled)
-        lightness[i] = source.byLevel[source.level[x0 + i] * 101 + lightness[i]];
-    }
+    for (i = 0; i < n; ++i) coloured[i] = hueSaturation[colour[i]];
     // The last step of 16 may reach past the chunk's end: it works on zeros there.
     for (i = n; i < n + 16; ++i) {
       coloured[i] = 0;

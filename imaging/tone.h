@@ -120,9 +120,9 @@ struct HslChange {
 };
 
 // The new lightness that a per-pixel level (0..255, from a second picture) gives a colour's L:
-// at[level * 101 + L], each 0..100.
+// at[level * 101 + L], each 0..100. Padded so that four bytes can be read at any entry.
 struct LightnessByLevel {
-  std::array<std::uint8_t, 256 * 101> at{};
+  std::array<std::uint8_t, 256 * 101 + 3> at{};
 };
 
 // Applies a change row by row. Built once per picture (it holds tables of the change).

@@ -98,5 +98,34 @@ TEST(HslRowChanger, EveryHslComesBackAsTheTablesGiveIt) {
   }
 }
 
+// Every level with every L, each pair to its own entry, up to the table's last one.
+TEST(HslRowChanger, LevelsReachEveryEntryInBothVariants) {
+  AllowAvx2Afterwards restore;
+  std::vector<Pixel> grayOf(101);  // a gray of each L
+  for (int v = 0; v < 256; ++v)
+    grayOf[static_cast<std::size_t>(RgbToHsl(v, v, v).l)] = Colour(v, v, v);
+  LightnessByLevel byLevel;
+  std::vector<Pixel> in;
+  std::vector<std::uint8_t> level;
+  for (int k = 0; k < 256 * 101; ++k) {
+    byLevel.at[static_cast<std::size_t>(k)] = static_cast<std::uint8_t>(k * 37 % 101);
+    in.push_back(grayOf[static_cast<std::size_t>(k % 101)]);
+    level.push_back(static_cast<std::uint8_t>(k / 101));
+  }
+  std::vector<Pixel> out[2] = {std::vector<Pixel>(in.size()), std::vector<Pixel>(in.size())};
+  for (int v = 0; v < 2; ++v) {
+    SetAvx2Allowed(kVariants[v]);
+    HslRowChanger(HslChange{})
+        .RowWithLevels(in.data(), out[v].data(), static_cast<int>(in.size()), level.data(),
+                       byLevel);
+  }
+  for (std::size_t k = 0; k < in.size(); ++k) {
+    const int l = static_cast<int>(k * 37 % 101), g = HslToRgb(0, 0, l).r;
+    ASSERT_EQ(out[0][k], out[1][k]) << k;
+    const auto v = static_cast<std::uint8_t>(g);
+    ASSERT_EQ(out[1][k], (Pixel{v, v, v, 255})) << k;
+  }
+}
+
 }  // namespace
 }  // namespace quillane
