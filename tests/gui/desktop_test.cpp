@@ -1,7 +1,6 @@
 // The main window as a desktop program: keyboard, menus, drag and drop, the recent list, the
 // place of its tool windows, and the boxes and dialogs of the real platform.
 #include <QFileDialog>
-#include <QLineEdit>
 #include <QMessageBox>
 #include <QMimeData>
 #include <QSignalSpy>
@@ -107,17 +106,6 @@ TEST_F(Desktop, OpenRecentListsTheLastTenPicturesNewestFirstAndDropsMissingOnes)
   ScriptedPlatform otherPlatform;
   TMyPicture other(otherPlatform, TestPicture());
   EXPECT_EQ(Entries(RecentMenu(other)), expected);
-}
-
-TEST_F(Desktop, ToolWindowKeysAndBatchFieldTooltips) {
-  Main().SetInputFolder(Path(QString(120, 'x')));
-  Main().OpenTool(15);
-  EXPECT_EQ(ToolChild<QLineEdit>(15, "Edit10")->toolTip(), Path(QString(120, 'x')));
-  QTest::keyClick(&Tool(15), Qt::Key_Return);
-  EXPECT_EQ(Main().StatusText(), "Emboss");
-  QTest::keyClick(&Tool(15), Qt::Key_Escape);
-  EXPECT_FALSE(Tool(15).isVisible());
-  EXPECT_EQ(Main().ActiveTool(), 0);
 }
 
 TEST_F(Desktop, GoOutputFolderSaysSoWhenNoFileManagerStarts) {
