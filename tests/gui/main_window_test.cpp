@@ -147,21 +147,5 @@ TEST_F(MainWindow, DisplayImageFitsThumbnailsIntoTheirSquare) {
   EXPECT_EQ(TMyPicture::DisplayImageGeometry(0, 0).size(), QSize(0, 0));
 }
 
-TEST(PictureViewPainting, StretchesTheWholePictureOpaque) {
-  Application();
-  TBitmap32 picture(2, 1);
-  picture.At(0, 0) = Pixel{10, 20, 30, 0};  // fully transparent, still shown
-  picture.At(1, 0) = Pixel{200, 100, 50, 128};
-  PictureView view;
-  view.SetPicture(picture);
-  EXPECT_EQ(view.PictureSize(), QSize(2, 1));
-  view.resize(4, 2);
-  const QImage shown = view.grab().toImage();
-  ASSERT_EQ(shown.size(), QSize(4, 2));
-  for (int y = 0; y < 2; ++y)
-    for (int x = 0; x < 4; ++x)
-      EXPECT_EQ(shown.pixel(x, y), x < 2 ? qRgb(30, 20, 10) : qRgb(50, 100, 200)) << x << "," << y;
-}
-
 }  // namespace
 }  // namespace quillane
