@@ -1,4 +1,3 @@
-#include <QFrame>
 #include <QLineEdit>
 #include <QPushButton>
 #include <QToolButton>
@@ -53,23 +52,6 @@ TEST_F(ToolWindows, ChoosingTheOpenWindowAgainShowsItAfresh) {
   EXPECT_TRUE(Tool(1).isVisible());
   EXPECT_EQ(Main().ActiveTool(), 1);
   EXPECT_FALSE(colorUp->isEnabled());
-}
-
-TEST_F(ToolWindows, BatchPanelFoldsOutAndBackIn) {
-  for (const EffectSpec* spec : Effects()) {
-    ToolWindow& window = Tool(spec->toolNumber);
-    auto* toggle = window.findChild<QToolButton*>("SpeedButton1");
-    auto* panel = window.findChild<QFrame*>("Panel2");
-    ASSERT_EQ(toggle != nullptr && panel != nullptr, spec->HasBatchPanel()) << spec->windowClass;
-    if (!toggle) continue;
-    MenuAction(EntryName(*spec))->trigger();
-    for (bool open : {false, true, false}) {
-      EXPECT_EQ(window.height(), open ? spec->expandedHeight : spec->collapsedHeight)
-          << spec->windowClass;
-      EXPECT_EQ(panel->isVisible(), open) << spec->windowClass;
-      toggle->click();
-    }
-  }
 }
 
 TEST_F(ToolWindows, FoldersAreSharedBetweenWindows) {
