@@ -73,7 +73,7 @@ TEST_F(View, TheWheelZoomsOverThePictureOnlyAndCtrlWheelAnywhere) {
   // The View menu's entries run the buttons' zoom; Ctrl+= is the one key of its own.
   ASSERT_TRUE(QTest::qWaitForWindowActive(&Main()));
   QTest::keyClick(&Main(), Qt::Key_Equal, Qt::ControlModifier);
-  EXPECT_EQ(ZoomLabel(), "195.3%");
+  EXPECT_EQ(ZoomLabel(), "244.1%");
 }
 
 TEST_F(View, RightDragPansAndOnlyAStillRightClickOpensTheContextMenu) {
@@ -90,7 +90,6 @@ TEST_F(View, RightDragPansAndOnlyAStillRightClickOpensTheContextMenu) {
       {{2000, 1500}, Qt::LeftButton, {60, 70}, {0, 0}, false},     // left does neither
   };
   auto* menu = Main().findChild<QMenu*>("PopupMenu1");
-  auto* image1 = MainChild<PictureView>("Image1");
   for (const auto& c : cases) {
     Main().ShowNewPicture(TBitmap32(c.picture.width(), c.picture.height()), true);
     Mouse(QEvent::MouseButtonPress, {100, 100}, c.button, c.button);
@@ -110,7 +109,6 @@ TEST_F(View, RotationTurnsBothPicturesAndResetsTheHistory) {
   Click("SpeedButton12");
   EXPECT_EQ(Main().Document().Working(), TBitmap32(478, 640, Pixel{5, 5, 5, 255}));
   EXPECT_EQ(Main().Document().Source(), TBitmap32(478, 640, Pixel{9, 9, 9, 255}));
-  EXPECT_EQ(Main().Document().Opened(), TBitmap32(640, 480, Pixel{9, 9, 9, 255}));
   EXPECT_FALSE(MainChild<QToolButton>("SpeedButton3")->isEnabled());
   EXPECT_EQ(Display(), QSize(598, 800));
   EXPECT_EQ(Bar(Qt::Horizontal)->value(), 0);
