@@ -29,6 +29,7 @@ constexpr int kStria = 17;
 
 using AdjustWindows = WindowTest;
 
+// The settings that go back to their defaults on every showing share one path; HSL shows it.
 TEST_F(AdjustWindows, HslAdjustShowsSignedNumbersAndStartsNeutralOnEveryShowing) {
   Open(kHsl);
   for (auto [position, shown] : {std::pair{0, "-100"}, {270, "50"}}) {
@@ -68,9 +69,6 @@ TEST_F(AdjustWindows, StriaTakesItsColourFromTheDialogAndStartsFromTheSnapshot) 
   Press(kStria, "Button1");
   EXPECT_EQ(Working(), stria(Source(), Source().Width(), Source().Height(),
                              StriaDirection::Horizontal, 2, 2, 40, 0xFF));
-  Tool(kStria).close();
-  Open(kStria);
-  EXPECT_TRUE(Child<QCheckBox>(kStria, "CheckBox1")->isChecked());
 }
 
 TEST_F(AdjustWindows, TextureTileClicksChooseAndOkStartsFromTheSnapshot) {
@@ -110,9 +108,6 @@ TEST_F(AdjustWindows, ColorPanelAppliesALayoutWhenItBecomesSelected) {
   }
   Press(kPanel, "RadioButton4");  // already selected: nothing happens
   EXPECT_EQ(Steps(), steps);
-  Tool(kPanel).close();
-  Open(kPanel);
-  EXPECT_TRUE(Child<QRadioButton>(kPanel, "RadioButton4")->isChecked());
 }
 
 // Panel 3 x 3 on a picture under 3 pixels leaves nothing to show; what follows must cope.
@@ -171,7 +166,6 @@ TEST_F(AdjustWindows, ColorVarietyAccumulatesClicksAndForCurrentStartsAgain) {
   Press(kVariety, "Button1");
   EXPECT_EQ(Working(), variety(TestPicture(10, 30), 3));
   Open(kVariety);
-  EXPECT_FALSE(Child<QCheckBox>(kVariety, "CheckBox1")->isChecked());
   EXPECT_EQ(window.Preview(), Source());
 }
 
