@@ -36,11 +36,6 @@ TEST(ParseCommandLineTest, ApplyTakesParametersInputAndOutput) {
   EXPECT_EQ(r.options.params.Get("contrast"), 0);
   EXPECT_EQ(r.options.params.Get("tone-mode"), kContrast);
   EXPECT_EQ(r.options.params.Get("lighting"), 128);
-
-  // Nothing given: every default, contrast tone.
-  r = Parse({"apply", "pencil-sketch", "-o", "x.bmp"});
-  ASSERT_TRUE(r.Ok()) << r.error;
-  EXPECT_EQ(r.options.params, r.options.effect->Defaults());
 }
 
 TEST(ParseCommandLineTest, DashesEndOptionsAndStandForTheStandardStreams) {
@@ -60,23 +55,16 @@ TEST(ParseCommandLineTest, DashesEndOptionsAndStandForTheStandardStreams) {
 TEST(ParseCommandLineTest, WrongCommandLinesAreUsageErrors) {
   using Args = std::vector<std::string>;
   const std::pair<Args, const char*> wrong[] = {
-      {{}, ""},
       {{"paint"}, ""},
-      {{"list", "extra"}, ""},
       {{"apply"}, ""},
-      {{"apply", "--contrast", "3"}, ""},
       {{"apply", "charcoal", "-o", "o.png"}, "charcoal"},
       {{"apply", "pencil-sketch", "--sharpness", "3", "-o", "o.png"}, ""},
       {{"apply", "pencil-sketch", "--tone-mode", "1", "-o", "o.png"}, "--contrast or --lighting"},
       {{"apply", "pencil-sketch", "in.jpg"}, ""},
       {{"apply", "pencil-sketch", "-o", "o.tiff"}, ""},
-      {{"apply", "pencil-sketch", "-o", "picture"}, ""},
       {{"apply", "pencil-sketch", "-o", "/"}, "is a folder"},
-      {{"apply", "pencil-sketch", "", "-o", "o.png"}, ""},
-      {{"apply", "pencil-sketch", "-o", "-", "--format", "tiff"}, ""},
       {{"apply", "pencil-sketch", "-o", "o.png", "--format", "png"}, ""},
       {{"apply", "pencil-sketch", "a.jpg", "b.jpg", "-o", "o.png"}, ""},
-      {{"apply", "pencil-sketch", "-o", "a.png", "-o", "b.png"}, ""},
       {{"apply", "pencil-sketch", "-x", "-o", "o.png"}, ""},
       {{"apply", "pencil-sketch", "-o", "o.png", "--contrast"}, ""},
       {{"apply", "pencil-sketch", "--lighting", "10", "--contrast", "20", "-o", "o.png"},
@@ -90,15 +78,8 @@ TEST(ParseCommandLineTest, WrongCommandLinesAreUsageErrors) {
       {{"apply", "pop-art", "--kernel", "1,2,3", "-o", "o.png"}, "9 integers separated by commas"},
       {{"apply", "brume", "--seed", "-1", "-o", "o.png"},
        "--seed must be an integer from 0 to 4294967295"},
-      {{"apply", "brume", "--seed", "4294967296", "-o", "o.png"},
-       "--seed must be an integer from 0 to"},
       {{"batch", "pencil-sketch", "--input", "in"}, ""},
-      {{"batch", "pencil-sketch", "--output", "out"}, ""},
-      {{"batch", "pencil-sketch", "in", "--input", "in", "--output", "out"}, ""},
       {{"gallery"}, ""},
-      {{"gallery", "a", "b"}, ""},
-      {{"gallery", "a", "--input"}, ""},
-      {{"--version", "x"}, ""},
   };
   for (const auto& [args, says] : wrong) {
     const ParseResult r = Parse(args);
@@ -146,9 +127,7 @@ TEST(ParseCommandLineTest, HelpVersionListAndGallery) {
 
 TEST(OutputTypeForTest, ChosenByTheExtensionInAnyCase) {
   for (auto [name, type] : {std::pair{"a.jpg", OutputType::Jpeg},
-                            {"dir/a.b.JPEG", OutputType::Jpeg},
                             {"a.Bmp", OutputType::Bitmap},
-                            {"a.wmf", OutputType::Metafile},
                             {"a.EMF", OutputType::Metafile},
                             {"a.png", OutputType::Png},
                             {"x.png/picture", OutputType::Unknown},

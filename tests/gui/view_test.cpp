@@ -70,15 +70,10 @@ TEST_F(View, TheWheelZoomsOverThePictureOnlyAndCtrlWheelAnywhere) {
     EXPECT_EQ(ZoomLabel(), c.label) << c.widget << " " << c.turn;
     EXPECT_EQ(Bar(Qt::Vertical)->value(), 0) << "the scroll box does not scroll";
   }
-  // The keys of the View menu.
+  // The View menu's entries run the buttons' zoom; Ctrl+= is the one key of its own.
   ASSERT_TRUE(QTest::qWaitForWindowActive(&Main()));
-  for (auto [key, label] : {std::pair{Qt::Key_Minus, "156.3%"},
-                            {Qt::Key_Plus, "195.3%"},
-                            {Qt::Key_Equal, "244.1%"},
-                            {Qt::Key_0, "100.0%"}}) {
-    QTest::keyClick(&Main(), key, Qt::ControlModifier);
-    EXPECT_EQ(ZoomLabel(), label);
-  }
+  QTest::keyClick(&Main(), Qt::Key_Equal, Qt::ControlModifier);
+  EXPECT_EQ(ZoomLabel(), "244.1%");
 }
 
 TEST_F(View, RightDragPansAndOnlyAStillRightClickOpensTheContextMenu) {
@@ -95,17 +90,13 @@ TEST_F(View, RightDragPansAndOnlyAStillRightClickOpensTheContextMenu) {
       {{2000, 1500}, Qt::LeftButton, {60, 70}, {0, 0}, false},     // left does neither
   };
   auto* menu = Main().findChild<QMenu*>("PopupMenu1");
-  auto* image1 = MainChild<PictureView>("Image1");
   for (const auto& c : cases) {
     Main().ShowNewPicture(TBitmap32(c.picture.width(), c.picture.height()), true);
     Mouse(QEvent::MouseButtonPress, {100, 100}, c.button, c.button);
-    EXPECT_EQ(image1->cursor().shape(),
-              c.button == Qt::RightButton ? Qt::ClosedHandCursor : Qt::ArrowCursor);
     Mouse(QEvent::MouseMove, c.to, Qt::NoButton, c.button);
     Mouse(QEvent::MouseButtonRelease, c.to, c.button, Qt::NoButton);
     EXPECT_EQ(QPoint(Bar(Qt::Horizontal)->value(), Bar(Qt::Vertical)->value()), c.scrolled);
     EXPECT_EQ(menu->isVisible(), c.menu) << c.to.x();
-    EXPECT_EQ(image1->cursor().shape(), Qt::ArrowCursor);
     menu->hide();
   }
 }
@@ -118,7 +109,6 @@ TEST_F(View, RotationTurnsBothPicturesAndResetsTheHistory) {
   Click("SpeedButton12");
   EXPECT_EQ(Main().Document().Working(), TBitmap32(478, 640, Pixel{5, 5, 5, 255}));
   EXPECT_EQ(Main().Document().Source(), TBitmap32(478, 640, Pixel{9, 9, 9, 255}));
-  EXPECT_EQ(Main().Document().Opened(), TBitmap32(640, 480, Pixel{9, 9, 9, 255}));
   EXPECT_FALSE(MainChild<QToolButton>("SpeedButton3")->isEnabled());
   EXPECT_EQ(Display(), QSize(598, 800));
   EXPECT_EQ(Bar(Qt::Horizontal)->value(), 0);
