@@ -7,50 +7,36 @@
 
 #include "effects/paint/brume.h"
 #include "effects/paint/water_color.h"
-#include "imaging/parallel.h"
-#include "imaging/vector_dispatch.h"
-#include "tests/imaging/random_picture.h"
+#include "tests/imaging/fast_path_support.h"
 
 namespace quillane {
 namespace {
 
-struct Path {
-  bool avx2;
-  RowSplit split;
-};
 // Many bands: up to 7 of them, whatever the picture's size.
-const Path kPaths[] = {{true, {}}, {false, {}}, {true, {7, 1}}, {false, {7, 1}}};
-
-class PaintFastPaths : public ::testing::Test {
- protected:
-  void Use(const Path& path) {
-    SetAvx2Allowed(path.avx2);
-    SetRowSplit(path.split);
-  }
-  void TearDown() override { Use({true, {}}); }
-};
+const std::pair<bool, RowSplit> kPaths[] = {
+    {true, {}}, {false, {}}, {true, {7, 1}}, {false, {7, 1}}};
 
 const std::pair<int, int> kSizes[] = {{1, 1},  {1, 9},  {9, 1},  {3, 3},  {4, 3},   {11, 5},
                                       {9, 13}, {17, 4}, {34, 6}, {45, 2}, {4101, 5}};
 
-TEST_F(PaintFastPaths, WaterColorGivesTheReferenceBytes) {
-  for (const Path& path : kPaths)
+TEST(PaintFastPaths, WaterColorGivesTheReferenceBytes) {
+  for (const auto& [avx2, split] : kPaths)
     for (auto [w, h] : kSizes) {
-      Use(path);
+      const FastPathVariant variant(avx2, split);
       const TBitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w * 31 + h));
       for (int cycles : {1, 2, 5}) {
         if (w > 100 && cycles == 5) continue;
         ASSERT_EQ(watercolor(in, cycles), WaterColorReference(in, cycles))
-            << w << "x" << h << " cycles " << cycles << " avx2 " << path.avx2;
+            << w << "x" << h << " cycles " << cycles << " avx2 " << avx2;
       }
     }
 }
 
-TEST_F(PaintFastPaths, EachPassGivesItsFormulaAndLeavesTheFrame) {
+TEST(PaintFastPaths, EachPassGivesItsFormulaAndLeavesTheFrame) {
   const Pixel untouched{1, 2, 3, 4};
-  for (const Path& path : kPaths)
+  for (const auto& [avx2, split] : kPaths)
     for (int w = 3; w < 44; w += 5) {
-      Use(path);
+      const FastPathVariant variant(avx2, split);
       // Random bytes, and the extremes that make the sharpening clamp both ways.
       TBitmap32 in = RandomPicture(w, 4, static_cast<unsigned>(w));
       for (int x = 0; x < w; x += 2) in.At(x, 1) = in.At(x, 2) = Pixel{0, 255, 0, 9};
@@ -79,16 +65,16 @@ TEST_F(PaintFastPaths, EachPassGivesItsFormulaAndLeavesTheFrame) {
     }
 }
 
-TEST_F(PaintFastPaths, BrumeDrawsWhatThePlainLoopDraws) {
-  for (const Path& path : kPaths)
+TEST(PaintFastPaths, BrumeDrawsWhatThePlainLoopDraws) {
+  for (const auto& [avx2, split] : kPaths)
     for (auto [w, h] : kSizes)
       for (int scope : {1, 3, 10}) {
-        Use(path);
+        const FastPathVariant variant(avx2, split);
         const TBitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w + h));
         std::uint32_t fast = 0xDEADBEEF, plain = 0xDEADBEEF;
         for (int run = 0; run < 2; ++run)  // the second run goes on from the first one's seed
           ASSERT_EQ(Brume(in, scope, fast), BrumeReference(in, scope, plain))
-              << w << "x" << h << " scope " << scope << " avx2 " << path.avx2;
+              << w << "x" << h << " scope " << scope << " avx2 " << avx2;
         ASSERT_EQ(fast, plain);
       }
 }

@@ -7,18 +7,10 @@
 namespace quillane {
 namespace {
 
-TEST(WaterColor, FastPassesGiveTheSelectionSortBytesAndKeepTheFrame) {
+// The passes' own formulas are checked against the plain ones elsewhere; here the frame the
+// whole effect leaves alone, and pictures too small for a 3 x 3 neighbourhood.
+TEST(WaterColor, KeepsTheFrameAndTinyPictures) {
   const TBitmap32 in = RandomPicture(40, 9, 11);
-  TBitmap32 median(40, 9);
-  MedianPass(in, median);
-  for (int y = 1; y < 8; ++y)
-    for (int x = 1; x < 39; ++x)
-      for (std::uint8_t Pixel::*c : {&Pixel::r, &Pixel::g, &Pixel::b}) {
-        int block[9];
-        for (int i = 0; i < 9; ++i) block[i] = in.At(x + i % 3 - 1, y + i / 3 - 1).*c;
-        SelectionSort(block, 8);
-        ASSERT_EQ(median.At(x, y).*c, block[4]) << x << "," << y;
-      }
   for (int n = 1; n <= 5; ++n) {
     const TBitmap32 out = watercolor(in, n);
     ASSERT_EQ(out, WaterColorReference(in, n)) << n;
