@@ -1,5 +1,5 @@
-// HSL adjust, colour filter, colour variety and colour panel on small crafted pictures, and
-// against their plain formulas.
+// Colour filter, colour variety and colour panel on small crafted pictures, and against their
+// plain formulas.
 #include <gtest/gtest.h>
 
 #include <algorithm>
@@ -8,9 +8,7 @@
 #include "effects/adjust/color_filter.h"
 #include "effects/adjust/color_panel.h"
 #include "effects/adjust/color_variety.h"
-#include "effects/adjust/hsl_adjust.h"
 #include "imaging/numeric.h"
-#include "imaging/tone.h"
 #include "tests/imaging/random_picture.h"
 
 namespace quillane {
@@ -19,24 +17,6 @@ namespace {
 Pixel Rgb3(int r, int g, int b) {
   return Pixel{static_cast<std::uint8_t>(b), static_cast<std::uint8_t>(g),
                static_cast<std::uint8_t>(r), 255};
-}
-
-TEST(HslAdjust, MatchesTheConversionsPixelByPixel) {
-  for (auto [w, h] : {std::pair{37, 29}, {1, 5}, {2, 1}, {0, 0}})
-    for (int hue : {0, 77, 180, 300, 359, 360})
-      for (auto [s, l] : {std::pair{100, 100}, {37, 160}, {0, 200}, {200, 0}}) {
-        const TBitmap32 in = RandomPicture(w, h, static_cast<unsigned>(hue + s + l));
-        TBitmap32 expected = in;
-        for (int y = 0; y < h; ++y)
-          for (int x = 0; x < w; ++x) {
-            const Pixel p = in.At(x, y);
-            const Hsl c = RgbToHsl(p.r, p.g, p.b);
-            const Rgb o = HslToRgb((c.h + hue + 180) % 360, std::clamp(c.s + s - 100, 0, 100),
-                                   std::clamp(c.l + l - 100, 0, 100));
-            expected.At(x, y) = Rgb3(o.r, o.g, o.b);
-          }
-        ASSERT_EQ(HslAdjust(in, hue, s, l), expected) << w << "x" << h << " " << hue;
-      }
 }
 
 // A zone's change: channels set (-1 keeps) and then raised (limited to 255), red, green, blue.

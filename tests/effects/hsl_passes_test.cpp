@@ -62,10 +62,12 @@ TEST(HslPasses, TextureEqualsThePlainConversions) {
 }
 
 TEST(HslPasses, HslAdjustEqualsThePlainConversions) {
+  EXPECT_TRUE(HslAdjust(TBitmap32(), 0, 200, 0).Empty());
   unsigned seed = 200;
   for (const auto& [w, h] : kAwkwardSizes) {
     const TBitmap32 in = Picture(w, h, ++seed);
-    for (const auto [hue, s, l] : {std::array{180, 100, 100}, {17, 163, 41}, {360, 0, 200}}) {
+    for (const auto [hue, s, l] :
+         {std::array{180, 100, 100}, {17, 163, 41}, {360, 0, 200}, {0, 200, 0}, {359, 37, 160}}) {
       TBitmap32 expected(w, h);
       for (int y = 0; y < h; ++y)
         for (int x = 0; x < w; ++x) {
