@@ -74,4 +74,43 @@ void ParallelRows(int begin, int end, std::size_t workPerRow, Body&& body) {
     if (e) std::rethrow_exception(e);
 }
 
+// Like ParallelRows for passes whose rows are independent of each other, but the threads take
+// short runs of rows in turn instead of one fixed band each: on a machine that other programs
+// keep busy, a thread that loses its processor for a while no longer holds up the whole pass
+// while the others sit finished. body(y0, y1) is called for consecutive runs covering
+// [begin, end), several times per thread, in no fixed order.
+template <typename Body>
+void ParallelRowRuns(int begin, int end, std::size_t workPerRow, Body&& body) {
+  if (end <= begin) return;
+  const int rows = end - begin;
+  const int threads = RowBands(rows, workPerRow);
+  if (threads <= 1) {
+    body(begin, end);
+    return;
+  }
+  // Runs of a few hundred kilobytes: short enough to even the threads out, long enough that
+  // taking one costs nothing and the processor's prefetching finds its stride.
+  constexpr int kRunsPerThread = 16;
+  const int run = std::max(1, (rows + threads * kRunsPerThread - 1) / (threads * kRunsPerThread));
+  std::atomic<int> next{begin};
+  std::atomic<bool> failed{false};
+  std::vector<std::exception_ptr> errors(static_cast<std::size_t>(threads));
+  const auto work = [&](int i) {
+    try {
+      for (int y0 = next.fetch_add(run); y0 < end && !failed; y0 = next.fetch_add(run))
+        body(y0, std::min(end, y0 + run));
+    } catch (...) {
+      errors[static_cast<std::size_t>(i)] = std::current_exception();
+      failed = true;
+    }
+  };
+  std::vector<std::thread> pool;
+  pool.reserve(static_cast<std::size_t>(threads - 1));
+  for (int i = 1; i < threads; ++i) pool.emplace_back(work, i);
+  work(0);
+  for (auto& t : pool) t.join();
+  for (auto& e : errors)
+    if (e) std::rethrow_exception(e);
+}
+
 }  // namespace quillane
