@@ -88,17 +88,24 @@ void ParallelRowRuns(int begin, int end, std::size_t workPerRow, Body&& body) {
     body(begin, end);
     return;
   }
-  // Runs of a few hundred kilobytes: short enough to even the threads out, long enough that
-  // taking one costs nothing and the processor's prefetching finds its stride.
-  constexpr int kRunsPerThread = 16;
-  const int run = std::max(1, (rows + threads * kRunsPerThread - 1) / (threads * kRunsPerThread));
+  // Each run is a share of the rows still untaken, so the runs shorten towards the end: a
+  // thread that loses its processor in its last run then holds up the others for less. The
+  // shortest are still long enough that taking one costs nothing.
+  const int shortest = std::max(1, rows / (threads * 64));
   std::atomic<int> next{begin};
   std::atomic<bool> failed{false};
   std::vector<std::exception_ptr> errors(static_cast<std::size_t>(threads));
+  const auto take = [&](int& y0, int& y1) {
+    y0 = next.load(std::memory_order_relaxed);
+    do {
+      if (y0 >= end) return false;
+      y1 = std::min(end, y0 + std::max(shortest, (end - y0) / (4 * threads)));
+    } while (!next.compare_exchange_weak(y0, y1, std::memory_order_relaxed));
+    return true;
+  };
   const auto work = [&](int i) {
     try {
-      for (int y0 = next.fetch_add(run); y0 < end && !failed; y0 = next.fetch_add(run))
-        body(y0, std::min(end, y0 + run));
+      for (int y0, y1; !failed && take(y0, y1);) body(y0, y1);
     } catch (...) {
       errors[static_cast<std::size_t>(i)] = std::current_exception();
       failed = true;
