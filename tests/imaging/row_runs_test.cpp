@@ -2,7 +2,6 @@
 #include <gtest/gtest.h>
 
 #include <atomic>
-#include <stdexcept>
 #include <vector>
 
 #include "imaging/parallel.h"
@@ -27,16 +26,6 @@ TEST(ParallelRowRuns, EveryRowOnceForAnySplit) {
       EXPECT_EQ(visits[i], i == 0 || i + 1 == visits.size() ? 0 : 1)
           << "row " << c.begin + static_cast<int>(i) - 1 << " of " << c.begin << ".." << c.end;
   }
-}
-
-TEST(ParallelRowRuns, AnExceptionReachesTheCaller) {
-  SetRowSplit({3, 0});
-  EXPECT_THROW(ParallelRowRuns(0, 300, 1,
-                               [](int y0, int y1) {
-                                 if (y0 <= 150 && 150 < y1) throw std::runtime_error("row 150");
-                               }),
-               std::runtime_error);
-  SetRowSplit({});
 }
 
 }  // namespace
