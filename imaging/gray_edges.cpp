@@ -131,6 +131,10 @@ void PlainPixels(const std::uint8_t* level, int n, const std::uint32_t* pixelOf,
   return _mm256_cvtepu8_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(p)));
 }
 
+[[gnu::target("avx2"), gnu::always_inline]] inline __m128i Widened8(const std::uint8_t* p) {
+  return _mm_cvtepu8_epi16(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(p)));
+}
+
 [[gnu::target("avx2"), gnu::always_inline]] inline __m256i At16(const std::int16_t* p) {
   return _mm256_loadu_si256(reinterpret_cast<const __m256i*>(p));
 }
@@ -156,30 +160,35 @@ void PlainPixels(const std::uint8_t* level, int n, const std::uint32_t* pixelOf,
                                                                         std::uint8_t* edge) {
   const int first = 4 * x0;
   const int bytes = 4 * n;
-  alignas(32) std::int16_t vertical[4 * kStretch + 8], column[4 * kStretch + 8];
-  // The sums for bytes first - 4 .. first + bytes + 3; the loop below reads no others.
-  const int span = bytes + 8;
-  int k = 0;
-  for (; k + 16 <= span; k += 16) {
-    const int i = first - 4 + k;
-    const __m256i v = _mm256_add_epi16(Widened16(above + i), Widened16(below + i));
-    _mm256_store_si256(reinterpret_cast<__m256i*>(vertical + k), v);
-    _mm256_store_si256(reinterpret_cast<__m256i*>(column + k),
-                       _mm256_add_epi16(v, Widened16(row + i)));
-  }
-  for (; k < span; ++k) {
-    const int i = first - 4 + k;
-    vertical[k] = static_cast<std::int16_t>(above[i] + below[i]);
-    column[k] = static_cast<std::int16_t>(vertical[k] + row[i]);
-  }
+  // The sums a block of responses needs, for its bytes and four on either side; blocks are
+  // short so that the sums stay in the first-level cache beside the rows and the edge bytes.
+  constexpr int kBlock = 256;
+  alignas(32) std::int16_t vertical[kBlock + 8], column[kBlock + 8];
   int j = 0;
-  for (; j + 32 <= bytes; j += 32) {
-    const __m256i packed =
-        _mm256_packus_epi16(ResponseOfSums16(vertical, column, row + first, j),
-                            ResponseOfSums16(vertical, column, row + first, j + 16));
-    const __m256i ordered = _mm256_permute4x64_epi64(packed, 0xD8);
-    _mm256_store_si256(reinterpret_cast<__m256i*>(edge + j),
-                       _mm256_xor_si256(ordered, _mm256_set1_epi8(-1)));
+  while (j + 32 <= bytes) {
+    const int m = std::min(kBlock, (bytes - j) / 32 * 32);
+    const int i0 = first + j - 4;
+    int k = 0;
+    for (; k < m; k += 16) {
+      const __m256i v = _mm256_add_epi16(Widened16(above + i0 + k), Widened16(below + i0 + k));
+      _mm256_store_si256(reinterpret_cast<__m256i*>(vertical + k), v);
+      _mm256_store_si256(reinterpret_cast<__m256i*>(column + k),
+                         _mm256_add_epi16(v, Widened16(row + i0 + k)));
+    }
+    // The last eight, read eight bytes wide: sixteen would pass the row's end.
+    const __m128i v = _mm_add_epi16(Widened8(above + i0 + k), Widened8(below + i0 + k));
+    _mm_store_si128(reinterpret_cast<__m128i*>(vertical + k), v);
+    _mm_store_si128(reinterpret_cast<__m128i*>(column + k),
+                    _mm_add_epi16(v, Widened8(row + i0 + k)));
+    for (int r = 0; r < m; r += 32) {
+      const __m256i packed =
+          _mm256_packus_epi16(ResponseOfSums16(vertical, column, row + first + j, r),
+                              ResponseOfSums16(vertical, column, row + first + j, r + 16));
+      const __m256i ordered = _mm256_permute4x64_epi64(packed, 0xD8);
+      _mm256_store_si256(reinterpret_cast<__m256i*>(edge + j + r),
+                         _mm256_xor_si256(ordered, _mm256_set1_epi8(-1)));
+    }
+    j += m;
   }
   if (j < bytes) EdgeStretch(above + j, row + j, below + j, x0, (bytes - j) / 4, edge + j);
 }
