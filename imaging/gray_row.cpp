@@ -1,6 +1,6 @@
 // Gray rows for the colour filter. The gray value's weighted sum is 30 R + 59 G + 11 B in
 // integers; away from an exact half it rounds as the extended-precision sum does, and the exact
-// halves (about one pixel in a hundred) are settled by GrayValueOfHalf.
+// halves (about one pixel in a hundred) are settled from GrayValueOfHalf's table.
 #include "imaging/gray_row.h"
 
 #include <algorithm>
@@ -10,6 +10,7 @@
 #include <immintrin.h>
 #endif
 
+#include "imaging/gray_half_avx2.h"
 #include "imaging/numeric.h"
 #include "imaging/tone.h"
 #include "imaging/vector_dispatch.h"
@@ -34,21 +35,27 @@ void PlainGrayRow(const Pixel* in, Pixel* out, int width, std::uint32_t set) {
 #if defined(__x86_64__) && defined(__GNUC__)
 // The weighted sums of 8 pixels as 32-bit numbers: multiply-add of the bytes B, G, R, A with
 // 11, 59, 30 and 0.
-[[gnu::target("avx2"), gnu::always_inline]] inline __m256i Sums8(const Pixel* p) {
-  const __m256i e = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(p));
+[[gnu::target("avx2"), gnu::always_inline]] inline __m256i Sums8(__m256i e) {
   return _mm256_madd_epi16(_mm256_maddubs_epi16(e, _mm256_set1_epi32(0x001E3B0B)),
                            _mm256_set1_epi16(1));
 }
 
 // 16 pixels: the sums packed to 16 bits (in-lane, so unpacking restores the order), divided
-// by 100 with the remainder deciding the rounding. Returns the exact halves, two bits per pixel.
-[[gnu::target("avx2"), gnu::always_inline]] inline std::uint32_t Gray16(const Pixel* in, Pixel* out,
-                                                                        __m256i raised) {
-  const __m256i s = _mm256_packus_epi32(Sums8(in), Sums8(in + 8));
+// by 100 with the remainder deciding the rounding; a group with exact halves in it settles
+// them all at once from the table.
+[[gnu::target("avx2"), gnu::always_inline]] inline void Gray16(const Pixel* in, Pixel* out,
+                                                               __m256i raised,
+                                                               const std::uint8_t* table) {
+  const __m256i e0 = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in));
+  const __m256i e1 = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + 8));
+  const __m256i s = _mm256_packus_epi32(Sums8(e0), Sums8(e1));
   const __m256i fifty = _mm256_set1_epi16(50);
   const __m256i k = _mm256_srli_epi16(_mm256_mulhi_epu16(s, _mm256_set1_epi16(5243)), 3);
   const __m256i rest = _mm256_sub_epi16(s, _mm256_mullo_epi16(k, _mm256_set1_epi16(100)));
-  const __m256i level = _mm256_sub_epi16(k, _mm256_cmpgt_epi16(rest, fifty));
+  __m256i level = _mm256_sub_epi16(k, _mm256_cmpgt_epi16(rest, fifty));
+  const __m256i halves = _mm256_cmpeq_epi16(rest, fifty);
+  if (!_mm256_testz_si256(halves, halves))
+    level = _mm256_add_epi16(level, _mm256_and_si256(halves, HalfRoundsUp16(e0, e1, table)));
   // The level's low byte into B, G and R of its pixel.
   const __m256i spread = _mm256_setr_epi8(0, 0, 0, -1, 4, 4, 4, -1, 8, 8, 8, -1, 12, 12, 12, -1, 0,
                                           0, 0, -1, 4, 4, 4, -1, 8, 8, 8, -1, 12, 12, 12, -1);
@@ -59,24 +66,15 @@ void PlainGrayRow(const Pixel* in, Pixel* out, int width, std::uint32_t set) {
                       _mm256_or_si256(_mm256_shuffle_epi8(first, spread), raised));
   _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + 8),
                       _mm256_or_si256(_mm256_shuffle_epi8(second, spread), raised));
-  // The 16-bit lanes hold pixels 0-3, 8-11, 4-7, 12-15: put their quarters in order.
-  const __m256i halves = _mm256_permute4x64_epi64(_mm256_cmpeq_epi16(rest, fifty), 0xD8);
-  return static_cast<std::uint32_t>(_mm256_movemask_epi8(halves));
 }
 
 // Plain stores: on the machines measured, streaming the result past the caches was slower.
 [[gnu::target("avx2")]] void Avx2GrayRow(const Pixel* in, Pixel* out, int width,
                                          std::uint32_t set) {
-  const std::uint32_t raisedWord = set | 0xFF000000u;
-  const __m256i raised = _mm256_set1_epi32(static_cast<int>(raisedWord));
+  const __m256i raised = _mm256_set1_epi32(static_cast<int>(set | 0xFF000000u));
+  const std::uint8_t* table = GrayHalfRoundsUp();
   int x = 0;
-  for (; x + 16 <= width; x += 16)
-    for (std::uint32_t halves = Gray16(in + x, out + x, raised) & 0x55555555u; halves != 0;
-         halves &= halves - 1) {
-      const int i = x + std::countr_zero(halves) / 2;
-      out[i] =
-          std::bit_cast<Pixel>(GrayValueOfHalf(in[i].r, in[i].g, in[i].b) * 0x010101u | raisedWord);
-    }
+  for (; x + 16 <= width; x += 16) Gray16(in + x, out + x, raised, table);
   if (x < width) PlainGrayRow(in + x, out + x, width - x, set);
 }
 #endif

@@ -74,4 +74,50 @@ void ParallelRows(int begin, int end, std::size_t workPerRow, Body&& body) {
     if (e) std::rethrow_exception(e);
 }
 
+// Like ParallelRows for passes whose rows are independent of each other, but the threads take
+// short runs of rows in turn instead of one fixed band each: on a machine that other programs
+// keep busy, a thread that loses its processor for a while no longer holds up the whole pass
+// while the others sit finished. body(y0, y1) is called for consecutive runs covering
+// [begin, end), several times per thread, in no fixed order.
+template <typename Body>
+void ParallelRowRuns(int begin, int end, std::size_t workPerRow, Body&& body) {
+  if (end <= begin) return;
+  const int rows = end - begin;
+  const int threads = RowBands(rows, workPerRow);
+  if (threads <= 1) {
+    body(begin, end);
+    return;
+  }
+  // Each run is a share of the rows still untaken, so the runs shorten towards the end: a
+  // thread that loses its processor in its last run then holds up the others for less. The
+  // shortest are still long enough that taking one costs nothing.
+  const int shortest = std::max(1, rows / (threads * 64));
+  std::atomic<int> next{begin};
+  std::atomic<bool> failed{false};
+  std::vector<std::exception_ptr> errors(static_cast<std::size_t>(threads));
+  const auto take = [&](int& y0, int& y1) {
+    y0 = next.load(std::memory_order_relaxed);
+    do {
+      if (y0 >= end) return false;
+      y1 = std::min(end, y0 + std::max(shortest, (end - y0) / (4 * threads)));
+    } while (!next.compare_exchange_weak(y0, y1, std::memory_order_relaxed));
+    return true;
+  };
+  const auto work = [&](int i) {
+    try {
+      for (int y0, y1; !failed && take(y0, y1);) body(y0, y1);
+    } catch (...) {
+      errors[static_cast<std::size_t>(i)] = std::current_exception();
+      failed = true;
+    }
+  };
+  std::vector<std::thread> pool;
+  pool.reserve(static_cast<std::size_t>(threads - 1));
+  for (int i = 1; i < threads; ++i) pool.emplace_back(work, i);
+  work(0);
+  for (auto& t : pool) t.join();
+  for (auto& e : errors)
+    if (e) std::rethrow_exception(e);
+}
+
 }  // namespace quillane

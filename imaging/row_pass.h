@@ -1,7 +1,7 @@
 // The shape most effects take: a new picture made row by row from the rows of another, the rows
 // split in bands over the processor's threads. Built on it, an effect gets by construction what
-// makes such passes fast here: its result in kept picture memory, not cleared first, and one
-// band per thread.
+// makes such passes fast here: its result in kept picture memory, not cleared first, and the
+// rows shared out between the threads in short runs.
 #pragma once
 
 #include <cstddef>
@@ -24,7 +24,7 @@ template <typename RowFunction>
 TBitmap32 MapRows(const TBitmap32& in, std::size_t workPerPixel, RowFunction&& row) {
   const int w = in.Width();
   TBitmap32 out = ScratchPicture(w, in.Height());
-  ParallelRows(0, in.Height(), static_cast<std::size_t>(w) * workPerPixel, [&](int y0, int y1) {
+  ParallelRowRuns(0, in.Height(), static_cast<std::size_t>(w) * workPerPixel, [&](int y0, int y1) {
     for (int y = y0; y < y1; ++y) row(in.ScanLine(y), out.ScanLine(y), w, y);
   });
   return out;

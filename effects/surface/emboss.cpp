@@ -13,6 +13,7 @@
 #endif
 
 #include "effects/registry.h"
+#include "imaging/gray_half_avx2.h"
 #include "imaging/numeric.h"
 #include "imaging/parallel.h"
 #include "imaging/row_pass.h"
@@ -60,20 +61,6 @@ void PlainReliefRow(const Pixel* p, const Pixel* q, int n, int lift, Pixel* out)
                            _mm256_set1_epi16(1));
 }
 
-// Whether an exact half of each of eight pixels rounds up, 0 or 1 in 32-bit lanes.
-[[gnu::target("avx2"), gnu::always_inline]] inline __m256i RoundsUp8(__m256i v,
-                                                                     const std::uint8_t* table) {
-  const __m256i redGreen = _mm256_shuffle_epi8(
-      v, _mm256_setr_epi8(1, 2, -1, -1, 5, 6, -1, -1, 9, 10, -1, -1, 13, 14, -1, -1, 1, 2, -1, -1,
-                          5, 6, -1, -1, 9, 10, -1, -1, 13, 14, -1, -1));
-  const __m256i bits = _mm256_i32gather_epi32(reinterpret_cast<const int*>(table), redGreen, 1);
-  const __m256i blue = _mm256_and_si256(v, _mm256_set1_epi32(0xFF));
-  const __m256i hundreds = _mm256_sub_epi32(
-      _mm256_sub_epi32(_mm256_setzero_si256(), _mm256_cmpgt_epi32(blue, _mm256_set1_epi32(99))),
-      _mm256_cmpgt_epi32(blue, _mm256_set1_epi32(199)));
-  return _mm256_and_si256(_mm256_srlv_epi32(bits, hundreds), _mm256_set1_epi32(1));
-}
-
 // Sixteen gray pixels into gray0 (pixels 0-7) and gray1 (8-15). With s the sum, the level is
 // (s + 49) / 100 but for an exact half (s = 100 k + 50), where (s + 50) / 100 is larger and the
 // table decides; (t * 5243) >> 19 is t / 100 for every t up to 43000.
@@ -94,9 +81,7 @@ void PlainReliefRow(const Pixel* p, const Pixel* q, int n, int lift, Pixel* out)
   const __m256i whole = _mm256_cmpeq_epi16(level, above);
   // Exact halves are rare enough that most groups have none.
   if (_mm256_movemask_epi8(whole) != -1)
-    level = _mm256_add_epi16(
-        level, _mm256_andnot_si256(
-                   whole, _mm256_packus_epi32(RoundsUp8(v0, table), RoundsUp8(v1, table))));
+    level = _mm256_add_epi16(level, _mm256_andnot_si256(whole, HalfRoundsUp16(v0, v1, table)));
   const __m256i alpha = _mm256_set1_epi32(static_cast<std::int32_t>(0xFF000000u));
   const __m256i first = _mm256_setr_epi8(0, 0, 0, -1, 2, 2, 2, -1, 4, 4, 4, -1, 6, 6, 6, -1, 0, 0,
                                          0, -1, 2, 2, 2, -1, 4, 4, 4, -1, 6, 6, 6, -1);
@@ -184,7 +169,7 @@ TBitmap32 emboss(const TBitmap32& source, int lighting, int depth) {
   TBitmap32 out = ScratchPicture(width, height);
   // Every Q is read from the untouched source, so rows can be done in any order; the result is
   // the one a top-to-bottom pass in place gives. Unvisited pixels keep the source's.
-  ParallelRows(0, height, static_cast<std::size_t>(width) * 2, [&](int y0, int y1) {
+  ParallelRowRuns(0, height, static_cast<std::size_t>(width) * 2, [&](int y0, int y1) {
     for (int y = y0; y < y1; ++y) {
       const Pixel* p = source.ScanLine(y);
       Pixel* row = out.ScanLine(y);
