@@ -43,6 +43,31 @@ inline int RowBands(int rows, std::size_t workPerRow) {
   return static_cast<int>(std::min<std::size_t>({threads, static_cast<std::size_t>(rows), byWork}));
 }
 
+namespace detail {
+// Runs work(i) for i in 0 .. threads - 1, i = 0 on the calling thread. The first exception
+// thrown by any of them is rethrown here after all have finished; failed is set as soon as one
+// throws, for work that can stop early.
+template <typename Work>
+void OnThreads(int threads, std::atomic<bool>& failed, Work&& work) {
+  std::vector<std::thread> pool;
+  std::vector<std::exception_ptr> errors(static_cast<std::size_t>(threads));
+  pool.reserve(static_cast<std::size_t>(threads - 1));
+  const auto run = [&](int i) {
+    try {
+      work(i);
+    } catch (...) {
+      errors[static_cast<std::size_t>(i)] = std::current_exception();
+      failed = true;
+    }
+  };
+  for (int i = 1; i < threads; ++i) pool.emplace_back(run, i);
+  run(0);
+  for (auto& t : pool) t.join();
+  for (auto& e : errors)
+    if (e) std::rethrow_exception(e);
+}
+}  // namespace detail
+
 // Calls body(y0, y1) over consecutive bands covering [begin, end). workPerRow estimates the
 // cost of one row; small jobs run on the calling thread. The first exception thrown by any
 // band is rethrown here after every band has finished.
@@ -55,23 +80,12 @@ void ParallelRows(int begin, int end, std::size_t workPerRow, Body&& body) {
     body(begin, end);
     return;
   }
-  std::vector<std::thread> pool;
-  std::vector<std::exception_ptr> errors(static_cast<std::size_t>(threads));
-  pool.reserve(static_cast<std::size_t>(threads - 1));
-  const auto band = [&](int i) {
+  std::atomic<bool> failed{false};
+  detail::OnThreads(threads, failed, [&](int i) {
     const int y0 = begin + static_cast<int>(static_cast<long long>(rows) * i / threads);
     const int y1 = begin + static_cast<int>(static_cast<long long>(rows) * (i + 1) / threads);
-    try {
-      body(y0, y1);
-    } catch (...) {
-      errors[static_cast<std::size_t>(i)] = std::current_exception();
-    }
-  };
-  for (int i = 1; i < threads; ++i) pool.emplace_back(band, i);
-  band(0);
-  for (auto& t : pool) t.join();
-  for (auto& e : errors)
-    if (e) std::rethrow_exception(e);
+    body(y0, y1);
+  });
 }
 
 // Like ParallelRows for passes whose rows are independent of each other, but the threads take
@@ -94,7 +108,6 @@ void ParallelRowRuns(int begin, int end, std::size_t workPerRow, Body&& body) {
   const int shortest = std::max(1, rows / (threads * 64));
   std::atomic<int> next{begin};
   std::atomic<bool> failed{false};
-  std::vector<std::exception_ptr> errors(static_cast<std::size_t>(threads));
   const auto take = [&](int& y0, int& y1) {
     y0 = next.load(std::memory_order_relaxed);
     do {
@@ -103,21 +116,9 @@ void ParallelRowRuns(int begin, int end, std::size_t workPerRow, Body&& body) {
     } while (!next.compare_exchange_weak(y0, y1, std::memory_order_relaxed));
     return true;
   };
-  const auto work = [&](int i) {
-    try {
-      for (int y0, y1; !failed && take(y0, y1);) body(y0, y1);
-    } catch (...) {
-      errors[static_cast<std::size_t>(i)] = std::current_exception();
-      failed = true;
-    }
-  };
-  std::vector<std::thread> pool;
-  pool.reserve(static_cast<std::size_t>(threads - 1));
-  for (int i = 1; i < threads; ++i) pool.emplace_back(work, i);
-  work(0);
-  for (auto& t : pool) t.join();
-  for (auto& e : errors)
-    if (e) std::rethrow_exception(e);
+  detail::OnThreads(threads, failed, [&](int) {
+    for (int y0, y1; !failed && take(y0, y1);) body(y0, y1);
+  });
 }
 
 }  // namespace quillane
