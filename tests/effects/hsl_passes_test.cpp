@@ -3,33 +3,16 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <random>
 
 #include "data/texture_tiles.h"
 #include "effects/adjust/hsl_adjust.h"
 #include "effects/paint/color_pencil.h"
 #include "effects/surface/texture.h"
-#include "imaging/numeric.h"
 #include "imaging/tone.h"
 #include "tests/imaging/fast_path_support.h"
 
 namespace quillane {
 namespace {
-
-// Soft gradients with grain: edge maps with mid-range grays and their exact halves, and the
-// colours near gray where hue and saturation meet exact halves most.
-TBitmap32 SoftPicture(int w, int h, unsigned seed) {
-  std::mt19937 rng(seed);
-  TBitmap32 b(w, h);
-  for (int y = 0; y < h; ++y)
-    for (int x = 0; x < w; ++x) {
-      const auto channel = [&](int slope) {
-        return static_cast<std::uint8_t>(ClampByte(90 + slope * (x + 2 * y) % 110 + rng() % 9));
-      };
-      b.At(x, y) = Pixel{channel(1), channel(2), channel(3), static_cast<std::uint8_t>(rng())};
-    }
-  return b;
-}
 
 TBitmap32 Picture(int w, int h, unsigned seed) {
   return seed % 2 == 0 ? SoftPicture(w, h, seed) : RandomPicture(w, h, seed, true);

@@ -1,31 +1,13 @@
 // The fused pencil sketch against the plain one, on sizes that break vector loops and bands.
 #include <gtest/gtest.h>
 
-#include <random>
-
 #include "effects/mono/bw_sketch.h"
 #include "imaging/edge_map.h"
-#include "imaging/numeric.h"
 #include "imaging/tone.h"
 #include "tests/imaging/fast_path_support.h"
 
 namespace quillane {
 namespace {
-
-// Soft gradients with a little grain, so that the edge map has the mid-range values (and the
-// exact halves of the gray value) that noise, whose edge map is all 0 and 255, lacks.
-TBitmap32 SoftPicture(int w, int h, unsigned seed) {
-  std::mt19937 rng(seed);
-  TBitmap32 b(w, h);
-  for (int y = 0; y < h; ++y)
-    for (int x = 0; x < w; ++x) {
-      const auto channel = [&](int slope) {
-        return static_cast<std::uint8_t>(ClampByte(100 + slope * (x + y) % 120 + rng() % 9));
-      };
-      b.At(x, y) = Pixel{channel(1), channel(2), channel(3), static_cast<std::uint8_t>(rng())};
-    }
-  return b;
-}
 
 struct Tone {
   PencilToneMode mode;

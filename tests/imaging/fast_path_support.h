@@ -6,6 +6,7 @@
 
 #include <utility>
 
+#include "imaging/numeric.h"
 #include "imaging/parallel.h"
 #include "imaging/vector_dispatch.h"
 #include "tests/imaging/random_picture.h"
@@ -20,6 +21,22 @@ inline constexpr std::pair<int, int> kAwkwardSizes[] = {
     {3, 9},    {9, 4},    {10, 3},   {17, 2},   {18, 5},   {19, 3}, {33, 4},   {35, 3},
     {33, 31},  {40, 6},   {45, 8},   {66, 7},   {71, 12},  {3, 70}, {101, 13}, {259, 4},
     {300, 11}, {1026, 3}, {1027, 4}, {1060, 6}, {100, 100}};
+
+// Soft gradients with a little grain: edge maps with the mid-range values (and the exact halves
+// of the gray value) that noise, whose edge map is all 0 and 255, lacks, and the colours near
+// gray where hue and saturation meet exact halves most.
+inline TBitmap32 SoftPicture(int w, int h, unsigned seed) {
+  std::mt19937 rng(seed);
+  TBitmap32 b(w, h);
+  for (int y = 0; y < h; ++y)
+    for (int x = 0; x < w; ++x) {
+      const auto channel = [&](int slope) {
+        return static_cast<std::uint8_t>(ClampByte(90 + slope * (x + 2 * y) % 110 + rng() % 9));
+      };
+      b.At(x, y) = Pixel{channel(1), channel(2), channel(3), static_cast<std::uint8_t>(rng())};
+    }
+  return b;
+}
 
 // Sets the AVX2 choice (and optionally the row split) while it lives, then restores both.
 class FastPathVariant {
