@@ -10,16 +10,21 @@
 // Away from an exact half of those quotients the floating-point formulas land on the same
 // whole number (their error is below 1e-12, the distance to a half at least 1 / 510). At an
 // exact half their rounding errors decide, so such colours (one in twenty-five of a
-// photograph) go through the floating-point formulas themselves. The AVX2 variant takes the
-// quotients in single precision: every numerator is below 2^16 and every divisor at most 510,
-// so the quotient's floor is exact.
+// photograph) go through the floating-point formulas themselves. The AVX2 and AVX-512 variants
+// take the quotients in single precision: every numerator is below 2^16 and every divisor at
+// most 510, so the quotient's floor is exact.
 #include <algorithm>
 #include <array>
 #include <cstdint>
 #include <cstring>
 
 #if defined(__x86_64__)
+// GCC 12's AVX-512 intrinsics start some results from a deliberately undefined register, which
+// its own warning then reports from inside the header.
+#pragma GCC diagnostic push
+#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
 #include <immintrin.h>
+#pragma GCC diagnostic pop
 #endif
 
 #include "imaging/hsl_halves.h"
@@ -345,82 +350,290 @@ QUILLANE_AVX2_INLINE __m256i Load256(const void* p) {
 // Pixels per chunk: the chunk's colours, lightness and result take about 4 KB.
 constexpr int kChunk = 256;
 
+// The buffers of a chunk. Each has room for a last group that reaches past the chunk's end.
+struct ChunkRows {
+  alignas(64) std::uint16_t colour[kChunk + 32];  // H * 101 + S
+  alignas(64) std::uint16_t lightness[kChunk + 32];
+  alignas(64) std::uint32_t coloured[kChunk + 32];
+  alignas(64) std::uint32_t pixels[kChunk + 32];
+  std::int16_t halves[kChunk + 16];
+  int halfCount = 0;
+};
+
+// Lists the pixels marked in the 8-bit mask halves, from pixel i on, without a branch per pixel.
+QUILLANE_AVX2_INLINE void ListHalves(ChunkRows& rows, unsigned halves, int i) {
+  _mm_storeu_si128(reinterpret_cast<__m128i*>(rows.halves + rows.halfCount),
+                   _mm_add_epi16(_mm_cvtepu8_epi16(_mm_loadl_epi64(
+                                     reinterpret_cast<const __m128i*>(kSetBits[halves].data()))),
+                                 _mm_set1_epi16(static_cast<std::int16_t>(i))));
+  rows.halfCount += __builtin_popcount(halves);
+}
+
+// H, S and the lightness from its source of the 8 pixels from i of the chunk at x0.
+template <LightnessFrom kFrom>
+QUILLANE_AVX2_INLINE void Avx2Colours8(const Pixel* in, int x0, int i,
+                                       const LightnessSource& source, ChunkRows& rows) {
+  const HslLanes c = Avx2Hsl8(in + x0 + i);
+  __m256i l = c.l;
+  if constexpr (kFrom == LightnessFrom::Shifted) {
+    const __m256i shift = _mm256_cvtepi16_epi32(
+        _mm_loadu_si128(reinterpret_cast<const __m128i*>(source.shift + x0 + i)));
+    l = _mm256_min_epi32(_mm256_max_epi32(_mm256_add_epi32(l, shift), _mm256_setzero_si256()),
+                         _mm256_set1_epi32(100));
+  }
+  if constexpr (kFrom == LightnessFrom::Levelled) {
+    // Four bytes from each entry (the table is padded for it), the first of them kept.
+    const __m256i level = _mm256_cvtepu8_epi32(
+        _mm_loadl_epi64(reinterpret_cast<const __m128i*>(source.level + x0 + i)));
+    const __m256i at = _mm256_add_epi32(_mm256_mullo_epi32(level, _mm256_set1_epi32(101)), l);
+    l = _mm256_and_si256(
+        _mm256_i32gather_epi32(reinterpret_cast<const int*>(source.byLevel), at, 1),
+        _mm256_set1_epi32(0xFF));
+  }
+  Store16(rows.colour + i, _mm256_add_epi32(_mm256_mullo_epi32(c.h, _mm256_set1_epi32(101)), c.s));
+  Store16(rows.lightness + i, l);
+  ListHalves(rows, c.halves, i);
+}
+
+// After the groups of 8 or 16 up to pixel i: the pixels left, the halves, and the changed hue
+// and saturation from the table. The lightness past the end is zero for the last group.
+template <LightnessFrom kFrom>
+QUILLANE_AVX2_INLINE void SettleChunk(const std::uint32_t* hueSaturation, const Pixel* in, int x0,
+                                      int i, int n, const LightnessSource& source,
+                                      ChunkRows& rows) {
+  PutHalves(in + x0, rows.halves, rows.halfCount, rows.colour);
+  for (; i < n; ++i) {
+    const Pixel p = in[x0 + i];
+    const Hsl c = RgbToHsl(p.r, p.g, p.b);
+    rows.colour[i] = static_cast<std::uint16_t>(c.h * 101 + c.s);
+    rows.lightness[i] = static_cast<std::uint16_t>(LightnessAt<kFrom>(source, x0 + i, c.l));
+  }
+  for (i = 0; i < n; ++i) rows.coloured[i] = hueSaturation[rows.colour[i]];
+  for (i = n; i < n + 32; ++i) {
+    rows.coloured[i] = 0;
+    rows.lightness[i] = 0;
+  }
+}
+
+// The result goes past the caches: streaming stores spare reading each line of it before
+// writing it.
+QUILLANE_AVX2_INLINE void StreamOut(const std::uint32_t* pixels, int n, Pixel* out) {
+  auto* dst = reinterpret_cast<std::uint8_t*>(out);
+  int i = 0;
+  for (; i < n && reinterpret_cast<std::uintptr_t>(dst + 4 * i) % 32 != 0; ++i)
+    std::memcpy(dst + 4 * i, pixels + i, 4);
+  for (; i + 8 <= n; i += 8)
+    _mm256_stream_si256(reinterpret_cast<__m256i*>(dst + 4 * i), Load256(pixels + i));
+  for (; i < n; ++i) std::memcpy(dst + 4 * i, pixels + i, 4);
+}
+
 // A chunk of a row at a time: H, S and L of every pixel (the halves put right) and the
 // lightness from its source; then the changed hue and saturation from the table, and the
 // lightness blend 16 pixels per step.
 template <LightnessFrom kFrom>
 QUILLANE_AVX2 void Avx2Row(const HslChange& change, const std::uint32_t* hueSaturation,
                            const Pixel* in, Pixel* out, int width, const LightnessSource& source) {
-  alignas(32) std::uint16_t colour[kChunk + 16];  // H * 101 + S
-  alignas(32) std::uint16_t lightness[kChunk + 16];
-  alignas(32) std::uint32_t coloured[kChunk + 16];
-  alignas(32) std::uint32_t pixels[kChunk + 16];
-  std::int16_t halves[kChunk + 16];
+  ChunkRows rows;
   const __m256i moveL = _mm256_set1_epi16(static_cast<std::int16_t>(change.lightnessShift));
   for (int x0 = 0; x0 < width; x0 += kChunk) {
     const int n = std::min(kChunk, width - x0);
-    int halfCount = 0;
+    rows.halfCount = 0;
     int i = 0;
-    for (; i + 8 <= n; i += 8) {
-      const HslLanes c = Avx2Hsl8(in + x0 + i);
-      __m256i l = c.l;
-      if constexpr (kFrom == LightnessFrom::Shifted) {
-        const __m256i shift = _mm256_cvtepi16_epi32(
-            _mm_loadu_si128(reinterpret_cast<const __m128i*>(source.shift + x0 + i)));
-        l = _mm256_min_epi32(_mm256_max_epi32(_mm256_add_epi32(l, shift), _mm256_setzero_si256()),
-                             _mm256_set1_epi32(100));
-      }
-      if constexpr (kFrom == LightnessFrom::Levelled) {
-        // Four bytes from each entry (the table is padded for it), the first of them kept.
-        const __m256i level = _mm256_cvtepu8_epi32(
-            _mm_loadl_epi64(reinterpret_cast<const __m128i*>(source.level + x0 + i)));
-        const __m256i at = _mm256_add_epi32(_mm256_mullo_epi32(level, _mm256_set1_epi32(101)), l);
-        l = _mm256_and_si256(
-            _mm256_i32gather_epi32(reinterpret_cast<const int*>(source.byLevel), at, 1),
-            _mm256_set1_epi32(0xFF));
-      }
-      Store16(colour + i, _mm256_add_epi32(_mm256_mullo_epi32(c.h, _mm256_set1_epi32(101)), c.s));
-      Store16(lightness + i, l);
-      // The positions of the halves are listed without a branch per pixel.
-      _mm_storeu_si128(
-          reinterpret_cast<__m128i*>(halves + halfCount),
-          _mm_add_epi16(_mm_cvtepu8_epi16(_mm_loadl_epi64(
-                            reinterpret_cast<const __m128i*>(kSetBits[c.halves].data()))),
-                        _mm_set1_epi16(static_cast<std::int16_t>(i))));
-      halfCount += __builtin_popcount(c.halves);
-    }
-    PutHalves(in + x0, halves, halfCount, colour);
-    for (; i < n; ++i) {
-      const Pixel p = in[x0 + i];
-      const Hsl c = RgbToHsl(p.r, p.g, p.b);
-      colour[i] = static_cast<std::uint16_t>(c.h * 101 + c.s);
-      lightness[i] = static_cast<std::uint16_t>(LightnessAt<kFrom>(source, x0 + i, c.l));
-    }
-    for (i = 0; i < n; ++i) coloured[i] = hueSaturation[colour[i]];
-    // The last step of 16 may reach past the chunk's end: it works on zeros there.
-    for (i = n; i < n + 16; ++i) {
-      coloured[i] = 0;
-      lightness[i] = 0;
-    }
-
+    for (; i + 8 <= n; i += 8) Avx2Colours8<kFrom>(in, x0, i, source, rows);
+    SettleChunk<kFrom>(hueSaturation, in, x0, i, n, source, rows);
     for (i = 0; i < n; i += 16) {
-      const __m256i l = _mm256_min_epi16(
-          _mm256_max_epi16(_mm256_add_epi16(Load256(lightness + i), moveL), _mm256_setzero_si256()),
-          _mm256_set1_epi16(100));
+      const __m256i l =
+          _mm256_min_epi16(_mm256_max_epi16(_mm256_add_epi16(Load256(rows.lightness + i), moveL),
+                                            _mm256_setzero_si256()),
+                           _mm256_set1_epi16(100));
       __m256i first, second;
-      Avx2Lighten16(Load256(coloured + i), Load256(coloured + i + 8), l, first, second);
-      _mm256_store_si256(reinterpret_cast<__m256i*>(pixels + i), first);
-      _mm256_store_si256(reinterpret_cast<__m256i*>(pixels + i + 8), second);
+      Avx2Lighten16(Load256(rows.coloured + i), Load256(rows.coloured + i + 8), l, first, second);
+      _mm256_store_si256(reinterpret_cast<__m256i*>(rows.pixels + i), first);
+      _mm256_store_si256(reinterpret_cast<__m256i*>(rows.pixels + i + 8), second);
     }
-    // The result goes past the caches: streaming stores spare reading each line of it before
-    // writing it.
-    auto* dst = reinterpret_cast<std::uint8_t*>(out + x0);
-    i = 0;
-    for (; i < n && reinterpret_cast<std::uintptr_t>(dst + 4 * i) % 32 != 0; ++i)
-      std::memcpy(dst + 4 * i, pixels + i, 4);
-    for (; i + 8 <= n; i += 8)
-      _mm256_stream_si256(reinterpret_cast<__m256i*>(dst + 4 * i), Load256(pixels + i));
-    for (; i < n; ++i) std::memcpy(dst + 4 * i, pixels + i, 4);
+    StreamOut(rows.pixels, n, out + x0);
+  }
+  _mm_sfence();
+}
+
+// The same 16 pixels at a time for H, S and L and 32 for the lightness blend. On processors
+// that split these registers in two, fewer instructions still mean fewer steps to issue.
+#define QUILLANE_AVX512 [[gnu::target("avx2,avx512f,avx512bw,avx512vl,avx512dq")]]
+#define QUILLANE_AVX512_INLINE \
+  [[gnu::target("avx2,avx512f,avx512bw,avx512vl,avx512dq"), gnu::always_inline]] inline
+
+QUILLANE_AVX512_INLINE __m512i Quotient16(__m512i num, __m512i den) {
+  return _mm512_cvttps_epi32(_mm512_div_ps(_mm512_cvtepi32_ps(num), _mm512_cvtepi32_ps(den)));
+}
+
+struct HslLanes16 {
+  __m512i h, s, l;
+  unsigned halves;
+};
+
+QUILLANE_AVX512_INLINE HslLanes16 Avx512Hsl16(const Pixel* in) {
+  const __m512i p = _mm512_loadu_si512(in);
+  const __m512i byte = _mm512_set1_epi32(0xFF);
+  const __m512i b = _mm512_and_si512(p, byte);
+  const __m512i g = _mm512_and_si512(_mm512_srli_epi32(p, 8), byte);
+  const __m512i r = _mm512_and_si512(_mm512_srli_epi32(p, 16), byte);
+  const __m512i mx = _mm512_max_epi32(r, _mm512_max_epi32(g, b));
+  const __m512i mn = _mm512_min_epi32(r, _mm512_min_epi32(g, b));
+  const __m512i one = _mm512_set1_epi32(1);
+  const __m512i zero = _mm512_setzero_si512();
+  const __m512i d = _mm512_sub_epi32(mx, mn);
+  const __m512i sum = _mm512_add_epi32(mx, mn);
+  HslLanes16 out;
+  out.l = _mm512_srli_epi32(
+      _mm512_mullo_epi32(
+          _mm512_add_epi32(_mm512_mullo_epi32(sum, _mm512_set1_epi32(20)), _mm512_set1_epi32(51)),
+          _mm512_set1_epi32(41121)),
+      22);
+
+  const __m512i den =
+      _mm512_max_epi32(_mm512_min_epi32(sum, _mm512_sub_epi32(_mm512_set1_epi32(510), sum)), one);
+  const __m512i twiceDen = _mm512_add_epi32(den, den);
+  const __m512i numS = _mm512_add_epi32(_mm512_mullo_epi32(d, _mm512_set1_epi32(200)), den);
+  out.s = Quotient16(numS, twiceDen);
+  const __mmask16 halfS = _mm512_cmpeq_epi32_mask(_mm512_mullo_epi32(out.s, twiceDen), numS);
+
+  const __mmask16 redMax = _mm512_cmpeq_epi32_mask(r, mx);
+  const __mmask16 greenMax = _mm512_mask_cmpeq_epi32_mask(static_cast<__mmask16>(~redMax), g, mx);
+  __m512i signedDistance = _mm512_sub_epi32(r, g);
+  signedDistance = _mm512_mask_sub_epi32(signedDistance, greenMax, b, r);
+  signedDistance = _mm512_mask_sub_epi32(signedDistance, redMax, g, b);
+  __m512i base = _mm512_mask_mov_epi32(_mm512_set1_epi32(240), greenMax, _mm512_set1_epi32(120));
+  base = _mm512_mask_mov_epi32(base, redMax, zero);
+  const __m512i span = _mm512_max_epi32(d, one);
+  const __m512i twiceSpan = _mm512_add_epi32(span, span);
+  const __m512i numH = _mm512_add_epi32(
+      _mm512_mullo_epi32(_mm512_abs_epi32(signedDistance), _mm512_set1_epi32(120)), span);
+  const __m512i steps = Quotient16(numH, twiceSpan);
+  const __mmask16 halfH = _mm512_cmpeq_epi32_mask(_mm512_mullo_epi32(steps, twiceSpan), numH);
+  const __mmask16 negative = _mm512_cmplt_epi32_mask(signedDistance, zero);
+  const __m512i h = _mm512_mask_sub_epi32(_mm512_add_epi32(base, steps), negative, base, steps);
+  out.h = _mm512_mask_add_epi32(h, _mm512_cmplt_epi32_mask(h, zero), h, _mm512_set1_epi32(360));
+  out.halves = static_cast<unsigned>(halfS | halfH);
+  return out;
+}
+
+template <LightnessFrom kFrom>
+QUILLANE_AVX512_INLINE void Avx512Colours16(const Pixel* in, int x0, int i,
+                                            const LightnessSource& source, ChunkRows& rows) {
+  const HslLanes16 c = Avx512Hsl16(in + x0 + i);
+  __m512i l = c.l;
+  if constexpr (kFrom == LightnessFrom::Shifted) {
+    const __m512i shift = _mm512_cvtepi16_epi32(Load256(source.shift + x0 + i));
+    l = _mm512_min_epi32(_mm512_max_epi32(_mm512_add_epi32(l, shift), _mm512_setzero_si512()),
+                         _mm512_set1_epi32(100));
+  }
+  if constexpr (kFrom == LightnessFrom::Levelled) {
+    const __m512i level = _mm512_cvtepu8_epi32(
+        _mm_loadu_si128(reinterpret_cast<const __m128i*>(source.level + x0 + i)));
+    const __m512i at = _mm512_add_epi32(_mm512_mullo_epi32(level, _mm512_set1_epi32(101)), l);
+    l = _mm512_and_si512(_mm512_i32gather_epi32(at, source.byLevel, 1), _mm512_set1_epi32(0xFF));
+  }
+  _mm256_store_si256(reinterpret_cast<__m256i*>(rows.colour + i),
+                     _mm512_cvtepi32_epi16(
+                         _mm512_add_epi32(_mm512_mullo_epi32(c.h, _mm512_set1_epi32(101)), c.s)));
+  _mm256_store_si256(reinterpret_cast<__m256i*>(rows.lightness + i), _mm512_cvtepi32_epi16(l));
+  ListHalves(rows, c.halves & 0xFF, i);
+  ListHalves(rows, c.halves >> 8, i + 8);
+}
+
+// All ones in the 16-bit lanes whose value v (0..127) has its bit set in words.
+QUILLANE_AVX512_INLINE __mmask32 BitSet512(const std::array<std::uint16_t, 8>& words, __m512i v) {
+  const __m512i low = _mm512_and_si512(v, _mm512_set1_epi16(15));
+  const __m512i lowBits =
+      _mm512_broadcast_i32x4(_mm_setr_epi8(1, 2, 4, 8, 16, 32, 64, -128, 0, 0, 0, 0, 0, 0, 0, 0));
+  const __m512i highBits =
+      _mm512_broadcast_i32x4(_mm_setr_epi8(0, 0, 0, 0, 0, 0, 0, 0, 1, 2, 4, 8, 16, 32, 64, -128));
+  const __m512i both = _mm512_mullo_epi16(low, _mm512_set1_epi16(0x0101));
+  const __m512i bit = _mm512_or_si512(
+      _mm512_and_si512(_mm512_shuffle_epi8(lowBits, both), _mm512_set1_epi16(0x00FF)),
+      _mm512_and_si512(_mm512_shuffle_epi8(highBits, both), _mm512_set1_epi16(-256)));
+  const __m512i wordIndex =
+      _mm512_add_epi16(_mm512_mullo_epi16(_mm512_srli_epi16(v, 4), _mm512_set1_epi16(0x0202)),
+                       _mm512_set1_epi16(0x0100));
+  const __m512i table =
+      _mm512_broadcast_i32x4(_mm_loadu_si128(reinterpret_cast<const __m128i*>(words.data())));
+  return _mm512_cmpeq_epi16_mask(_mm512_and_si512(_mm512_shuffle_epi8(table, wordIndex), bit), bit);
+}
+
+struct LightTerms512 {
+  __m512i m, c, exactOffset, exactBit;
+};
+
+// LightTermsOf for 32 lanes.
+QUILLANE_AVX512_INLINE LightTerms512 LightTermsOf512(__m512i l) {
+  LightTerms512 t;
+  const __mmask32 bright = _mm512_cmpgt_epi16_mask(l, _mm512_set1_epi16(50));
+  t.m = _mm512_mask_sub_epi16(l, bright, _mm512_set1_epi16(100), l);
+  const __mmask32 exact = _mm512_cmpeq_epi16_mask(l, _mm512_set1_epi16(25)) |
+                          _mm512_cmpeq_epi16_mask(l, _mm512_set1_epi16(75));
+  const __mmask32 down = BitSet512(LightnessBelow(), l) | exact;
+  t.c =
+      _mm512_add_epi16(_mm512_maskz_mullo_epi16(bright, _mm512_sub_epi16(l, _mm512_set1_epi16(50)),
+                                                _mm512_set1_epi16(255)),
+                       _mm512_mask_sub_epi16(_mm512_set1_epi16(25), down, _mm512_set1_epi16(25),
+                                             _mm512_set1_epi16(1)));
+  t.exactOffset = _mm512_maskz_mov_epi16(exact & bright, _mm512_set1_epi16(255));
+  t.exactBit = _mm512_maskz_mov_epi16(exact, _mm512_set1_epi16(1));
+  return t;
+}
+
+QUILLANE_AVX512_INLINE __m512i LightBlend512(__m512i x, const LightTerms512& t) {
+  const __m512i evenHalf =
+      _mm512_and_si512(_mm512_srli_epi16(_mm512_add_epi16(x, t.exactOffset), 1), t.exactBit);
+  const __m512i n = _mm512_add_epi16(_mm512_add_epi16(_mm512_mullo_epi16(x, t.m), t.c), evenHalf);
+  return _mm512_srli_epi16(_mm512_mulhi_epu16(n, _mm512_set1_epi16(-23592)), 5);  // 41944
+}
+
+// Avx2Lighten16 for 32 pixels; packing keeps 128-bit quarters apart, so the channels come in
+// groups of four pixels from first and second in turn.
+QUILLANE_AVX512_INLINE void Avx512Lighten32(__m512i first, __m512i second, __m512i l, __m512i& out0,
+                                            __m512i& out1) {
+  const __m512i byte = _mm512_set1_epi32(0xFF);
+  const __m512i blue =
+      _mm512_packus_epi32(_mm512_and_si512(first, byte), _mm512_and_si512(second, byte));
+  const __m512i green = _mm512_packus_epi32(_mm512_and_si512(_mm512_srli_epi32(first, 8), byte),
+                                            _mm512_and_si512(_mm512_srli_epi32(second, 8), byte));
+  const __m512i red =
+      _mm512_packus_epi32(_mm512_srli_epi32(first, 16), _mm512_srli_epi32(second, 16));
+  const LightTerms512 t =
+      LightTermsOf512(_mm512_permutexvar_epi64(_mm512_setr_epi64(0, 4, 1, 5, 2, 6, 3, 7), l));
+  const __m512i blueGreen =
+      _mm512_or_si512(LightBlend512(blue, t), _mm512_slli_epi16(LightBlend512(green, t), 8));
+  const __m512i redAlpha = _mm512_or_si512(LightBlend512(red, t), _mm512_set1_epi16(-256));
+  out0 = _mm512_unpacklo_epi16(blueGreen, redAlpha);
+  out1 = _mm512_unpackhi_epi16(blueGreen, redAlpha);
+}
+
+template <LightnessFrom kFrom>
+QUILLANE_AVX512 void Avx512Row(const HslChange& change, const std::uint32_t* hueSaturation,
+                               const Pixel* in, Pixel* out, int width,
+                               const LightnessSource& source) {
+  ChunkRows rows;
+  const __m512i moveL = _mm512_set1_epi16(static_cast<std::int16_t>(change.lightnessShift));
+  for (int x0 = 0; x0 < width; x0 += kChunk) {
+    const int n = std::min(kChunk, width - x0);
+    rows.halfCount = 0;
+    int i = 0;
+    for (; i + 16 <= n; i += 16) Avx512Colours16<kFrom>(in, x0, i, source, rows);
+    for (; i + 8 <= n; i += 8) Avx2Colours8<kFrom>(in, x0, i, source, rows);
+    SettleChunk<kFrom>(hueSaturation, in, x0, i, n, source, rows);
+    for (i = 0; i < n; i += 32) {
+      const __m512i l = _mm512_min_epi16(
+          _mm512_max_epi16(_mm512_add_epi16(_mm512_load_si512(rows.lightness + i), moveL),
+                           _mm512_setzero_si512()),
+          _mm512_set1_epi16(100));
+      __m512i first, second;
+      Avx512Lighten32(_mm512_load_si512(rows.coloured + i),
+                      _mm512_load_si512(rows.coloured + i + 16), l, first, second);
+      _mm512_store_si512(rows.pixels + i, first);
+      _mm512_store_si512(rows.pixels + i + 16, second);
+    }
+    StreamOut(rows.pixels, n, out + x0);
   }
   _mm_sfence();
 }
@@ -431,6 +644,7 @@ void ChangeRow(const HslChange& change, const std::uint32_t* hueSaturation,
                const std::uint8_t* lightRows, const Pixel* in, Pixel* out, int width,
                const LightnessSource& source) {
 #if defined(__x86_64__) && defined(__GNUC__)
+  if (UseAvx512()) return Avx512Row<kFrom>(change, hueSaturation, in, out, width, source);
   if (UseAvx2()) return Avx2Row<kFrom>(change, hueSaturation, in, out, width, source);
 #endif
   PlainRow<kFrom>(hueSaturation, lightRows, in, out, 0, width, source);

@@ -1,13 +1,20 @@
-// Which variant of a routine runs: routines that have one compiled for AVX2 use it when this
-// processor has the instructions, so that the program still runs on any x86-64. Both variants
-// give the same bytes; the tests turn the faster one off to compare the other as well.
+// Which variant of a routine runs: routines that have one compiled for AVX2 (and some for
+// AVX-512) use the widest this processor has, so that the program still runs on any x86-64.
+// Every variant gives the same bytes; the tests narrow the choice to compare the others too.
 #pragma once
 
 namespace quillane {
 
-// Whether AVX2 variants run: the processor has AVX2 and they are allowed (the default).
+enum class VectorWidth { Plain, Avx2, Avx512 };
+
+// Whether AVX2 variants run: the processor has AVX2 and the widest allowed is at least that.
 bool UseAvx2();
 
-void SetAvx2Allowed(bool allowed);
+// Whether AVX-512 variants run: the processor has AVX-512 F, BW, VL and DQ besides AVX2, and
+// they are allowed.
+bool UseAvx512();
+
+// The widest variants allowed to run; the default allows all.
+void SetWidestVectors(VectorWidth widest);
 
 }  // namespace quillane

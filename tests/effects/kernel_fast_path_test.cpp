@@ -81,7 +81,7 @@ TEST(EmbossFastPath, EveryReliefByteAndEveryGrayValueAsThePlainVariant) {
   };
   const auto same = [&in](int lighting) {
     const TBitmap32 fast = emboss(in, lighting, 1);
-    const FastPathVariant plain(false);
+    const FastPathVariant plain(VectorWidth::Plain);
     return fast == emboss(in, lighting, 1);
   };
   const auto gray = [](int v) {

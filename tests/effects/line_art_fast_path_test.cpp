@@ -83,7 +83,7 @@ TEST(LineArtFastPath, InkThresholdIsTheExtendedGrayNextToEveryHalf) {
       }
   std::vector<std::uint8_t> gray(row.size()), cells(row.size());
   for (std::size_t i = 0; i < row.size(); ++i) gray[i] = InkGrayValue(row[i].r, row[i].g, row[i].b);
-  ForEachAvx2([&] {
+  ForEachVectorWidth([&] {
     for (int t = 0; t < 256; ++t) {
       InkThresholdCells(row.data(), static_cast<int>(row.size()), t, cells.data());
       for (std::size_t i = 0; i < row.size(); ++i)

@@ -1,4 +1,4 @@
-// Water colour and Brume on every path they can take (AVX2 or not, one band or many) against
+// Water colour and Brume on every path they can take (vectors or not, one band or many) against
 // their plain references, on pictures whose sizes leave odd remainders everywhere.
 #include <gtest/gtest.h>
 
@@ -13,30 +13,32 @@ namespace quillane {
 namespace {
 
 // Many bands: up to 7 of them, whatever the picture's size.
-const std::pair<bool, RowSplit> kPaths[] = {
-    {true, {}}, {false, {}}, {true, {7, 1}}, {false, {7, 1}}};
+const std::pair<VectorWidth, RowSplit> kPaths[] = {{VectorWidth::Avx512, {}},
+                                                   {VectorWidth::Plain, {}},
+                                                   {VectorWidth::Avx512, {7, 1}},
+                                                   {VectorWidth::Plain, {7, 1}}};
 
 const std::pair<int, int> kSizes[] = {{1, 1},  {1, 9},  {9, 1},  {3, 3},  {4, 3},   {11, 5},
                                       {9, 13}, {17, 4}, {34, 6}, {45, 2}, {4101, 5}};
 
 TEST(PaintFastPaths, WaterColorGivesTheReferenceBytes) {
-  for (const auto& [avx2, split] : kPaths)
+  for (const auto& [widest, split] : kPaths)
     for (auto [w, h] : kSizes) {
-      const FastPathVariant variant(avx2, split);
+      const FastPathVariant variant(widest, split);
       const TBitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w * 31 + h));
       for (int cycles : {1, 2, 5}) {
         if (w > 100 && cycles == 5) continue;
         ASSERT_EQ(watercolor(in, cycles), WaterColorReference(in, cycles))
-            << w << "x" << h << " cycles " << cycles << " avx2 " << avx2;
+            << w << "x" << h << " cycles " << cycles << " " << WidthName(widest);
       }
     }
 }
 
 TEST(PaintFastPaths, EachPassGivesItsFormulaAndLeavesTheFrame) {
   const Pixel untouched{1, 2, 3, 4};
-  for (const auto& [avx2, split] : kPaths)
+  for (const auto& [widest, split] : kPaths)
     for (int w = 3; w < 44; w += 5) {
-      const FastPathVariant variant(avx2, split);
+      const FastPathVariant variant(widest, split);
       // Random bytes, and the extremes that make the sharpening clamp both ways.
       TBitmap32 in = RandomPicture(w, 4, static_cast<unsigned>(w));
       for (int x = 0; x < w; x += 2) in.At(x, 1) = in.At(x, 2) = Pixel{0, 255, 0, 9};
@@ -66,15 +68,15 @@ TEST(PaintFastPaths, EachPassGivesItsFormulaAndLeavesTheFrame) {
 }
 
 TEST(PaintFastPaths, BrumeDrawsWhatThePlainLoopDraws) {
-  for (const auto& [avx2, split] : kPaths)
+  for (const auto& [widest, split] : kPaths)
     for (auto [w, h] : kSizes)
       for (int scope : {1, 3, 10}) {
-        const FastPathVariant variant(avx2, split);
+        const FastPathVariant variant(widest, split);
         const TBitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w + h));
         std::uint32_t fast = 0xDEADBEEF, plain = 0xDEADBEEF;
         for (int run = 0; run < 2; ++run)  // the second run goes on from the first one's seed
           ASSERT_EQ(Brume(in, scope, fast), BrumeReference(in, scope, plain))
-              << w << "x" << h << " scope " << scope << " avx2 " << avx2;
+              << w << "x" << h << " scope " << scope << " " << WidthName(widest);
         ASSERT_EQ(fast, plain);
       }
 }

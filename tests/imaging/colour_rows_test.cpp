@@ -31,7 +31,7 @@ std::vector<Pixel> Pixels(int n, unsigned seed) {
 TEST(GrayRow, EveryColourHasItsGrayValue) {
   // One row per red level, holding every green and blue level.
   std::vector<Pixel> in(65536), out(65536);
-  ForEachAvx2([&] {
+  ForEachVectorWidth([&] {
     for (int r = 0; r < 256; ++r) {
       for (int i = 0; i < 65536; ++i)
         in[static_cast<std::size_t>(i)] =
@@ -49,7 +49,7 @@ TEST(GrayRow, EveryColourHasItsGrayValue) {
 
 TEST(GrayRow, RaisedChannelsAtEveryAlignmentAndLength) {
   const std::vector<Pixel> in = Pixels(80, 1);
-  ForEachAvx2([&] {
+  ForEachVectorWidth([&] {
     for (const std::uint32_t set : {0x00FF0000u, 0x0000FFFFu, 0x00FF00FFu})
       for (int offset = 0; offset < 8; ++offset)
         for (int n = 0; n <= 40; ++n) {
@@ -67,7 +67,7 @@ TEST(TintRow, EqualsTintedPixelByPixel) {
                                {.add = 0x00505000, .clear = 0xFF0000FF},
                                {.add = 0x00000032, .set = 0x0000FF00}};
   const std::vector<Pixel> in = Pixels(100, 2), alphas = Pixels(50, 3);
-  ForEachAvx2([&] {
+  ForEachVectorWidth([&] {
     for (const ChannelTint& tint : tints)
       for (const int stride : {1, 2})
         for (const bool withAlpha : {false, true})

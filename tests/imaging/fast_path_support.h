@@ -38,39 +38,47 @@ inline TBitmap32 SoftPicture(int w, int h, unsigned seed) {
   return b;
 }
 
-// Sets the AVX2 choice (and optionally the row split) while it lives, then restores both.
+// Sets the widest vectors allowed (and optionally the row split) while it lives, then restores
+// both.
 class FastPathVariant {
  public:
-  explicit FastPathVariant(bool avx2, RowSplit split = {}) {
+  explicit FastPathVariant(VectorWidth widest, RowSplit split = {}) {
     SetRowSplit(split);
-    SetAvx2Allowed(avx2);
+    SetWidestVectors(widest);
   }
   ~FastPathVariant() {
     SetRowSplit({});
-    SetAvx2Allowed(true);
+    SetWidestVectors(VectorWidth::Avx512);
   }
 };
 
-// Runs fn in one band with AVX2, in many bands with AVX2 and in many bands without it, stopping
-// at the first fatal failure; the failure messages say which.
+inline const char* WidthName(VectorWidth width) {
+  return width == VectorWidth::Avx512 ? "AVX-512" : (width == VectorWidth::Avx2 ? "AVX2" : "plain");
+}
+
+// Runs fn in one band with the widest vectors, in many bands with AVX2 at most and in many
+// bands with the plain variants, stopping at the first fatal failure; the failure messages say
+// which.
 template <typename Fn>
 void ForEachSplit(Fn&& fn) {
-  const std::pair<RowSplit, bool> variants[] = {
-      {{1, kParallelThreshold}, true}, {{5, 0}, true}, {{3, 0}, false}};
-  for (const auto& [split, avx2] : variants) {
-    SCOPED_TRACE(::testing::Message() << "bands " << split.threads << " avx2 " << avx2);
-    const FastPathVariant variant(avx2, split);
+  const std::pair<RowSplit, VectorWidth> variants[] = {
+      {{1, kParallelThreshold}, VectorWidth::Avx512},
+      {{5, 0}, VectorWidth::Avx2},
+      {{3, 0}, VectorWidth::Plain}};
+  for (const auto& [split, widest] : variants) {
+    SCOPED_TRACE(::testing::Message() << "bands " << split.threads << ", " << WidthName(widest));
+    const FastPathVariant variant(widest, split);
     fn();
     if (::testing::Test::HasFatalFailure()) return;
   }
 }
 
-// Runs fn with and without the AVX2 variants.
+// Runs fn with each width of vectors allowed at most.
 template <typename Fn>
-void ForEachAvx2(Fn&& fn) {
-  for (const bool avx2 : {true, false}) {
-    SCOPED_TRACE(::testing::Message() << "avx2 " << avx2);
-    const FastPathVariant variant(avx2);
+void ForEachVectorWidth(Fn&& fn) {
+  for (const VectorWidth widest : {VectorWidth::Avx512, VectorWidth::Avx2, VectorWidth::Plain}) {
+    SCOPED_TRACE(WidthName(widest));
+    const FastPathVariant variant(widest);
     fn();
     if (::testing::Test::HasFatalFailure()) return;
   }

@@ -42,7 +42,7 @@ TEST(GrayEdgeHalves, RowsAndCellsSettleEveryHalfAsGrayValue) {
 
   std::vector<std::uint8_t> gray(w), cells(w);
   for (const bool avx2 : {true, false}) {
-    SetAvx2Allowed(avx2);
+    SetWidestVectors(avx2 ? VectorWidth::Avx512 : VectorWidth::Plain);
     for (int y = 0; y < h; ++y) {
       GrayEdgeRow(source, y, gray.data());
       for (int level = -1; level <= 255; ++level) {
@@ -56,7 +56,7 @@ TEST(GrayEdgeHalves, RowsAndCellsSettleEveryHalfAsGrayValue) {
       }
     }
   }
-  SetAvx2Allowed(true);
+  SetWidestVectors(VectorWidth::Avx512);
 }
 
 }  // namespace

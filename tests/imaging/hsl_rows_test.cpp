@@ -1,4 +1,4 @@
-// The row passes of the colour model in both variants (AVX2 and plain) against the plain
+// The row passes of the colour model in every variant (AVX-512, AVX2, plain) against the plain
 // conversions, for every colour there is and every H, S and L that comes back; the effects'
 // tests take them through awkward sizes and bands.
 #include <gtest/gtest.h>
@@ -12,10 +12,10 @@
 namespace quillane {
 namespace {
 
-constexpr bool kVariants[] = {true, false};  // AVX2 allowed, then the plain variant
+constexpr VectorWidth kVariants[] = {VectorWidth::Avx512, VectorWidth::Avx2, VectorWidth::Plain};
 
-struct AllowAvx2Afterwards {
-  ~AllowAvx2Afterwards() { SetAvx2Allowed(true); }
+struct AllowAllAfterwards {
+  ~AllowAllAfterwards() { SetWidestVectors(VectorWidth::Avx512); }
 };
 
 Pixel Colour(int r, int g, int b) {
@@ -28,7 +28,7 @@ class EveryColourInRows : public ::testing::TestWithParam<int> {};
 INSTANTIATE_TEST_SUITE_P(RedLevels, EveryColourInRows, ::testing::Range(0, 256, 32));
 
 TEST_P(EveryColourInRows, BothVariantsEqualThePlainConversions) {
-  AllowAvx2Afterwards restore;
+  AllowAllAfterwards restore;
   const HslRowChanger unchanged(HslChange{});
   std::vector<Pixel> row(256 * 256);
   std::vector<Hsl> expected(row.size()), hsl(row.size());
@@ -43,13 +43,15 @@ TEST_P(EveryColourInRows, BothVariantsEqualThePlainConversions) {
         back[i] = Pixel{static_cast<std::uint8_t>(o.b), static_cast<std::uint8_t>(o.g),
                         static_cast<std::uint8_t>(o.r), 255};
       }
-    for (bool avx2 : kVariants) {
-      SetAvx2Allowed(avx2);
+    for (const VectorWidth widest : kVariants) {
+      SetWidestVectors(widest);
       RgbToHslRow(row.data(), hsl.data(), static_cast<int>(row.size()));
       unchanged.Row(row.data(), out.data(), static_cast<int>(row.size()));
       for (std::size_t i = 0; i < row.size(); ++i) {
-        ASSERT_EQ(hsl[i], expected[i]) << r << "," << i / 256 << "," << i % 256 << " " << avx2;
-        ASSERT_EQ(out[i], back[i]) << r << "," << i / 256 << "," << i % 256 << " " << avx2;
+        ASSERT_EQ(hsl[i], expected[i])
+            << r << "," << i / 256 << "," << i % 256 << " " << static_cast<int>(widest);
+        ASSERT_EQ(out[i], back[i])
+            << r << "," << i / 256 << "," << i % 256 << " " << static_cast<int>(widest);
       }
     }
   }
@@ -58,7 +60,7 @@ TEST_P(EveryColourInRows, BothVariantsEqualThePlainConversions) {
 // Every H, S and L the conversion back can meet: a saturated colour of each hue, its S moved
 // down by the change and its L set through the levels.
 TEST(HslRowChanger, EveryHslComesBackAsTheTablesGiveIt) {
-  AllowAvx2Afterwards restore;
+  AllowAllAfterwards restore;
   std::vector<Pixel> hues(360);
   std::vector<bool> found(360);
   for (int c = 0; c < 6 * 256; ++c) {
@@ -82,8 +84,8 @@ TEST(HslRowChanger, EveryHslComesBackAsTheTablesGiveIt) {
   for (int level0 = 0; level0 <= 100; ++level0)
     for (int l = 0; l <= 100; ++l)
       asLevel.at[static_cast<std::size_t>(level0 * 101 + l)] = static_cast<std::uint8_t>(level0);
-  for (bool avx2 : kVariants) {
-    SetAvx2Allowed(avx2);
+  for (const VectorWidth widest : kVariants) {
+    SetWidestVectors(widest);
     for (int s = 0; s <= 100; ++s) {
       HslRowChanger(HslChange{0, s - 100, 0})
           .RowWithLevels(in.data(), out.data(), static_cast<int>(in.size()), level.data(), asLevel);
@@ -92,15 +94,15 @@ TEST(HslRowChanger, EveryHslComesBackAsTheTablesGiveIt) {
         const Rgb e = HslToRgb(h, s, l);
         ASSERT_EQ(out[i], (Pixel{static_cast<std::uint8_t>(e.b), static_cast<std::uint8_t>(e.g),
                                  static_cast<std::uint8_t>(e.r), 255}))
-            << h << "," << s << "," << l << " avx2=" << avx2;
+            << h << "," << s << "," << l << " width " << static_cast<int>(widest);
       }
     }
   }
 }
 
 // Every level with every L, each pair to its own entry, up to the table's last one.
-TEST(HslRowChanger, LevelsReachEveryEntryInBothVariants) {
-  AllowAvx2Afterwards restore;
+TEST(HslRowChanger, LevelsReachEveryEntryInEveryVariant) {
+  AllowAllAfterwards restore;
   std::vector<Pixel> grayOf(101);  // a gray of each L
   for (int v = 0; v < 256; ++v)
     grayOf[static_cast<std::size_t>(RgbToHsl(v, v, v).l)] = Colour(v, v, v);
@@ -112,18 +114,15 @@ TEST(HslRowChanger, LevelsReachEveryEntryInBothVariants) {
     in.push_back(grayOf[static_cast<std::size_t>(k % 101)]);
     level.push_back(static_cast<std::uint8_t>(k / 101));
   }
-  std::vector<Pixel> out[2] = {std::vector<Pixel>(in.size()), std::vector<Pixel>(in.size())};
-  for (int v = 0; v < 2; ++v) {
-    SetAvx2Allowed(kVariants[v]);
+  std::vector<Pixel> out(in.size());
+  for (const VectorWidth widest : kVariants) {
+    SetWidestVectors(widest);
     HslRowChanger(HslChange{})
-        .RowWithLevels(in.data(), out[v].data(), static_cast<int>(in.size()), level.data(),
-                       byLevel);
-  }
-  for (std::size_t k = 0; k < in.size(); ++k) {
-    const int l = static_cast<int>(k * 37 % 101), g = HslToRgb(0, 0, l).r;
-    ASSERT_EQ(out[0][k], out[1][k]) << k;
-    const auto v = static_cast<std::uint8_t>(g);
-    ASSERT_EQ(out[1][k], (Pixel{v, v, v, 255})) << k;
+        .RowWithLevels(in.data(), out.data(), static_cast<int>(in.size()), level.data(), byLevel);
+    for (std::size_t k = 0; k < in.size(); ++k) {
+      const auto v = static_cast<std::uint8_t>(HslToRgb(0, 0, static_cast<int>(k * 37 % 101)).r);
+      ASSERT_EQ(out[k], (Pixel{v, v, v, 255})) << k << " width " << static_cast<int>(widest);
+    }
   }
 }
 
