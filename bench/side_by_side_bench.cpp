@@ -16,6 +16,7 @@
 #include "effects/registry.h"
 #include "imaging/parallel.h"
 #include "imaging/picture_memory.h"
+#include "imaging/vector_dispatch.h"
 
 #ifdef QUILLANE_HAVE_OPENCV
 #include <opencv2/core.hpp>
@@ -147,9 +148,9 @@ void PrintTable(const MedianReporter& r) {
   const unsigned cores = std::max(1u, std::thread::hardware_concurrency());
   std::printf(
       "\n12-megapixel photo (%d x %d): memcpy %.2f ms = 1x (spread %.0f%%), %.2f ms of "
-      "processor time; load average %.1f on %u cores.\n",
+      "processor time; load average %.1f on %u cores; widest vectors: %s.\n",
       kWidth, kHeight, floor, r.spreads.count("memcpy") ? r.spreads.at("memcpy") : 0.0, cpuFloor,
-      Load(), cores);
+      Load(), cores, UseAvx512() ? "AVX-512" : (UseAvx2() ? "AVX2" : "none"));
   std::printf(
       "Medians of 5 repetitions, wall-clock time as a multiple of the memcpy's; "
       "cpu x: one thread's processor time\nas a multiple of the memcpy's, which other "

@@ -9,7 +9,12 @@
 #include <vector>
 
 #if defined(__x86_64__)
+// GCC 12's AVX-512 intrinsics start some results from a deliberately undefined register, which
+// its own warning then reports from inside the header.
+#pragma GCC diagnostic push
+#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
 #include <immintrin.h>
+#pragma GCC diagnostic pop
 #endif
 
 #include "imaging/edge_byte.h"
@@ -193,8 +198,36 @@ void PlainPixels(const std::uint8_t* level, int n, const std::uint32_t* pixelOf,
   if (j < bytes) EdgeStretch(above + j, row + j, below + j, x0, (bytes - j) / 4, edge + j);
 }
 
-// The gray values 32 pixels at a time. A group with exact halves in it settles them all at
-// once from the table, whose gathers cost less than a call and a mispredicted branch per half.
+// The gray values of 32 pixels from their edge bytes e. A group with exact halves in it settles
+// them all at once from the table, whose gathers cost less than a call and a mispredicted
+// branch per half.
+[[gnu::target("avx2"), gnu::always_inline]] inline void Avx2Levels32(const std::uint8_t* e,
+                                                                     const std::uint8_t* table,
+                                                                     std::uint8_t* level) {
+  const __m256i e0 = Load32(e), e1 = Load32(e + 32), e2 = Load32(e + 64), e3 = Load32(e + 96);
+  // Packing works within halves of the register: the order is restored at the end.
+  const __m256i s01 = _mm256_packus_epi32(Sums8(e0), Sums8(e1));
+  const __m256i s23 = _mm256_packus_epi32(Sums8(e2), Sums8(e3));
+  __m256i h01, h23;
+  __m256i l01 = Levels16(s01, h01);
+  __m256i l23 = Levels16(s23, h23);
+  if (!_mm256_testz_si256(h01, h01) || !_mm256_testz_si256(h23, h23)) {
+    l01 = _mm256_add_epi16(l01, _mm256_and_si256(h01, HalfRoundsUp16(e0, e1, table)));
+    l23 = _mm256_add_epi16(l23, _mm256_and_si256(h23, HalfRoundsUp16(e2, e3, table)));
+  }
+  const __m256i bytes = _mm256_permutevar8x32_epi32(_mm256_packus_epi16(l01, l23),
+                                                    _mm256_setr_epi32(0, 4, 1, 5, 2, 6, 3, 7));
+  _mm256_storeu_si256(reinterpret_cast<__m256i*>(level), bytes);
+}
+
+// The gray values of the pixels from x on, the plain way.
+inline void LevelsFrom(const std::uint8_t* edge, int x, int n, std::uint8_t* level,
+                       std::uint8_t* half) {
+  if (x < n && GrayStretch(edge + 4 * x, n - x, level + x, half))
+    for (int i = x; i < n; ++i)
+      if (half[i - x]) HalvesOf(edge, level, i);
+}
+
 [[gnu::target("avx2")]] void Avx2Levels(const std::uint8_t* above, const std::uint8_t* row,
                                         const std::uint8_t* below, int x0, int n, int /*level*/,
                                         std::uint8_t* level) {
@@ -202,27 +235,134 @@ void PlainPixels(const std::uint8_t* level, int n, const std::uint32_t* pixelOf,
   std::uint8_t half[kStretch];
   Avx2EdgeStretch(above, row, below, x0, n, edge);
   const std::uint8_t* table = GrayHalfRoundsUp();
-  const __m256i order = _mm256_setr_epi32(0, 4, 1, 5, 2, 6, 3, 7);
   int x = 0;
-  for (; x + 32 <= n; x += 32) {
-    const std::uint8_t* e = edge + 4 * x;
-    const __m256i e0 = Load32(e), e1 = Load32(e + 32), e2 = Load32(e + 64), e3 = Load32(e + 96);
-    // Packing works within halves of the register: the order is restored at the end.
-    const __m256i s01 = _mm256_packus_epi32(Sums8(e0), Sums8(e1));
-    const __m256i s23 = _mm256_packus_epi32(Sums8(e2), Sums8(e3));
-    __m256i h01, h23;
-    __m256i l01 = Levels16(s01, h01);
-    __m256i l23 = Levels16(s23, h23);
-    if (!_mm256_testz_si256(h01, h01) || !_mm256_testz_si256(h23, h23)) {
-      l01 = _mm256_add_epi16(l01, _mm256_and_si256(h01, HalfRoundsUp16(e0, e1, table)));
-      l23 = _mm256_add_epi16(l23, _mm256_and_si256(h23, HalfRoundsUp16(e2, e3, table)));
+  for (; x + 32 <= n; x += 32) Avx2Levels32(edge + 4 * x, table, level + x);
+  LevelsFrom(edge, x, n, level, half);
+}
+
+// The same with twice as many lanes, for processors with AVX-512 (F, BW, VL and DQ).
+#define QUILLANE_AVX512 [[gnu::target("avx2,avx512f,avx512bw,avx512vl,avx512dq")]]
+#define QUILLANE_AVX512_INLINE \
+  [[gnu::target("avx2,avx512f,avx512bw,avx512vl,avx512dq"), gnu::always_inline]] inline
+
+QUILLANE_AVX512_INLINE __m512i Widened32(const std::uint8_t* p) {
+  return _mm512_cvtepu8_epi16(_mm256_loadu_si256(reinterpret_cast<const __m256i*>(p)));
+}
+
+QUILLANE_AVX512_INLINE __m512i At32(const std::int16_t* p) {
+  return _mm512_loadu_si512(p);
+}
+
+QUILLANE_AVX512_INLINE __m512i ResponseOfSums32(const std::int16_t* vertical,
+                                                const std::int16_t* column, const std::uint8_t* row,
+                                                int j) {
+  const __m512i outer = _mm512_add_epi16(
+      _mm512_add_epi16(At32(vertical + j), At32(vertical + j + 4)), At32(vertical + j + 8));
+  const __m512i line =
+      _mm512_sub_epi16(_mm512_mullo_epi16(Widened32(row + j), _mm512_set1_epi16(6)), outer);
+  return _mm512_max_epi16(line, _mm512_sub_epi16(At32(column + j), At32(column + j + 8)));
+}
+
+// Avx2EdgeStretch 64 bytes at a time; the bytes after the last 64 go the AVX2 way.
+QUILLANE_AVX512_INLINE void Avx512EdgeStretch(const std::uint8_t* above, const std::uint8_t* row,
+                                              const std::uint8_t* below, int x0, int n,
+                                              std::uint8_t* edge) {
+  const int first = 4 * x0;
+  const int bytes = 4 * n;
+  constexpr int kBlock = 256;
+  alignas(64) std::int16_t vertical[kBlock + 8], column[kBlock + 8];
+  int j = 0;
+  while (j + 64 <= bytes) {
+    const int m = std::min(kBlock, (bytes - j) / 64 * 64);
+    const int i0 = first + j - 4;
+    int k = 0;
+    for (; k < m; k += 32) {
+      const __m512i v = _mm512_add_epi16(Widened32(above + i0 + k), Widened32(below + i0 + k));
+      _mm512_store_si512(vertical + k, v);
+      _mm512_store_si512(column + k, _mm512_add_epi16(v, Widened32(row + i0 + k)));
     }
-    const __m256i bytes = _mm256_permutevar8x32_epi32(_mm256_packus_epi16(l01, l23), order);
-    _mm256_storeu_si256(reinterpret_cast<__m256i*>(level + x), bytes);
+    // The last eight, read eight bytes wide: more would pass the row's end.
+    const __m128i v = _mm_add_epi16(Widened8(above + i0 + k), Widened8(below + i0 + k));
+    _mm_store_si128(reinterpret_cast<__m128i*>(vertical + k), v);
+    _mm_store_si128(reinterpret_cast<__m128i*>(column + k),
+                    _mm_add_epi16(v, Widened8(row + i0 + k)));
+    for (int r = 0; r < m; r += 64) {
+      const __m512i packed =
+          _mm512_packus_epi16(ResponseOfSums32(vertical, column, row + first + j, r),
+                              ResponseOfSums32(vertical, column, row + first + j, r + 32));
+      const __m512i ordered =
+          _mm512_permutexvar_epi64(_mm512_setr_epi64(0, 2, 4, 6, 1, 3, 5, 7), packed);
+      _mm512_store_si512(edge + j + r, _mm512_xor_si512(ordered, _mm512_set1_epi8(-1)));
+    }
+    j += m;
   }
-  if (x < n && GrayStretch(edge + 4 * x, n - x, level + x, half))
-    for (int i = x; i < n; ++i)
-      if (half[i - x]) HalvesOf(edge, level, i);
+  if (j < bytes) Avx2EdgeStretch(above, row, below, x0 + j / 4, n - j / 4, edge + j);
+}
+
+QUILLANE_AVX512_INLINE __m512i Sums16(__m512i e) {
+  return _mm512_madd_epi16(_mm512_maddubs_epi16(e, _mm512_set1_epi32(0x001E3B0B)),
+                           _mm512_set1_epi16(1));
+}
+
+// Levels16 for 32 sums, the halves marked in a mask.
+QUILLANE_AVX512_INLINE __m512i Levels32(__m512i s, __mmask32& halves) {
+  const __m512i fifty = _mm512_set1_epi16(50);
+  const __m512i k = _mm512_srli_epi16(_mm512_mulhi_epu16(s, _mm512_set1_epi16(5243)), 3);
+  const __m512i rest = _mm512_sub_epi16(s, _mm512_mullo_epi16(k, _mm512_set1_epi16(100)));
+  halves = _mm512_cmpeq_epi16_mask(rest, fifty);
+  return _mm512_mask_add_epi16(k, _mm512_cmpgt_epi16_mask(rest, fifty), k, _mm512_set1_epi16(1));
+}
+
+// HalfRoundsUp8 for 16 pixels.
+QUILLANE_AVX512_INLINE __m512i HalfRoundsUp16x(__m512i v, const std::uint8_t* table) {
+  const __m512i redGreen =
+      _mm512_shuffle_epi8(v, _mm512_broadcast_i32x4(_mm_setr_epi8(1, 2, -1, -1, 5, 6, -1, -1, 9, 10,
+                                                                  -1, -1, 13, 14, -1, -1)));
+  const __m512i bits = _mm512_i32gather_epi32(redGreen, table, 1);
+  const __m512i blue = _mm512_and_si512(v, _mm512_set1_epi32(0xFF));
+  const __m512i one = _mm512_set1_epi32(1);
+  __m512i hundreds =
+      _mm512_maskz_mov_epi32(_mm512_cmpgt_epi32_mask(blue, _mm512_set1_epi32(99)), one);
+  hundreds = _mm512_mask_add_epi32(hundreds, _mm512_cmpgt_epi32_mask(blue, _mm512_set1_epi32(199)),
+                                   hundreds, one);
+  return _mm512_and_si512(_mm512_srlv_epi32(bits, hundreds), one);
+}
+
+// The gray values of 64 pixels from their edge bytes e, as Avx2Levels32.
+QUILLANE_AVX512_INLINE void Avx512Levels64(const std::uint8_t* e, const std::uint8_t* table,
+                                           std::uint8_t* level) {
+  const __m512i e0 = _mm512_load_si512(e), e1 = _mm512_load_si512(e + 64);
+  const __m512i e2 = _mm512_load_si512(e + 128), e3 = _mm512_load_si512(e + 192);
+  // Packing works within quarters of the register: the order is restored at the end.
+  const __m512i s01 = _mm512_packus_epi32(Sums16(e0), Sums16(e1));
+  const __m512i s23 = _mm512_packus_epi32(Sums16(e2), Sums16(e3));
+  __mmask32 h01, h23;
+  __m512i l01 = Levels32(s01, h01);
+  __m512i l23 = Levels32(s23, h23);
+  // Each half of the group looks its halves up only when it has some.
+  if (h01 != 0)
+    l01 = _mm512_mask_add_epi16(
+        l01, h01, l01,
+        _mm512_packus_epi32(HalfRoundsUp16x(e0, table), HalfRoundsUp16x(e1, table)));
+  if (h23 != 0)
+    l23 = _mm512_mask_add_epi16(
+        l23, h23, l23,
+        _mm512_packus_epi32(HalfRoundsUp16x(e2, table), HalfRoundsUp16x(e3, table)));
+  const __m512i order = _mm512_setr_epi32(0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15);
+  _mm512_storeu_si512(level, _mm512_permutexvar_epi32(order, _mm512_packus_epi16(l01, l23)));
+}
+
+QUILLANE_AVX512 void Avx512Levels(const std::uint8_t* above, const std::uint8_t* row,
+                                  const std::uint8_t* below, int x0, int n, int /*level*/,
+                                  std::uint8_t* level) {
+  alignas(64) std::uint8_t edge[4 * kStretch];
+  std::uint8_t half[kStretch];
+  Avx512EdgeStretch(above, row, below, x0, n, edge);
+  const std::uint8_t* table = GrayHalfRoundsUp();
+  int x = 0;
+  for (; x + 64 <= n; x += 64) Avx512Levels64(edge + 4 * x, table, level + x);
+  for (; x + 32 <= n; x += 32) Avx2Levels32(edge + 4 * x, table, level + x);
+  LevelsFrom(edge, x, n, level, half);
 }
 
 // The cells 32 pixels at a time, by comparing the sums. A sum exactly at the limit is a half
@@ -289,6 +429,7 @@ using PixelRow = void (*)(const std::uint8_t*, int, const std::uint32_t*, Pixel*
 
 LevelStretch ChooseLevels() {
 #if defined(__x86_64__) && defined(__GNUC__)
+  if (UseAvx512()) return Avx512Levels;
   if (UseAvx2()) return Avx2Levels;
 #endif
   return PlainLevels;

@@ -62,8 +62,9 @@ void ColorSketchInto(const TBitmap32& source, int pressure, TBitmap32& out) {
     return;
   }
   // Each row's edge grays are made from three source rows just before the row is converted,
-  // so the edge map never exists as a picture.
-  ParallelRows(0, h, static_cast<std::size_t>(w) * 16, [&](int y0, int y1) {
+  // so the edge map never exists as a picture. Rows depend on the source alone, so threads
+  // take short runs of them in turn.
+  ParallelRowRuns(0, h, static_cast<std::size_t>(w) * 16, [&](int y0, int y1) {
     std::vector<std::uint8_t> gray(static_cast<std::size_t>(w));
     for (int y = y0; y < y1; ++y) {
       GrayEdgeRow(source, y, gray.data());
