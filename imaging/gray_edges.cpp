@@ -342,12 +342,10 @@ QUILLANE_AVX512_INLINE void Avx512Levels64(const std::uint8_t* e, const std::uin
   // Each half of the group looks its halves up only when it has some.
   if (h01 != 0)
     l01 = _mm512_mask_add_epi16(
-        l01, h01, l01,
-        _mm512_packus_epi32(HalfRoundsUp16x(e0, table), HalfRoundsUp16x(e1, table)));
+        l01, h01, l01, _mm512_packus_epi32(HalfRoundsUp16x(e0, table), HalfRoundsUp16x(e1, table)));
   if (h23 != 0)
     l23 = _mm512_mask_add_epi16(
-        l23, h23, l23,
-        _mm512_packus_epi32(HalfRoundsUp16x(e2, table), HalfRoundsUp16x(e3, table)));
+        l23, h23, l23, _mm512_packus_epi32(HalfRoundsUp16x(e2, table), HalfRoundsUp16x(e3, table)));
   const __m512i order = _mm512_setr_epi32(0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15);
   _mm512_storeu_si512(level, _mm512_permutexvar_epi32(order, _mm512_packus_epi16(l01, l23)));
 }
