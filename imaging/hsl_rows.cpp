@@ -357,22 +357,22 @@ struct ChunkRows {
   alignas(64) std::uint32_t coloured[kChunk + 32];
   alignas(64) std::uint32_t pixels[kChunk + 32];
   std::int16_t halves[kChunk + 16];
-  int halfCount = 0;
 };
 
 // Lists the pixels marked in the 8-bit mask halves, from pixel i on, without a branch per pixel.
-QUILLANE_AVX2_INLINE void ListHalves(ChunkRows& rows, unsigned halves, int i) {
-  _mm_storeu_si128(reinterpret_cast<__m128i*>(rows.halves + rows.halfCount),
+QUILLANE_AVX2_INLINE void ListHalves(ChunkRows& rows, int& count, unsigned halves, int i) {
+  _mm_storeu_si128(reinterpret_cast<__m128i*>(rows.halves + count),
                    _mm_add_epi16(_mm_cvtepu8_epi16(_mm_loadl_epi64(
                                      reinterpret_cast<const __m128i*>(kSetBits[halves].data()))),
                                  _mm_set1_epi16(static_cast<std::int16_t>(i))));
-  rows.halfCount += __builtin_popcount(halves);
+  count += __builtin_popcount(halves);
 }
 
 // H, S and the lightness from its source of the 8 pixels from i of the chunk at x0.
 template <LightnessFrom kFrom>
 QUILLANE_AVX2_INLINE void Avx2Colours8(const Pixel* in, int x0, int i,
-                                       const LightnessSource& source, ChunkRows& rows) {
+                                       const LightnessSource& source, ChunkRows& rows,
+                                       int& halfCount) {
   const HslLanes c = Avx2Hsl8(in + x0 + i);
   __m256i l = c.l;
   if constexpr (kFrom == LightnessFrom::Shifted) {
@@ -392,16 +392,16 @@ QUILLANE_AVX2_INLINE void Avx2Colours8(const Pixel* in, int x0, int i,
   }
   Store16(rows.colour + i, _mm256_add_epi32(_mm256_mullo_epi32(c.h, _mm256_set1_epi32(101)), c.s));
   Store16(rows.lightness + i, l);
-  ListHalves(rows, c.halves, i);
+  ListHalves(rows, halfCount, c.halves, i);
 }
 
 // After the groups of 8 or 16 up to pixel i: the pixels left, the halves, and the changed hue
 // and saturation from the table. The lightness past the end is zero for the last group.
 template <LightnessFrom kFrom>
 QUILLANE_AVX2_INLINE void SettleChunk(const std::uint32_t* hueSaturation, const Pixel* in, int x0,
-                                      int i, int n, const LightnessSource& source,
+                                      int i, int n, int halfCount, const LightnessSource& source,
                                       ChunkRows& rows) {
-  PutHalves(in + x0, rows.halves, rows.halfCount, rows.colour);
+  PutHalves(in + x0, rows.halves, halfCount, rows.colour);
   for (; i < n; ++i) {
     const Pixel p = in[x0 + i];
     const Hsl c = RgbToHsl(p.r, p.g, p.b);
@@ -437,10 +437,11 @@ QUILLANE_AVX2 void Avx2Row(const HslChange& change, const std::uint32_t* hueSatu
   const __m256i moveL = _mm256_set1_epi16(static_cast<std::int16_t>(change.lightnessShift));
   for (int x0 = 0; x0 < width; x0 += kChunk) {
     const int n = std::min(kChunk, width - x0);
-    rows.halfCount = 0;
+    // A local count: kept in rows, it would be reloaded after every vector store there.
+    int halfCount = 0;
     int i = 0;
-    for (; i + 8 <= n; i += 8) Avx2Colours8<kFrom>(in, x0, i, source, rows);
-    SettleChunk<kFrom>(hueSaturation, in, x0, i, n, source, rows);
+    for (; i + 8 <= n; i += 8) Avx2Colours8<kFrom>(in, x0, i, source, rows, halfCount);
+    SettleChunk<kFrom>(hueSaturation, in, x0, i, n, halfCount, source, rows);
     for (i = 0; i < n; i += 16) {
       const __m256i l =
           _mm256_min_epi16(_mm256_max_epi16(_mm256_add_epi16(Load256(rows.lightness + i), moveL),
@@ -519,7 +520,8 @@ QUILLANE_AVX512_INLINE HslLanes16 Avx512Hsl16(const Pixel* in) {
 
 template <LightnessFrom kFrom>
 QUILLANE_AVX512_INLINE void Avx512Colours16(const Pixel* in, int x0, int i,
-                                            const LightnessSource& source, ChunkRows& rows) {
+                                            const LightnessSource& source, ChunkRows& rows,
+                                            int& halfCount) {
   const HslLanes16 c = Avx512Hsl16(in + x0 + i);
   __m512i l = c.l;
   if constexpr (kFrom == LightnessFrom::Shifted) {
@@ -537,8 +539,8 @@ QUILLANE_AVX512_INLINE void Avx512Colours16(const Pixel* in, int x0, int i,
                      _mm512_cvtepi32_epi16(
                          _mm512_add_epi32(_mm512_mullo_epi32(c.h, _mm512_set1_epi32(101)), c.s)));
   _mm256_store_si256(reinterpret_cast<__m256i*>(rows.lightness + i), _mm512_cvtepi32_epi16(l));
-  ListHalves(rows, c.halves & 0xFF, i);
-  ListHalves(rows, c.halves >> 8, i + 8);
+  ListHalves(rows, halfCount, c.halves & 0xFF, i);
+  ListHalves(rows, halfCount, c.halves >> 8, i + 8);
 }
 
 // All ones in the 16-bit lanes whose value v (0..127) has its bit set in words.
@@ -617,11 +619,12 @@ QUILLANE_AVX512 void Avx512Row(const HslChange& change, const std::uint32_t* hue
   const __m512i moveL = _mm512_set1_epi16(static_cast<std::int16_t>(change.lightnessShift));
   for (int x0 = 0; x0 < width; x0 += kChunk) {
     const int n = std::min(kChunk, width - x0);
-    rows.halfCount = 0;
+    // A local count: kept in rows, it would be reloaded after every vector store there.
+    int halfCount = 0;
     int i = 0;
-    for (; i + 16 <= n; i += 16) Avx512Colours16<kFrom>(in, x0, i, source, rows);
-    for (; i + 8 <= n; i += 8) Avx2Colours8<kFrom>(in, x0, i, source, rows);
-    SettleChunk<kFrom>(hueSaturation, in, x0, i, n, source, rows);
+    for (; i + 16 <= n; i += 16) Avx512Colours16<kFrom>(in, x0, i, source, rows, halfCount);
+    for (; i + 8 <= n; i += 8) Avx2Colours8<kFrom>(in, x0, i, source, rows, halfCount);
+    SettleChunk<kFrom>(hueSaturation, in, x0, i, n, halfCount, source, rows);
     for (i = 0; i < n; i += 32) {
       const __m512i l = _mm512_min_epi16(
           _mm512_max_epi16(_mm512_add_epi16(_mm512_load_si512(rows.lightness + i), moveL),
