@@ -543,6 +543,115 @@ QUILLANE_AVX512_INLINE void Avx512Colours16(const Pixel* in, int x0, int i,
   ListHalves(rows, halfCount, c.halves >> 8, i + 8);
 }
 
+// H * 101 + S and L of 32 pixels in 16-bit lanes, where every value but the quotients' fits;
+// the quotients are taken in 32-bit lanes, each half of the register unpacked and packed back
+// in place.
+struct HslLanes32 {
+  __m512i colour, l;
+  std::uint32_t halves;
+};
+
+// floor((20 sum + 51) / 102) is (20 sum + 51) * 20561 >> 21 for every sum up to 510.
+constexpr bool LightnessByMultiplying() {
+  for (int sum = 0; sum <= 510; ++sum)
+    if ((20 * sum + 51) / 102 != ((20 * sum + 51) * 20561) >> 21) return false;
+  return true;
+}
+static_assert(LightnessByMultiplying());
+
+QUILLANE_AVX512_INLINE __m512i Quotient32(__m512i num, __m512i den) {
+  const __m512i zero = _mm512_setzero_si512();
+  return _mm512_packus_epi32(
+      Quotient16(_mm512_unpacklo_epi16(num, zero), _mm512_unpacklo_epi16(den, zero)),
+      Quotient16(_mm512_unpackhi_epi16(num, zero), _mm512_unpackhi_epi16(den, zero)));
+}
+
+QUILLANE_AVX512_INLINE HslLanes32 Avx512Hsl32(const Pixel* in) {
+  const __m512i p0 = _mm512_loadu_si512(in);
+  const __m512i p1 = _mm512_loadu_si512(in + 16);
+  const __m512i byte = _mm512_set1_epi32(0xFF);
+  // Packing takes the 128-bit quarters of both registers in turn: the lanes hold pixels 0-3,
+  // 16-19, 4-7, 20-23 and so on until the results are put back in order at the end.
+  const __m512i b = _mm512_packus_epi32(_mm512_and_si512(p0, byte), _mm512_and_si512(p1, byte));
+  const __m512i g = _mm512_packus_epi32(_mm512_and_si512(_mm512_srli_epi32(p0, 8), byte),
+                                        _mm512_and_si512(_mm512_srli_epi32(p1, 8), byte));
+  const __m512i r = _mm512_packus_epi32(_mm512_and_si512(_mm512_srli_epi32(p0, 16), byte),
+                                        _mm512_and_si512(_mm512_srli_epi32(p1, 16), byte));
+  const __m512i mx = _mm512_max_epi16(r, _mm512_max_epi16(g, b));
+  const __m512i mn = _mm512_min_epi16(r, _mm512_min_epi16(g, b));
+  const __m512i one = _mm512_set1_epi16(1);
+  const __m512i zero = _mm512_setzero_si512();
+  const __m512i d = _mm512_sub_epi16(mx, mn);
+  const __m512i sum = _mm512_add_epi16(mx, mn);
+  const __m512i l = _mm512_srli_epi16(
+      _mm512_mulhi_epu16(
+          _mm512_add_epi16(_mm512_mullo_epi16(sum, _mm512_set1_epi16(20)), _mm512_set1_epi16(51)),
+          _mm512_set1_epi16(20561)),
+      5);
+
+  // S <= 100 as d <= den, so S * 2 den stays below 2^16 like 200 d + den.
+  const __m512i den =
+      _mm512_max_epi16(_mm512_min_epi16(sum, _mm512_sub_epi16(_mm512_set1_epi16(510), sum)), one);
+  const __m512i twiceDen = _mm512_add_epi16(den, den);
+  const __m512i numS = _mm512_add_epi16(_mm512_mullo_epi16(d, _mm512_set1_epi16(200)), den);
+  const __m512i s = Quotient32(numS, twiceDen);
+  const __mmask32 halfS = _mm512_cmpeq_epi16_mask(_mm512_mullo_epi16(s, twiceDen), numS);
+
+  const __mmask32 redMax = _mm512_cmpeq_epi16_mask(r, mx);
+  const __mmask32 greenMax = _mm512_mask_cmpeq_epi16_mask(~redMax, g, mx);
+  __m512i signedDistance = _mm512_sub_epi16(r, g);
+  signedDistance = _mm512_mask_sub_epi16(signedDistance, greenMax, b, r);
+  signedDistance = _mm512_mask_sub_epi16(signedDistance, redMax, g, b);
+  __m512i base = _mm512_mask_mov_epi16(_mm512_set1_epi16(240), greenMax, _mm512_set1_epi16(120));
+  base = _mm512_mask_mov_epi16(base, redMax, zero);
+  const __m512i span = _mm512_max_epi16(d, one);
+  const __m512i twiceSpan = _mm512_add_epi16(span, span);
+  const __m512i numH = _mm512_add_epi16(
+      _mm512_mullo_epi16(_mm512_abs_epi16(signedDistance), _mm512_set1_epi16(120)), span);
+  const __m512i steps = Quotient32(numH, twiceSpan);
+  const __mmask32 halfH = _mm512_cmpeq_epi16_mask(_mm512_mullo_epi16(steps, twiceSpan), numH);
+  const __mmask32 negative = _mm512_cmplt_epi16_mask(signedDistance, zero);
+  __m512i h = _mm512_mask_sub_epi16(_mm512_add_epi16(base, steps), negative, base, steps);
+  h = _mm512_mask_add_epi16(h, _mm512_cmplt_epi16_mask(h, zero), h, _mm512_set1_epi16(360));
+
+  const __m512i order = _mm512_setr_epi64(0, 2, 4, 6, 1, 3, 5, 7);
+  HslLanes32 out;
+  out.colour = _mm512_permutexvar_epi64(
+      order, _mm512_add_epi16(_mm512_mullo_epi16(h, _mm512_set1_epi16(101)), s));
+  out.l = _mm512_permutexvar_epi64(order, l);
+  out.halves =
+      _mm512_movepi16_mask(_mm512_permutexvar_epi64(order, _mm512_movm_epi16(halfS | halfH)));
+  return out;
+}
+
+template <LightnessFrom kFrom>
+QUILLANE_AVX512_INLINE void Avx512Colours32(const Pixel* in, int x0, int i,
+                                            const LightnessSource& source, ChunkRows& rows,
+                                            int& halfCount) {
+  const HslLanes32 c = Avx512Hsl32(in + x0 + i);
+  __m512i l = c.l;
+  if constexpr (kFrom == LightnessFrom::Shifted)
+    l = _mm512_min_epi16(
+        _mm512_max_epi16(_mm512_add_epi16(l, _mm512_loadu_si512(source.shift + x0 + i)),
+                         _mm512_setzero_si512()),
+        _mm512_set1_epi16(100));
+  if constexpr (kFrom == LightnessFrom::Levelled) {
+    // Four bytes from each entry (the table is padded for it), the first of them kept.
+    const __m512i level = _mm512_cvtepu8_epi16(Load256(source.level + x0 + i));
+    const __m512i at = _mm512_add_epi16(_mm512_mullo_epi16(level, _mm512_set1_epi16(101)), l);
+    const __m512i zero = _mm512_setzero_si512();
+    const __m512i byte = _mm512_set1_epi32(0xFF);
+    l = _mm512_packus_epi32(
+        _mm512_and_si512(_mm512_i32gather_epi32(_mm512_unpacklo_epi16(at, zero), source.byLevel, 1),
+                         byte),
+        _mm512_and_si512(_mm512_i32gather_epi32(_mm512_unpackhi_epi16(at, zero), source.byLevel, 1),
+                         byte));
+  }
+  _mm512_store_si512(rows.colour + i, c.colour);
+  _mm512_store_si512(rows.lightness + i, l);
+  for (int k = 0; k < 4; ++k) ListHalves(rows, halfCount, (c.halves >> (8 * k)) & 0xFF, i + 8 * k);
+}
+
 // All ones in the 16-bit lanes whose value v (0..127) has its bit set in words.
 QUILLANE_AVX512_INLINE __mmask32 BitSet512(const std::array<std::uint16_t, 8>& words, __m512i v) {
   const __m512i low = _mm512_and_si512(v, _mm512_set1_epi16(15));
@@ -622,6 +731,7 @@ QUILLANE_AVX512 void Avx512Row(const HslChange& change, const std::uint32_t* hue
     // A local count: kept in rows, it would be reloaded after every vector store there.
     int halfCount = 0;
     int i = 0;
+    for (; i + 32 <= n; i += 32) Avx512Colours32<kFrom>(in, x0, i, source, rows, halfCount);
     for (; i + 16 <= n; i += 16) Avx512Colours16<kFrom>(in, x0, i, source, rows, halfCount);
     for (; i + 8 <= n; i += 8) Avx2Colours8<kFrom>(in, x0, i, source, rows, halfCount);
     SettleChunk<kFrom>(hueSaturation, in, x0, i, n, halfCount, source, rows);
