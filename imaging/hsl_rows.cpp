@@ -457,90 +457,15 @@ QUILLANE_AVX2 void Avx2Row(const HslChange& change, const std::uint32_t* hueSatu
   _mm_sfence();
 }
 
-// The same 16 pixels at a time for H, S and L and 32 for the lightness blend. On processors
-// that split these registers in two, fewer instructions still mean fewer steps to issue.
+// The same 32 pixels at a time, for processors with AVX-512. On those that split these
+// registers in two, fewer instructions still mean fewer steps to issue.
 #define QUILLANE_AVX512 [[gnu::target("avx2,avx512f,avx512bw,avx512vl,avx512dq")]]
 #define QUILLANE_AVX512_INLINE \
   [[gnu::target("avx2,avx512f,avx512bw,avx512vl,avx512dq"), gnu::always_inline]] inline
 
-QUILLANE_AVX512_INLINE __m512i Quotient16(__m512i num, __m512i den) {
+// floor(num / den) in 32-bit lanes, as Quotient.
+QUILLANE_AVX512_INLINE __m512i WideQuotient(__m512i num, __m512i den) {
   return _mm512_cvttps_epi32(_mm512_div_ps(_mm512_cvtepi32_ps(num), _mm512_cvtepi32_ps(den)));
-}
-
-struct HslLanes16 {
-  __m512i h, s, l;
-  unsigned halves;
-};
-
-QUILLANE_AVX512_INLINE HslLanes16 Avx512Hsl16(const Pixel* in) {
-  const __m512i p = _mm512_loadu_si512(in);
-  const __m512i byte = _mm512_set1_epi32(0xFF);
-  const __m512i b = _mm512_and_si512(p, byte);
-  const __m512i g = _mm512_and_si512(_mm512_srli_epi32(p, 8), byte);
-  const __m512i r = _mm512_and_si512(_mm512_srli_epi32(p, 16), byte);
-  const __m512i mx = _mm512_max_epi32(r, _mm512_max_epi32(g, b));
-  const __m512i mn = _mm512_min_epi32(r, _mm512_min_epi32(g, b));
-  const __m512i one = _mm512_set1_epi32(1);
-  const __m512i zero = _mm512_setzero_si512();
-  const __m512i d = _mm512_sub_epi32(mx, mn);
-  const __m512i sum = _mm512_add_epi32(mx, mn);
-  HslLanes16 out;
-  out.l = _mm512_srli_epi32(
-      _mm512_mullo_epi32(
-          _mm512_add_epi32(_mm512_mullo_epi32(sum, _mm512_set1_epi32(20)), _mm512_set1_epi32(51)),
-          _mm512_set1_epi32(41121)),
-      22);
-
-  const __m512i den =
-      _mm512_max_epi32(_mm512_min_epi32(sum, _mm512_sub_epi32(_mm512_set1_epi32(510), sum)), one);
-  const __m512i twiceDen = _mm512_add_epi32(den, den);
-  const __m512i numS = _mm512_add_epi32(_mm512_mullo_epi32(d, _mm512_set1_epi32(200)), den);
-  out.s = Quotient16(numS, twiceDen);
-  const __mmask16 halfS = _mm512_cmpeq_epi32_mask(_mm512_mullo_epi32(out.s, twiceDen), numS);
-
-  const __mmask16 redMax = _mm512_cmpeq_epi32_mask(r, mx);
-  const __mmask16 greenMax = _mm512_mask_cmpeq_epi32_mask(static_cast<__mmask16>(~redMax), g, mx);
-  __m512i signedDistance = _mm512_sub_epi32(r, g);
-  signedDistance = _mm512_mask_sub_epi32(signedDistance, greenMax, b, r);
-  signedDistance = _mm512_mask_sub_epi32(signedDistance, redMax, g, b);
-  __m512i base = _mm512_mask_mov_epi32(_mm512_set1_epi32(240), greenMax, _mm512_set1_epi32(120));
-  base = _mm512_mask_mov_epi32(base, redMax, zero);
-  const __m512i span = _mm512_max_epi32(d, one);
-  const __m512i twiceSpan = _mm512_add_epi32(span, span);
-  const __m512i numH = _mm512_add_epi32(
-      _mm512_mullo_epi32(_mm512_abs_epi32(signedDistance), _mm512_set1_epi32(120)), span);
-  const __m512i steps = Quotient16(numH, twiceSpan);
-  const __mmask16 halfH = _mm512_cmpeq_epi32_mask(_mm512_mullo_epi32(steps, twiceSpan), numH);
-  const __mmask16 negative = _mm512_cmplt_epi32_mask(signedDistance, zero);
-  const __m512i h = _mm512_mask_sub_epi32(_mm512_add_epi32(base, steps), negative, base, steps);
-  out.h = _mm512_mask_add_epi32(h, _mm512_cmplt_epi32_mask(h, zero), h, _mm512_set1_epi32(360));
-  out.halves = static_cast<unsigned>(halfS | halfH);
-  return out;
-}
-
-template <LightnessFrom kFrom>
-QUILLANE_AVX512_INLINE void Avx512Colours16(const Pixel* in, int x0, int i,
-                                            const LightnessSource& source, ChunkRows& rows,
-                                            int& halfCount) {
-  const HslLanes16 c = Avx512Hsl16(in + x0 + i);
-  __m512i l = c.l;
-  if constexpr (kFrom == LightnessFrom::Shifted) {
-    const __m512i shift = _mm512_cvtepi16_epi32(Load256(source.shift + x0 + i));
-    l = _mm512_min_epi32(_mm512_max_epi32(_mm512_add_epi32(l, shift), _mm512_setzero_si512()),
-                         _mm512_set1_epi32(100));
-  }
-  if constexpr (kFrom == LightnessFrom::Levelled) {
-    const __m512i level = _mm512_cvtepu8_epi32(
-        _mm_loadu_si128(reinterpret_cast<const __m128i*>(source.level + x0 + i)));
-    const __m512i at = _mm512_add_epi32(_mm512_mullo_epi32(level, _mm512_set1_epi32(101)), l);
-    l = _mm512_and_si512(_mm512_i32gather_epi32(at, source.byLevel, 1), _mm512_set1_epi32(0xFF));
-  }
-  _mm256_store_si256(reinterpret_cast<__m256i*>(rows.colour + i),
-                     _mm512_cvtepi32_epi16(
-                         _mm512_add_epi32(_mm512_mullo_epi32(c.h, _mm512_set1_epi32(101)), c.s)));
-  _mm256_store_si256(reinterpret_cast<__m256i*>(rows.lightness + i), _mm512_cvtepi32_epi16(l));
-  ListHalves(rows, halfCount, c.halves & 0xFF, i);
-  ListHalves(rows, halfCount, c.halves >> 8, i + 8);
 }
 
 // H * 101 + S and L of 32 pixels in 16-bit lanes, where every value but the quotients' fits;
@@ -562,8 +487,8 @@ static_assert(LightnessByMultiplying());
 QUILLANE_AVX512_INLINE __m512i Quotient32(__m512i num, __m512i den) {
   const __m512i zero = _mm512_setzero_si512();
   return _mm512_packus_epi32(
-      Quotient16(_mm512_unpacklo_epi16(num, zero), _mm512_unpacklo_epi16(den, zero)),
-      Quotient16(_mm512_unpackhi_epi16(num, zero), _mm512_unpackhi_epi16(den, zero)));
+      WideQuotient(_mm512_unpacklo_epi16(num, zero), _mm512_unpacklo_epi16(den, zero)),
+      WideQuotient(_mm512_unpackhi_epi16(num, zero), _mm512_unpackhi_epi16(den, zero)));
 }
 
 QUILLANE_AVX512_INLINE HslLanes32 Avx512Hsl32(const Pixel* in) {
@@ -732,7 +657,6 @@ QUILLANE_AVX512 void Avx512Row(const HslChange& change, const std::uint32_t* hue
     int halfCount = 0;
     int i = 0;
     for (; i + 32 <= n; i += 32) Avx512Colours32<kFrom>(in, x0, i, source, rows, halfCount);
-    for (; i + 16 <= n; i += 16) Avx512Colours16<kFrom>(in, x0, i, source, rows, halfCount);
     for (; i + 8 <= n; i += 8) Avx2Colours8<kFrom>(in, x0, i, source, rows, halfCount);
     SettleChunk<kFrom>(hueSaturation, in, x0, i, n, halfCount, source, rows);
     for (i = 0; i < n; i += 32) {
