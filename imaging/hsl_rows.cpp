@@ -395,7 +395,7 @@ QUILLANE_AVX2_INLINE void Avx2Colours8(const Pixel* in, int x0, int i,
   ListHalves(rows, halfCount, c.halves, i);
 }
 
-// After the groups of 8 or 16 up to pixel i: the pixels left, the halves, and the changed hue
+// After the groups of 8 or 32 up to pixel i: the pixels left, the halves, and the changed hue
 // and saturation from the table. The lightness past the end is zero for the last group.
 template <LightnessFrom kFrom>
 QUILLANE_AVX2_INLINE void SettleChunk(const std::uint32_t* hueSaturation, const Pixel* in, int x0,
