@@ -8,15 +8,6 @@
 #include <cstring>
 #include <vector>
 
-#if defined(__x86_64__)
-// GCC 12's AVX-512 intrinsics start some results from a deliberately undefined register, which
-// its own warning then reports from inside the header.
-#pragma GCC diagnostic push
-#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
-#include <immintrin.h>
-#pragma GCC diagnostic pop
-#endif
-
 #include "imaging/edge_byte.h"
 #include "imaging/edge_map.h"
 #include "imaging/gray_half_avx2.h"
@@ -25,6 +16,7 @@
 #include "imaging/parallel.h"
 #include "imaging/tone.h"
 #include "imaging/vector_dispatch.h"
+#include "imaging/vector_intrinsics.h"
 
 namespace quillane {
 namespace {
@@ -241,9 +233,6 @@ inline void LevelsFrom(const std::uint8_t* edge, int x, int n, std::uint8_t* lev
 }
 
 // The same with twice as many lanes, for processors with AVX-512 (F, BW, VL and DQ).
-#define QUILLANE_AVX512 [[gnu::target("avx2,avx512f,avx512bw,avx512vl,avx512dq")]]
-#define QUILLANE_AVX512_INLINE \
-  [[gnu::target("avx2,avx512f,avx512bw,avx512vl,avx512dq"), gnu::always_inline]] inline
 
 QUILLANE_AVX512_INLINE __m512i Widened32(const std::uint8_t* p) {
   return _mm512_cvtepu8_epi16(_mm256_loadu_si256(reinterpret_cast<const __m256i*>(p)));

@@ -3,9 +3,9 @@
 #pragma once
 
 #if defined(__x86_64__) && defined(__GNUC__)
-#include <immintrin.h>
-
 #include <cstdint>
+
+#include "imaging/vector_intrinsics.h"
 
 namespace quillane {
 

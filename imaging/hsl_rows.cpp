@@ -18,19 +18,11 @@
 #include <cstdint>
 #include <cstring>
 
-#if defined(__x86_64__)
-// GCC 12's AVX-512 intrinsics start some results from a deliberately undefined register, which
-// its own warning then reports from inside the header.
-#pragma GCC diagnostic push
-#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
-#include <immintrin.h>
-#pragma GCC diagnostic pop
-#endif
-
 #include "imaging/hsl_halves.h"
 #include "imaging/numeric.h"
 #include "imaging/tone.h"
 #include "imaging/vector_dispatch.h"
+#include "imaging/vector_intrinsics.h"
 
 namespace quillane {
 namespace {
@@ -459,9 +451,6 @@ QUILLANE_AVX2 void Avx2Row(const HslChange& change, const std::uint32_t* hueSatu
 
 // The same 32 pixels at a time, for processors with AVX-512. On those that split these
 // registers in two, fewer instructions still mean fewer steps to issue.
-#define QUILLANE_AVX512 [[gnu::target("avx2,avx512f,avx512bw,avx512vl,avx512dq")]]
-#define QUILLANE_AVX512_INLINE \
-  [[gnu::target("avx2,avx512f,avx512bw,avx512vl,avx512dq"), gnu::always_inline]] inline
 
 // floor(num / den) in 32-bit lanes, as Quotient.
 QUILLANE_AVX512_INLINE __m512i WideQuotient(__m512i num, __m512i den) {
