@@ -242,24 +242,26 @@ QUILLANE_AVX512_INLINE __m512i At32(const std::int16_t* p) {
   return _mm512_loadu_si512(p);
 }
 
+// ResponseOfSums16 for 32 bytes, with the row's own part of the line kept beside the sums:
+// own[k] is 6 row less vertical[k], so the line is own less the vertical sums on either side.
 QUILLANE_AVX512_INLINE __m512i ResponseOfSums32(const std::int16_t* vertical,
-                                                const std::int16_t* column, const std::uint8_t* row,
+                                                const std::int16_t* column, const std::int16_t* own,
                                                 int j) {
-  const __m512i outer = _mm512_add_epi16(
-      _mm512_add_epi16(At32(vertical + j), At32(vertical + j + 4)), At32(vertical + j + 8));
-  const __m512i line =
-      _mm512_sub_epi16(_mm512_mullo_epi16(Widened32(row + j), _mm512_set1_epi16(6)), outer);
+  const __m512i line = _mm512_sub_epi16(_mm512_sub_epi16(At32(own + j + 4), At32(vertical + j)),
+                                        At32(vertical + j + 8));
   return _mm512_max_epi16(line, _mm512_sub_epi16(At32(column + j), At32(column + j + 8)));
 }
 
-// Avx2EdgeStretch 64 bytes at a time; the bytes after the last 64 go the AVX2 way.
+// Avx2EdgeStretch 64 bytes at a time; the bytes after the last 64 go the AVX2 way. Each row
+// byte is widened once, where the sums are made.
 QUILLANE_AVX512_INLINE void Avx512EdgeStretch(const std::uint8_t* above, const std::uint8_t* row,
                                               const std::uint8_t* below, int x0, int n,
                                               std::uint8_t* edge) {
   const int first = 4 * x0;
   const int bytes = 4 * n;
   constexpr int kBlock = 256;
-  alignas(64) std::int16_t vertical[kBlock + 8], column[kBlock + 8];
+  alignas(64) std::int16_t vertical[kBlock + 8], column[kBlock + 8], own[kBlock + 8];
+  const __m512i six = _mm512_set1_epi16(6);
   int j = 0;
   while (j + 64 <= bytes) {
     const int m = std::min(kBlock, (bytes - j) / 64 * 64);
@@ -267,18 +269,21 @@ QUILLANE_AVX512_INLINE void Avx512EdgeStretch(const std::uint8_t* above, const s
     int k = 0;
     for (; k < m; k += 32) {
       const __m512i v = _mm512_add_epi16(Widened32(above + i0 + k), Widened32(below + i0 + k));
+      const __m512i centre = Widened32(row + i0 + k);
       _mm512_store_si512(vertical + k, v);
-      _mm512_store_si512(column + k, _mm512_add_epi16(v, Widened32(row + i0 + k)));
+      _mm512_store_si512(column + k, _mm512_add_epi16(v, centre));
+      _mm512_store_si512(own + k, _mm512_sub_epi16(_mm512_mullo_epi16(centre, six), v));
     }
     // The last eight, read eight bytes wide: more would pass the row's end.
     const __m128i v = _mm_add_epi16(Widened8(above + i0 + k), Widened8(below + i0 + k));
+    const __m128i centre = Widened8(row + i0 + k);
     _mm_store_si128(reinterpret_cast<__m128i*>(vertical + k), v);
-    _mm_store_si128(reinterpret_cast<__m128i*>(column + k),
-                    _mm_add_epi16(v, Widened8(row + i0 + k)));
+    _mm_store_si128(reinterpret_cast<__m128i*>(column + k), _mm_add_epi16(v, centre));
+    _mm_store_si128(reinterpret_cast<__m128i*>(own + k),
+                    _mm_sub_epi16(_mm_mullo_epi16(centre, _mm_set1_epi16(6)), v));
     for (int r = 0; r < m; r += 64) {
-      const __m512i packed =
-          _mm512_packus_epi16(ResponseOfSums32(vertical, column, row + first + j, r),
-                              ResponseOfSums32(vertical, column, row + first + j, r + 32));
+      const __m512i packed = _mm512_packus_epi16(ResponseOfSums32(vertical, column, own, r),
+                                                 ResponseOfSums32(vertical, column, own, r + 32));
       const __m512i ordered =
           _mm512_permutexvar_epi64(_mm512_setr_epi64(0, 2, 4, 6, 1, 3, 5, 7), packed);
       _mm512_store_si512(edge + j + r, _mm512_xor_si512(ordered, _mm512_set1_epi8(-1)));
