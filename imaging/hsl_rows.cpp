@@ -387,9 +387,10 @@ QUILLANE_AVX2_INLINE void Avx2Colours8(const Pixel* in, int x0, int i,
   ListHalves(rows, halfCount, c.halves, i);
 }
 
-// After the groups of 8 or 32 up to pixel i: the pixels left, the halves, and the changed hue
-// and saturation from the table. The lightness past the end is zero for the last group.
-template <LightnessFrom kFrom>
+// After the groups of 8 or 32 up to pixel i: the pixels left and the halves; then, unless the
+// blend gathers them itself, the changed hue and saturation from the table. Past the end the
+// last group finds zeros.
+template <LightnessFrom kFrom, bool kLookUp = true>
 QUILLANE_AVX2_INLINE void SettleChunk(const std::uint32_t* hueSaturation, const Pixel* in, int x0,
                                       int i, int n, int halfCount, const LightnessSource& source,
                                       ChunkRows& rows) {
@@ -400,8 +401,10 @@ QUILLANE_AVX2_INLINE void SettleChunk(const std::uint32_t* hueSaturation, const 
     rows.colour[i] = static_cast<std::uint16_t>(c.h * 101 + c.s);
     rows.lightness[i] = static_cast<std::uint16_t>(LightnessAt<kFrom>(source, x0 + i, c.l));
   }
-  for (i = 0; i < n; ++i) rows.coloured[i] = hueSaturation[rows.colour[i]];
+  if constexpr (kLookUp)
+    for (i = 0; i < n; ++i) rows.coloured[i] = hueSaturation[rows.colour[i]];
   for (i = n; i < n + 32; ++i) {
+    rows.colour[i] = 0;
     rows.coloured[i] = 0;
     rows.lightness[i] = 0;
   }
@@ -634,7 +637,21 @@ QUILLANE_AVX512_INLINE void Avx512Lighten32(__m512i first, __m512i second, __m51
   out1 = _mm512_unpackhi_epi16(blueGreen, redAlpha);
 }
 
-template <LightnessFrom kFrom>
+// The changed hue and saturation of 32 pixels (0x00RRGGBB) from the table at their colours
+// (H * 101 + S), gathered: pixels 0..15 in first, 16..31 in second.
+QUILLANE_AVX512_INLINE void GatherColoured(const std::uint32_t* hueSaturation,
+                                           const std::uint16_t* colour, __m512i& first,
+                                           __m512i& second) {
+  const __m512i at = _mm512_load_si512(colour);
+  first =
+      _mm512_i32gather_epi32(_mm512_cvtepu16_epi32(_mm512_castsi512_si256(at)), hueSaturation, 4);
+  second = _mm512_i32gather_epi32(_mm512_cvtepu16_epi32(_mm512_extracti64x4_epi64(at, 1)),
+                                  hueSaturation, 4);
+}
+
+// kGather: the blend gathers the changed hue and saturation from the table itself, which is
+// quicker than looking them up one by one where gathers run at full speed.
+template <LightnessFrom kFrom, bool kGather>
 QUILLANE_AVX512 void Avx512Row(const HslChange& change, const std::uint32_t* hueSaturation,
                                const Pixel* in, Pixel* out, int width,
                                const LightnessSource& source) {
@@ -647,15 +664,20 @@ QUILLANE_AVX512 void Avx512Row(const HslChange& change, const std::uint32_t* hue
     int i = 0;
     for (; i + 32 <= n; i += 32) Avx512Colours32<kFrom>(in, x0, i, source, rows, halfCount);
     for (; i + 8 <= n; i += 8) Avx2Colours8<kFrom>(in, x0, i, source, rows, halfCount);
-    SettleChunk<kFrom>(hueSaturation, in, x0, i, n, halfCount, source, rows);
+    SettleChunk<kFrom, !kGather>(hueSaturation, in, x0, i, n, halfCount, source, rows);
     for (i = 0; i < n; i += 32) {
       const __m512i l = _mm512_min_epi16(
           _mm512_max_epi16(_mm512_add_epi16(_mm512_load_si512(rows.lightness + i), moveL),
                            _mm512_setzero_si512()),
           _mm512_set1_epi16(100));
-      __m512i first, second;
-      Avx512Lighten32(_mm512_load_si512(rows.coloured + i),
-                      _mm512_load_si512(rows.coloured + i + 16), l, first, second);
+      __m512i coloured0, coloured1, first, second;
+      if constexpr (kGather) {
+        GatherColoured(hueSaturation, rows.colour + i, coloured0, coloured1);
+      } else {
+        coloured0 = _mm512_load_si512(rows.coloured + i);
+        coloured1 = _mm512_load_si512(rows.coloured + i + 16);
+      }
+      Avx512Lighten32(coloured0, coloured1, l, first, second);
       _mm512_store_si512(rows.pixels + i, first);
       _mm512_store_si512(rows.pixels + i + 16, second);
     }
@@ -670,7 +692,9 @@ void ChangeRow(const HslChange& change, const std::uint32_t* hueSaturation,
                const std::uint8_t* lightRows, const Pixel* in, Pixel* out, int width,
                const LightnessSource& source) {
 #if defined(__x86_64__) && defined(__GNUC__)
-  if (UseAvx512()) return Avx512Row<kFrom>(change, hueSaturation, in, out, width, source);
+  if (UseAvx512Gathers())
+    return Avx512Row<kFrom, true>(change, hueSaturation, in, out, width, source);
+  if (UseAvx512()) return Avx512Row<kFrom, false>(change, hueSaturation, in, out, width, source);
   if (UseAvx2()) return Avx2Row<kFrom>(change, hueSaturation, in, out, width, source);
 #endif
   PlainRow<kFrom>(hueSaturation, lightRows, in, out, 0, width, source);

@@ -1,11 +1,14 @@
 #include "imaging/vector_dispatch.h"
 
 #include <atomic>
+#include <fstream>
+#include <string>
 
 namespace quillane {
 namespace {
 
 std::atomic<VectorWidth> widestAllowed{VectorWidth::Avx512};
+std::atomic<bool> gathersAllowed{true};
 
 VectorWidth ProcessorWidth() {
 #if defined(__x86_64__) && defined(__GNUC__)
@@ -26,6 +29,18 @@ bool Use(VectorWidth width) {
   return widestAllowed.load(std::memory_order_relaxed) >= width && ProcessorWidth() >= width;
 }
 
+// Gathers keep their speed on processors the flaw does not touch, and where the kernel says the
+// microcode leaves it open; a mitigation, or no word at all, slows them down.
+bool GathersAtFullSpeed() {
+  static const bool fast = [] {
+    std::ifstream status("/sys/devices/system/cpu/vulnerabilities/gather_data_sampling");
+    std::string line;
+    if (!std::getline(status, line)) return false;
+    return line.rfind("Not affected", 0) == 0 || line.rfind("Vulnerable", 0) == 0;
+  }();
+  return fast;
+}
+
 }  // namespace
 
 bool UseAvx2() {
@@ -38,6 +53,14 @@ bool UseAvx512() {
 
 void SetWidestVectors(VectorWidth widest) {
   widestAllowed = widest;
+}
+
+bool UseAvx512Gathers() {
+  return gathersAllowed.load(std::memory_order_relaxed) && UseAvx512() && GathersAtFullSpeed();
+}
+
+void SetGathersAllowed(bool allowed) {
+  gathersAllowed = allowed;
 }
 
 }  // namespace quillane

@@ -17,4 +17,13 @@ bool UseAvx512();
 // The widest variants allowed to run; the default allows all.
 void SetWidestVectors(VectorWidth widest);
 
+// Whether AVX-512 variants may read their larger tables with gather instructions. Where the
+// processor's microcode guards against gather data sampling, or the system cannot say whether
+// it does, each gather takes several times longer, and a table is read an entry at a time.
+bool UseAvx512Gathers();
+
+// Allows or forbids those gathers (where the processor runs AVX-512 at all); the default allows
+// them.
+void SetGathersAllowed(bool allowed);
+
 }  // namespace quillane

@@ -49,6 +49,7 @@ class FastPathVariant {
   ~FastPathVariant() {
     SetRowSplit({});
     SetWidestVectors(VectorWidth::Avx512);
+    SetGathersAllowed(true);
   }
 };
 

@@ -1,9 +1,10 @@
-// The row passes of the colour model in every variant (AVX-512, AVX2, plain) against the plain
-// conversions, for every colour there is and every H, S and L that comes back; the effects'
-// tests take them through awkward sizes and bands.
+// The row passes of the colour model in every variant (AVX-512 with and without gathers, AVX2,
+// plain) against the plain conversions, for every colour there is and every H, S and L that
+// comes back; the effects' tests take them through awkward sizes and bands.
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <ostream>
 #include <vector>
 
 #include "imaging/tone.h"
@@ -12,10 +13,28 @@
 namespace quillane {
 namespace {
 
-constexpr VectorWidth kVariants[] = {VectorWidth::Avx512, VectorWidth::Avx2, VectorWidth::Plain};
+// The AVX-512 rows come twice: with the table gathered, and read an entry at a time as where
+// gathers are slow.
+struct Variant {
+  VectorWidth widest;
+  bool gathers;
+};
+constexpr Variant kVariants[] = {{VectorWidth::Avx512, true},
+                                 {VectorWidth::Avx512, false},
+                                 {VectorWidth::Avx2, true},
+                                 {VectorWidth::Plain, true}};
+
+void Use(const Variant& variant) {
+  SetWidestVectors(variant.widest);
+  SetGathersAllowed(variant.gathers);
+}
+
+std::ostream& operator<<(std::ostream& out, const Variant& variant) {
+  return out << " width " << static_cast<int>(variant.widest) << " gathers " << variant.gathers;
+}
 
 struct AllowAllAfterwards {
-  ~AllowAllAfterwards() { SetWidestVectors(VectorWidth::Avx512); }
+  ~AllowAllAfterwards() { Use({VectorWidth::Avx512, true}); }
 };
 
 Pixel Colour(int r, int g, int b) {
@@ -43,15 +62,13 @@ TEST_P(EveryColourInRows, BothVariantsEqualThePlainConversions) {
         back[i] = Pixel{static_cast<std::uint8_t>(o.b), static_cast<std::uint8_t>(o.g),
                         static_cast<std::uint8_t>(o.r), 255};
       }
-    for (const VectorWidth widest : kVariants) {
-      SetWidestVectors(widest);
+    for (const Variant& variant : kVariants) {
+      Use(variant);
       RgbToHslRow(row.data(), hsl.data(), static_cast<int>(row.size()));
       unchanged.Row(row.data(), out.data(), static_cast<int>(row.size()));
       for (std::size_t i = 0; i < row.size(); ++i) {
-        ASSERT_EQ(hsl[i], expected[i])
-            << r << "," << i / 256 << "," << i % 256 << " " << static_cast<int>(widest);
-        ASSERT_EQ(out[i], back[i])
-            << r << "," << i / 256 << "," << i % 256 << " " << static_cast<int>(widest);
+        ASSERT_EQ(hsl[i], expected[i]) << r << "," << i / 256 << "," << i % 256 << variant;
+        ASSERT_EQ(out[i], back[i]) << r << "," << i / 256 << "," << i % 256 << variant;
       }
     }
   }
@@ -84,8 +101,8 @@ TEST(HslRowChanger, EveryHslComesBackAsTheTablesGiveIt) {
   for (int level0 = 0; level0 <= 100; ++level0)
     for (int l = 0; l <= 100; ++l)
       asLevel.at[static_cast<std::size_t>(level0 * 101 + l)] = static_cast<std::uint8_t>(level0);
-  for (const VectorWidth widest : kVariants) {
-    SetWidestVectors(widest);
+  for (const Variant& variant : kVariants) {
+    Use(variant);
     for (int s = 0; s <= 100; ++s) {
       HslRowChanger(HslChange{0, s - 100, 0})
           .RowWithLevels(in.data(), out.data(), static_cast<int>(in.size()), level.data(), asLevel);
@@ -94,7 +111,7 @@ TEST(HslRowChanger, EveryHslComesBackAsTheTablesGiveIt) {
         const Rgb e = HslToRgb(h, s, l);
         ASSERT_EQ(out[i], (Pixel{static_cast<std::uint8_t>(e.b), static_cast<std::uint8_t>(e.g),
                                  static_cast<std::uint8_t>(e.r), 255}))
-            << h << "," << s << "," << l << " width " << static_cast<int>(widest);
+            << h << "," << s << "," << l << variant;
       }
     }
   }
@@ -115,13 +132,13 @@ TEST(HslRowChanger, LevelsReachEveryEntryInEveryVariant) {
     level.push_back(static_cast<std::uint8_t>(k / 101));
   }
   std::vector<Pixel> out(in.size());
-  for (const VectorWidth widest : kVariants) {
-    SetWidestVectors(widest);
+  for (const Variant& variant : kVariants) {
+    Use(variant);
     HslRowChanger(HslChange{})
         .RowWithLevels(in.data(), out.data(), static_cast<int>(in.size()), level.data(), byLevel);
     for (std::size_t k = 0; k < in.size(); ++k) {
       const auto v = static_cast<std::uint8_t>(HslToRgb(0, 0, static_cast<int>(k * 37 % 101)).r);
-      ASSERT_EQ(out[k], (Pixel{v, v, v, 255})) << k << " width " << static_cast<int>(widest);
+      ASSERT_EQ(out[k], (Pixel{v, v, v, 255})) << k << variant;
     }
   }
 }
