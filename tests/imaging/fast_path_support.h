@@ -13,9 +13,9 @@
 
 namespace quillane {
 
-// Single rows and columns, widths either side of the 8-, 16- and 32-pixel vectors, the 256-pixel
-// rounds and the 1024-pixel stretches, heights below the number of bands, and tall pictures for
-// the half- and third-size copies.
+// Single rows and columns, widths either side of the 8-, 16- and 32-pixel vectors and of the
+// 1024-pixel chunks and stretches, heights below the number of bands, and tall pictures for the
+// half- and third-size copies.
 inline constexpr std::pair<int, int> kAwkwardSizes[] = {
     {1, 1},    {1, 9},    {9, 1},    {2, 2},    {2, 5},    {5, 2},  {3, 3},    {4, 3},
     {3, 9},    {9, 4},    {10, 3},   {17, 2},   {18, 5},   {19, 3}, {33, 4},   {35, 3},
