@@ -150,7 +150,9 @@ void PrintTable(const MedianReporter& r) {
       "\n12-megapixel photo (%d x %d): memcpy %.2f ms = 1x (spread %.0f%%), %.2f ms of "
       "processor time; load average %.1f on %u cores; widest vectors: %s.\n",
       kWidth, kHeight, floor, r.spreads.count("memcpy") ? r.spreads.at("memcpy") : 0.0, cpuFloor,
-      Load(), cores, UseAvx512() ? "AVX-512" : (UseAvx2() ? "AVX2" : "none"));
+      Load(), cores,
+      UseAvx512() ? (UseAvx512Gathers() ? "AVX-512 with gathers" : "AVX-512 without gathers")
+                  : (UseAvx2() ? "AVX2" : "none"));
   std::printf(
       "Medians of 5 repetitions, wall-clock time as a multiple of the memcpy's; "
       "cpu x: one thread's processor time\nas a multiple of the memcpy's, which other "
