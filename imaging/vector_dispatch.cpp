@@ -29,8 +29,9 @@ bool Use(VectorWidth width) {
   return widestAllowed.load(std::memory_order_relaxed) >= width && ProcessorWidth() >= width;
 }
 
-// Gathers keep their speed on processors the flaw does not touch, and where the kernel says the
-// microcode leaves it open; a mitigation, or no word at all, slows them down.
+// Gathers run at full speed on processors that gather data sampling does not touch, and where
+// the kernel reports the flaw left open; its microcode mitigation, or no report at all, is
+// taken to mean slow gathers.
 bool GathersAtFullSpeed() {
   static const bool fast = [] {
     std::ifstream status("/sys/devices/system/cpu/vulnerabilities/gather_data_sampling");
