@@ -13,7 +13,7 @@ namespace {
 constexpr int kIconSide = 48;
 }
 
-TAboutus::TAboutus(QWidget* parent) : QDialog(parent) {
+AboutBox::AboutBox(QWidget* parent) : QDialog(parent) {
   setObjectName("TAboutus");
   setWindowTitle("About Quillane");
   setWindowFlag(Qt::WindowStaysOnTopHint);
@@ -46,7 +46,7 @@ TAboutus::TAboutus(QWidget* parent) : QDialog(parent) {
   layout->setSizeConstraint(QLayout::SetFixedSize);
 }
 
-QStringList TAboutus::Lines() {
+QStringList AboutBox::Lines() {
   return {"Name: Quillane",
           "",
           "Version: " QUILLANE_VERSION,
@@ -57,7 +57,7 @@ QStringList TAboutus::Lines() {
           "Support and contact: see the README.md that comes with the program"};
 }
 
-void TAboutus::showEvent(QShowEvent* event) {
+void AboutBox::showEvent(QShowEvent* event) {
   // The icon is taken when shown, so the box carries whatever icon the program was given.
   const QIcon icon = QApplication::windowIcon();
   image_->setPixmap(icon.isNull() ? QPixmap() : icon.pixmap(kIconSide, kIconSide));

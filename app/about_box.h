@@ -9,11 +9,11 @@ class QPlainTextEdit;
 
 namespace quillane {
 
-class TAboutus : public QDialog {
+class AboutBox : public QDialog {
   Q_OBJECT
 
  public:
-  explicit TAboutus(QWidget* parent = nullptr);
+  explicit AboutBox(QWidget* parent = nullptr);
 
   // The lines of the text, in order.
   static QStringList Lines();

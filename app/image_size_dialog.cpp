@@ -65,8 +65,8 @@ QString RoundedQuotient(std::int64_t numerator, std::int64_t denominator) {
 
 }  // namespace
 
-TImage_size::TImage_size(PlatformServices& platform, std::function<QSize()> pictureSize,
-                         std::function<ResizeResult(int, int)> resize, QWidget* parent)
+ImageSizeDialog::ImageSizeDialog(PlatformServices& platform, std::function<QSize()> pictureSize,
+                                 std::function<ResizeResult(int, int)> resize, QWidget* parent)
     : QDialog(parent, Qt::Dialog | Qt::WindowStaysOnTopHint | Qt::CustomizeWindowHint |
                           Qt::WindowTitleHint),
       platform_(platform),
@@ -84,18 +84,18 @@ TImage_size::TImage_size(PlatformServices& platform, std::function<QSize()> pict
     grid->addWidget(new QLabel("Pixels", this), row, 2);
     edit->installEventFilter(this);
     // Enter runs OK; no button is a default button, so it runs once.
-    connect(edit, &QLineEdit::returnPressed, this, &TImage_size::Button1Click);
+    connect(edit, &QLineEdit::returnPressed, this, &ImageSizeDialog::OnOk);
     return edit;
   };
-  edit1_ = addRow(0, "Width:", "Edit1");
-  edit2_ = addRow(1, "Height:", "Edit2");
-  connect(edit1_, &QLineEdit::textEdited, this, [this] { edited1_ = true; });
-  connect(edit2_, &QLineEdit::textEdited, this, [this] { edited2_ = true; });
+  widthField_ = addRow(0, "Width:", "Edit1");
+  heightField_ = addRow(1, "Height:", "Edit2");
+  connect(widthField_, &QLineEdit::textEdited, this, [this] { widthEdited_ = true; });
+  connect(heightField_, &QLineEdit::textEdited, this, [this] { heightEdited_ = true; });
 
-  checkBox1_ = new QCheckBox("Hold in width and height", this);
-  checkBox1_->setObjectName("CheckBox1");
-  checkBox1_->setChecked(true);
-  grid->addWidget(checkBox1_, 2, 0, 1, 3);
+  holdAspect_ = new QCheckBox("Hold in width and height", this);
+  holdAspect_->setObjectName("CheckBox1");
+  holdAspect_->setChecked(true);
+  grid->addWidget(holdAspect_, 2, 0, 1, 3);
 
   auto* steps = new QHBoxLayout;
   auto addStep = [&](const QString& caption, const char* name) {
@@ -106,10 +106,8 @@ TImage_size::TImage_size(PlatformServices& platform, std::function<QSize()> pict
     steps->addWidget(button);
     return button;
   };
-  connect(addStep("-", "SpeedButton1"), &QToolButton::clicked, this,
-          &TImage_size::SpeedButton1Click);
-  connect(addStep("+", "SpeedButton2"), &QToolButton::clicked, this,
-          &TImage_size::SpeedButton2Click);
+  connect(addStep("-", "SpeedButton1"), &QToolButton::clicked, this, &ImageSizeDialog::OnShrink);
+  connect(addStep("+", "SpeedButton2"), &QToolButton::clicked, this, &ImageSizeDialog::OnEnlarge);
   steps->addStretch();
 
   auto* buttons = new QHBoxLayout;
@@ -121,8 +119,8 @@ TImage_size::TImage_size(PlatformServices& platform, std::function<QSize()> pict
     buttons->addWidget(button);
     return button;
   };
-  connect(addButton("OK", "Button1"), &QPushButton::clicked, this, &TImage_size::Button1Click);
-  connect(addButton("Cancel", "Button2"), &QPushButton::clicked, this, &TImage_size::Button2Click);
+  connect(addButton("OK", "Button1"), &QPushButton::clicked, this, &ImageSizeDialog::OnOk);
+  connect(addButton("Cancel", "Button2"), &QPushButton::clicked, this, &ImageSizeDialog::OnCancel);
 
   auto* layout = new QVBoxLayout(this);
   layout->addLayout(grid);
@@ -131,28 +129,30 @@ TImage_size::TImage_size(PlatformServices& platform, std::function<QSize()> pict
   setFixedSize(sizeHint());
 }
 
-void TImage_size::showEvent(QShowEvent* event) {
+void ImageSizeDialog::showEvent(QShowEvent* event) {
   // Shown by the program, not shown again by the desktop (another workspace and back), which
   // must not wipe what was typed.
   if (!event->spontaneous()) {
     const QSize size = pictureSize_();
-    edit1_->setText(QString::number(size.width()));
-    edit2_->setText(QString::number(size.height()));
-    edited1_ = edited2_ = false;
+    widthField_->setText(QString::number(size.width()));
+    heightField_->setText(QString::number(size.height()));
+    widthEdited_ = heightEdited_ = false;
   }
   QDialog::showEvent(event);
 }
 
-bool TImage_size::eventFilter(QObject* watched, QEvent* event) {
+bool ImageSizeDialog::eventFilter(QObject* watched, QEvent* event) {
   if (event->type() == QEvent::KeyRelease) {
-    if (watched == edit1_ && std::exchange(edited1_, false)) HoldAspect(edit1_, edit2_, true);
-    if (watched == edit2_ && std::exchange(edited2_, false)) HoldAspect(edit2_, edit1_, false);
+    if (watched == widthField_ && std::exchange(widthEdited_, false))
+      HoldAspect(widthField_, heightField_, true);
+    if (watched == heightField_ && std::exchange(heightEdited_, false))
+      HoldAspect(heightField_, widthField_, false);
   }
   return QDialog::eventFilter(watched, event);
 }
 
-void TImage_size::HoldAspect(QLineEdit* typed, QLineEdit* other, bool fromWidth) {
-  if (!checkBox1_->isChecked() || !IsValidField(typed->text())) return;
+void ImageSizeDialog::HoldAspect(QLineEdit* typed, QLineEdit* other, bool fromWidth) {
+  if (!holdAspect_->isChecked() || !IsValidField(typed->text())) return;
   const std::optional<int> n = ToInt(typed->text());
   if (!n) return;  // more digits than an integer holds: OK says so
   const QSize size = pictureSize_();
@@ -162,8 +162,8 @@ void TImage_size::HoldAspect(QLineEdit* typed, QLineEdit* other, bool fromWidth)
   other->setText(RoundedQuotient(*n * to, from));
 }
 
-bool TImage_size::ScaleFields(int percent) {
-  for (QLineEdit* edit : {edit1_, edit2_}) {
+bool ImageSizeDialog::ScaleFields(int percent) {
+  for (QLineEdit* edit : {widthField_, heightField_}) {
     const std::optional<int> n = ToInt(edit->text());
     if (!n) {
       platform_.ShowError(NotAnInteger(edit->text()));
@@ -174,27 +174,27 @@ bool TImage_size::ScaleFields(int percent) {
   return true;
 }
 
-void TImage_size::SpeedButton1Click() {
+void ImageSizeDialog::OnShrink() {
   ScaleFields(80);
 }
 
-void TImage_size::SpeedButton2Click() {
+void ImageSizeDialog::OnEnlarge() {
   ScaleFields(125);
 }
 
-void TImage_size::Button1Click() {
-  if (!IsValidField(edit1_->text()) || !IsValidField(edit2_->text())) {
+void ImageSizeDialog::OnOk() {
+  if (!IsValidField(widthField_->text()) || !IsValidField(heightField_->text())) {
     platform_.ShowMessage("Quillane", kInvalidValue);
     return;
   }
-  for (QLineEdit* edit : {edit1_, edit2_}) {
+  for (QLineEdit* edit : {widthField_, heightField_}) {
     if (!ToInt(edit->text())) {
       platform_.ShowError(NotAnInteger(edit->text()));
       return;
     }
   }
-  const int w = *ToInt(edit1_->text());
-  const int h = *ToInt(edit2_->text());
+  const int w = *ToInt(widthField_->text());
+  const int h = *ToInt(heightField_->text());
   ResizeResult result = ResizeResult::TooSmall;
   try {
     result = resize_(w, h);
@@ -219,12 +219,12 @@ void TImage_size::Button1Click() {
                                   "picture may have.")
                        .arg(w)
                        .arg(h)
-                       .arg(QLocale().toString(static_cast<qint64>(TBitmap32::kMaxPixels))));
+                       .arg(QLocale().toString(static_cast<qint64>(Bitmap32::kMaxPixels))));
       break;
   }
 }
 
-void TImage_size::Button2Click() {
+void ImageSizeDialog::OnCancel() {
   close();
 }
 

@@ -18,20 +18,20 @@ namespace quillane {
 
 class PlatformServices;
 
-class TImage_size : public QDialog {
+class ImageSizeDialog : public QDialog {
   Q_OBJECT
 
  public:
   // pictureSize gives the working picture's size at the moment it is asked; resize resamples
   // the document to a width and height (ResizeDocument) and shows the result.
-  TImage_size(PlatformServices& platform, std::function<QSize()> pictureSize,
-              std::function<ResizeResult(int, int)> resize, QWidget* parent = nullptr);
+  ImageSizeDialog(PlatformServices& platform, std::function<QSize()> pictureSize,
+                  std::function<ResizeResult(int, int)> resize, QWidget* parent = nullptr);
 
  public slots:
-  void SpeedButton1Click();  // "-"
-  void SpeedButton2Click();  // "+"
-  void Button1Click();       // OK
-  void Button2Click();       // Cancel
+  void OnShrink();   // "-": both fields to 80 %
+  void OnEnlarge();  // "+": both fields to 125 %
+  void OnOk();
+  void OnCancel();
 
  protected:
   void showEvent(QShowEvent* event) override;
@@ -47,13 +47,13 @@ class TImage_size : public QDialog {
   PlatformServices& platform_;
   std::function<QSize()> pictureSize_;
   std::function<ResizeResult(int, int)> resize_;
-  QLineEdit* edit1_ = nullptr;
-  QLineEdit* edit2_ = nullptr;
-  QCheckBox* checkBox1_ = nullptr;
+  QLineEdit* widthField_ = nullptr;
+  QLineEdit* heightField_ = nullptr;
+  QCheckBox* holdAspect_ = nullptr;
   // Whether a field's text was typed into since its last key release: keys that edit nothing
   // (Tab arriving from the other field, arrows, Shift) do not recompute the other field.
-  bool edited1_ = false;
-  bool edited2_ = false;
+  bool widthEdited_ = false;
+  bool heightEdited_ = false;
 };
 
 }  // namespace quillane

@@ -67,9 +67,9 @@ int main(int argc, char* argv[]) {
   // The program ends when its main window closes, whatever tool window is still open.
   QApplication::setQuitOnLastWindowClosed(false);
 
-  quillane::TMyPicture mainWindow(platform);
+  quillane::MainWindow mainWindow(platform);
   quillane::CreateToolWindows(mainWindow);
-  QObject::connect(&mainWindow, &quillane::TMyPicture::closed, &app, &QApplication::quit);
+  QObject::connect(&mainWindow, &quillane::MainWindow::closed, &app, &QApplication::quit);
   mainWindow.show();
   if (!files.isEmpty()) {
     if (QFileInfo(files.first()).isFile())

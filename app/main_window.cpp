@@ -13,8 +13,8 @@
 #include <iterator>
 
 #include "app/app_icon.h"
-#include "batch/batch_convert_ok.h"
 #include "data/startup_picture.h"
+#include "ui/batch_done_dialog.h"
 #include "ui/glyphs.h"
 #include "ui/picture_view.h"
 #include "ui/platform.h"
@@ -63,9 +63,9 @@ QFrame* Band(QWidget* parent, const char* name, int x, int width) {
 
 }  // namespace
 
-TMyPicture::TMyPicture(PlatformServices& platform) : TMyPicture(platform, StartupPicture()) {}
+MainWindow::MainWindow(PlatformServices& platform) : MainWindow(platform, StartupPicture()) {}
 
-TMyPicture::TMyPicture(PlatformServices& platform, TBitmap32 picture)
+MainWindow::MainWindow(PlatformServices& platform, Bitmap32 picture)
     : platform_(platform), document_(std::move(picture)), toolWindows_(Effects().size() + 1) {
   setObjectName("TMyPicture");
   setWindowTitle("Quillane v" QUILLANE_VERSION);
@@ -100,13 +100,13 @@ TMyPicture::TMyPicture(PlatformServices& platform, TBitmap32 picture)
   panel1->hide();
 
   // The batch file list: filled by the input-folder Browse, read by Convert, never shown.
-  listView1_ = new QListWidget(central);
-  listView1_->setObjectName("ListView1");
-  listView1_->hide();
+  batchFileList_ = new QListWidget(central);
+  batchFileList_->setObjectName("ListView1");
+  batchFileList_->hide();
 
-  batchConvertOk_ = new TBatchConvertOk(
+  batchDone_ = new BatchDoneDialog(
       platform_, [this] { return outputFolder_; }, this);
-  batchConvertOk_->hide();
+  batchDone_->hide();
   ConnectExportCommands();
   BuildViewControls();
 
@@ -116,11 +116,11 @@ TMyPicture::TMyPicture(PlatformServices& platform, TBitmap32 picture)
   resize(kInitialWidth, kInitialHeight);
 }
 
-TMyPicture::~TMyPicture() = default;
+MainWindow::~MainWindow() = default;
 
 // --- Construction ----------------------------------------------------------------------------
 
-void TMyPicture::BuildMenus() {
+void MainWindow::BuildMenus() {
   QMenuBar* bar = menuBar();
   bar->setObjectName("MainMenu1");
   auto addMenu = [&](const QString& caption, const char* name) {
@@ -135,27 +135,22 @@ void TMyPicture::BuildMenus() {
   };
 
   QMenu* file = addMenu(" File", "File1");
-  connect(addEntry(file, "Open", "Open1"), &QAction::triggered, this,
-          &TMyPicture::SpeedButton1Click);
-  connect(addEntry(file, "Save", "Save1"), &QAction::triggered, this,
-          &TMyPicture::SpeedButton2Click);
-  connect(addEntry(file, "Exit", "Exit1"), &QAction::triggered, this, &TMyPicture::Exit1Click);
+  connect(addEntry(file, "Open", "Open1"), &QAction::triggered, this, &MainWindow::OnOpen);
+  connect(addEntry(file, "Save", "Save1"), &QAction::triggered, this, &MainWindow::OnSave);
+  connect(addEntry(file, "Exit", "Exit1"), &QAction::triggered, this, &MainWindow::OnExit);
 
   QMenu* edit = addMenu(" Edit", "Edit1");
   undoAction_ = addEntry(edit, "Undo", "Undo1");
-  connect(undoAction_, &QAction::triggered, this, &TMyPicture::SpeedButton3Click);
+  connect(undoAction_, &QAction::triggered, this, &MainWindow::OnUndo);
   redoAction_ = addEntry(edit, "Redo", "Redo1");
-  connect(redoAction_, &QAction::triggered, this, &TMyPicture::SpeedButton18Click);
+  connect(redoAction_, &QAction::triggered, this, &MainWindow::OnRedo);
   addEntry(edit, "Image size", "Imagesize1");
 
   for (EffectMenu effectMenu : kEffectMenus) {
     QMenu* menu = addMenu(MenuCaption(effectMenu), MenuObjectName(effectMenu));
     for (const EffectSpec* spec : MenuEffects(effectMenu)) {
-      // The entry is named after its handler without "Click", as every other entry is.
-      QString name = QString::fromStdString(spec->menuHandler);
-      name.chop(static_cast<int>(QStringLiteral("Click").size()));
       QAction* entry =
-          addEntry(menu, QString::fromStdString(spec->menuEntry), name.toUtf8().constData());
+          addEntry(menu, QString::fromStdString(spec->menuEntry), spec->menuObjectName.c_str());
       const int number = spec->toolNumber;
       connect(entry, &QAction::triggered, this, [this, number] { OpenTool(number); });
     }
@@ -168,13 +163,13 @@ void TMyPicture::BuildMenus() {
   popupMenu_ = new QMenu(this);
   popupMenu_->setObjectName("PopupMenu1");
   connect(addEntry(popupMenu_, "Open a new picture", "Openanewpicture1"), &QAction::triggered, this,
-          &TMyPicture::SpeedButton1Click);
+          &MainWindow::OnOpen);
   addEntry(popupMenu_, "Image size", "Imagesize2");
   connect(addEntry(popupMenu_, "Save as", "Saveas1"), &QAction::triggered, this,
-          &TMyPicture::SpeedButton2Click);
+          &MainWindow::OnSave);
 }
 
-QToolButton* TMyPicture::AddSpeedButton(QWidget* panel, const char* name, const QString& hint,
+QToolButton* MainWindow::AddSpeedButton(QWidget* panel, const char* name, const QString& hint,
                                         int x) {
   auto* button = new QToolButton(panel);
   button->setObjectName(name);
@@ -185,7 +180,7 @@ QToolButton* TMyPicture::AddSpeedButton(QWidget* panel, const char* name, const 
   return button;
 }
 
-void TMyPicture::BuildToolbar(QWidget* central) {
+void MainWindow::BuildToolbar(QWidget* central) {
   controlBar_ = new ControlBar(central);
   controlBar_->setObjectName("ControlBar1");
   controlBar_->setFrameShape(QFrame::StyledPanel);
@@ -196,7 +191,7 @@ void TMyPicture::BuildToolbar(QWidget* central) {
     const char* hint;
     Glyph glyph;
   };
-  static const ButtonSpec kPanel4[] = {
+  static const ButtonSpec kCommandButtons[] = {
       {"SpeedButton1", "Open a picture as foreground", Glyph::Open},
       {"SpeedButton2", "Save", Glyph::Save},
       {"SpeedButton7", "Renew", Glyph::Renew},
@@ -206,7 +201,7 @@ void TMyPicture::BuildToolbar(QWidget* central) {
       {"SpeedButton5", "Zoom out the view", Glyph::ZoomOut},
       {"SpeedButton6", "Zoom in the view", Glyph::ZoomIn},
   };
-  static const ButtonSpec kPanel8[] = {
+  static const ButtonSpec kViewButtons[] = {
       {"SpeedButton12", "Rotate Clockwise", Glyph::RotateClockwise},
       {"SpeedButton8", "Rotate anticlockwise", Glyph::RotateAnticlockwise},
       {"SpeedButton9", "Set as wallpaper", Glyph::Wallpaper},
@@ -214,38 +209,38 @@ void TMyPicture::BuildToolbar(QWidget* central) {
       {"SpeedButton11", "Mail to friend", Glyph::Mail},
   };
 
-  const int panel4Width = static_cast<int>(std::size(kPanel4)) * kButtonSide + 2;
-  panel4_ = Band(controlBar_, "Panel4", kBandGrip, panel4Width);
+  const int commandBandWidth = static_cast<int>(std::size(kCommandButtons)) * kButtonSide + 2;
+  commandBand_ = Band(controlBar_, "Panel4", kBandGrip, commandBandWidth);
   int x = 1;
-  for (const ButtonSpec& b : kPanel4) {
-    AddSpeedButton(panel4_, b.name, b.hint, x)->setIcon(GlyphIcon(b.glyph));
+  for (const ButtonSpec& b : kCommandButtons) {
+    AddSpeedButton(commandBand_, b.name, b.hint, x)->setIcon(GlyphIcon(b.glyph));
     x += kButtonSide;
   }
 
-  panel8_ = Band(controlBar_, "Panel8", kBandGrip + panel4Width + kBandGrip, 200);
-  zoomLabel_ = new QLabel("100%", panel8_);
+  viewBand_ = Band(controlBar_, "Panel8", kBandGrip + commandBandWidth + kBandGrip, 200);
+  zoomLabel_ = new QLabel("100%", viewBand_);
   zoomLabel_->setObjectName("Label5");
   zoomLabel_->setAlignment(Qt::AlignCenter);
   zoomLabel_->setGeometry(1, 0, 56, kButtonSide + 1);
   x = 1 + 56 + 4;
-  for (const ButtonSpec& b : kPanel8) {
-    AddSpeedButton(panel8_, b.name, b.hint, x)->setIcon(GlyphIcon(b.glyph));
+  for (const ButtonSpec& b : kViewButtons) {
+    AddSpeedButton(viewBand_, b.name, b.hint, x)->setIcon(GlyphIcon(b.glyph));
     x += kButtonSide;
   }
 
-  auto* open = panel4_->findChild<QToolButton*>("SpeedButton1");
-  connect(open, &QToolButton::clicked, this, &TMyPicture::SpeedButton1Click);
-  auto* save = panel4_->findChild<QToolButton*>("SpeedButton2");
-  connect(save, &QToolButton::clicked, this, &TMyPicture::SpeedButton2Click);
-  auto* renew = panel4_->findChild<QToolButton*>("SpeedButton7");
-  connect(renew, &QToolButton::clicked, this, &TMyPicture::SpeedButton7Click);
-  undoButton_ = panel4_->findChild<QToolButton*>("SpeedButton3");
-  connect(undoButton_, &QToolButton::clicked, this, &TMyPicture::SpeedButton3Click);
-  redoButton_ = panel4_->findChild<QToolButton*>("SpeedButton18");
-  connect(redoButton_, &QToolButton::clicked, this, &TMyPicture::SpeedButton18Click);
+  auto* open = commandBand_->findChild<QToolButton*>("SpeedButton1");
+  connect(open, &QToolButton::clicked, this, &MainWindow::OnOpen);
+  auto* save = commandBand_->findChild<QToolButton*>("SpeedButton2");
+  connect(save, &QToolButton::clicked, this, &MainWindow::OnSave);
+  auto* renew = commandBand_->findChild<QToolButton*>("SpeedButton7");
+  connect(renew, &QToolButton::clicked, this, &MainWindow::OnRenew);
+  undoButton_ = commandBand_->findChild<QToolButton*>("SpeedButton3");
+  connect(undoButton_, &QToolButton::clicked, this, &MainWindow::OnUndo);
+  redoButton_ = commandBand_->findChild<QToolButton*>("SpeedButton18");
+  connect(redoButton_, &QToolButton::clicked, this, &MainWindow::OnRedo);
 }
 
-void TMyPicture::BuildView(QWidget* central) {
+void MainWindow::BuildView(QWidget* central) {
   scrollBox_ = new QScrollArea(central);
   scrollBox_->setObjectName("ScrollBox1");
   scrollBox_->setWidgetResizable(false);
@@ -266,23 +261,23 @@ void TMyPicture::BuildView(QWidget* central) {
 
 // --- Layout and lifecycle --------------------------------------------------------------------
 
-void TMyPicture::resizeEvent(QResizeEvent* event) {
+void MainWindow::resizeEvent(QResizeEvent* event) {
   QMainWindow::resizeEvent(event);
   const int w = width();
   const int h = height();
   controlBar_->setGeometry(0, 0, w - 10, 30);
-  panel8_->resize(controlBar_->width() - panel4_->width() - 32, panel8_->height());
+  viewBand_->resize(controlBar_->width() - commandBand_->width() - 32, viewBand_->height());
   scrollBox_->setGeometry(2, 32, w - 13, h - 120);
   statusLine_->move(5, scrollBox_->height() + 34);
   statusLine_->adjustSize();
 }
 
-void TMyPicture::closeEvent(QCloseEvent* event) {
+void MainWindow::closeEvent(QCloseEvent* event) {
   QMainWindow::closeEvent(event);
   if (event->isAccepted()) emit closed();
 }
 
-void TMyPicture::Exit1Click() {
+void MainWindow::OnExit() {
   close();
 }
 

@@ -34,21 +34,21 @@ namespace quillane {
 
 class PictureView;
 class PlatformServices;
-class TAboutus;
-class TBatchConvertOk;
-class TImage_size;
+class AboutBox;
+class BatchDoneDialog;
+class ImageSizeDialog;
 class ToolWindow;
 struct BatchResult;
 
-class TMyPicture : public QMainWindow, public ToolHost {
+class MainWindow : public QMainWindow, public ToolHost {
   Q_OBJECT
 
  public:
   // Starts on the program's built-in picture.
-  explicit TMyPicture(PlatformServices& platform);
+  explicit MainWindow(PlatformServices& platform);
   // Starts on picture instead (its alpha set to 255).
-  TMyPicture(PlatformServices& platform, TBitmap32 picture);
-  ~TMyPicture() override;
+  MainWindow(PlatformServices& platform, Bitmap32 picture);
+  ~MainWindow() override;
 
   PlatformServices& Platform() override { return platform_; }
   const PictureDocument& Document() const override { return document_; }
@@ -58,13 +58,13 @@ class TMyPicture : public QMainWindow, public ToolHost {
   // Makes picture the working, source and opened picture, shows it at the current zoom from
   // the top-left corner, and (for a file the user opened) resets the history. The status line
   // is left as it is.
-  void ShowNewPicture(TBitmap32 picture, bool resetHistory);
+  void ShowNewPicture(Bitmap32 picture, bool resetHistory);
 
   bool ApplyEffect(const EffectSpec& effect, const EffectParams& params,
                    bool recordHistory) override;
   // True while ApplyEffect waits for its routine; a second apply meanwhile is ignored.
   bool EffectRunning() const { return effectRunning_; }
-  void SetWorkingPicture(TBitmap32 picture, bool recordHistory) override;
+  void SetWorkingPicture(Bitmap32 picture, bool recordHistory) override;
 
   // Opens the picture file at path as File > Open does once a file is chosen (a file that
   // cannot be read is reported and changes nothing), and puts it first in the recent list.
@@ -73,7 +73,7 @@ class TMyPicture : public QMainWindow, public ToolHost {
   QStringList RecentFiles() const;
 
   // The history step after a tool has written the working picture.
-  void backup();
+  void RecordHistoryStep();
 
   // --- Status line and zoom -----------------------------------------------------------------
 
@@ -89,14 +89,14 @@ class TMyPicture : public QMainWindow, public ToolHost {
   // One zoom step (times 1.25 or 0.8): the label and the display size follow. A step is not
   // taken when it would make a side of the display larger than QWIDGETSIZE_MAX (zooming in) or
   // smaller than one pixel (zooming out).
-  void imgzoomin();
-  void imgzoomout();
+  void ZoomIn();
+  void ZoomOut();
   // Back to 100 %.
   void ZoomToActualSize();
   // The zoom label's text for zoom: one decimal in the user's locale, then "%".
   static QString ZoomLabelText(double zoom);
   // The image size dialog, created hidden with the main window.
-  TImage_size& ImageSize() { return *imageSize_; }
+  ImageSizeDialog& ImageSize() { return *imageSize_; }
 
   // --- Tool windows -------------------------------------------------------------------------
 
@@ -105,7 +105,7 @@ class TMyPicture : public QMainWindow, public ToolHost {
   int ActiveTool() const { return activeTool_; }
   void SetActiveTool(int number) override { activeTool_ = number; }
   // Closes the open tool window, if any.
-  void closetool();
+  void CloseToolWindow();
   // What a menu entry does: close the open tool window, place this one beside the main window
   // and show it.
   void OpenTool(int number);
@@ -124,8 +124,8 @@ class TMyPicture : public QMainWindow, public ToolHost {
   void SetOutputFolder(const QString& folder) { outputFolder_ = folder; }
   // The batch panels' Browse buttons: choose the input or output folder. Choosing the input
   // folder also lists its pictures in the batch file list.
-  void OpenDir() override;
-  void OpenDir2() override;
+  void ChooseInputFolder() override;
+  void ChooseOutputFolder() override;
   // The batch file list (the hidden ListView1): bare file names as shown (ShownName), as the
   // last input-folder Browse found them.
   QStringList BatchFiles() const;
@@ -137,29 +137,30 @@ class TMyPicture : public QMainWindow, public ToolHost {
                                  const QString& inputField, const QString& outputField,
                                  const std::function<void()>& afterEffect) override;
   // The dialog a finished batch conversion shows; created hidden with the main window.
-  TBatchConvertOk& BatchConvertOk() { return *batchConvertOk_; }
-  void ShowBatchConvertOk() override;
+  BatchDoneDialog& BatchDone() { return *batchDone_; }
+  void ShowBatchDone() override;
 
   bool LineArt() const override { return lineArt_; }
   void SetLineArt(bool on) override { lineArt_ = on; }
 
  public slots:
-  void SpeedButton1Click();   // open a picture
-  void SpeedButton2Click();   // save the working picture
-  void SpeedButton3Click();   // Undo
-  void SpeedButton18Click();  // Redo
-  void SpeedButton7Click();   // Renew
-  void SpeedButton9Click();   // set the working picture as the desktop wallpaper
-  void SpeedButton10Click();  // print the working picture
-  void SpeedButton11Click();  // mail the working picture
-  void Online1Click();        // the program's documentation
-  void About1Click();
-  void Exit1Click();
-  void SpeedButton5Click();   // zoom out
-  void SpeedButton6Click();   // zoom in
-  void SpeedButton12Click();  // rotate clockwise
-  void SpeedButton8Click();   // rotate anticlockwise
-  void Imagesize1Click();     // show the image size dialog
+  // The toolbar buttons and menu entries, one slot each.
+  void OnOpen();
+  void OnSave();
+  void OnUndo();
+  void OnRedo();
+  void OnRenew();
+  void OnSetWallpaper();
+  void OnPrint();
+  void OnMail();
+  void OnOnlineHelp();  // the program's documentation
+  void OnAbout();
+  void OnExit();
+  void OnZoomOut();
+  void OnZoomIn();
+  void OnRotateClockwise();
+  void OnRotateAnticlockwise();
+  void OnImageSize();  // shows the image size dialog
 
  signals:
   // The main window has closed: the program ends.
@@ -199,9 +200,9 @@ class TMyPicture : public QMainWindow, public ToolHost {
   void BuildViewControls();
   void SetZoom(double zoom);
   bool WheelZoom(QObject* watched, QWheelEvent* event);
-  void Image1MouseDown(QMouseEvent* event);
-  void Image1MouseMove(QMouseEvent* event);
-  void Image1MouseUp(QMouseEvent* event);
+  void PictureMouseDown(QMouseEvent* event);
+  void PictureMouseMove(QMouseEvent* event);
+  void PictureMouseUp(QMouseEvent* event);
   void Rotate(QuarterTurn turn);
   // Runs work on a thread of its own while this thread keeps the windows painted, with a busy
   // cursor and what runs in the status bar; input to the windows is ignored until it ends.
@@ -218,8 +219,8 @@ class TMyPicture : public QMainWindow, public ToolHost {
   std::vector<ToolWindow*> toolWindows_;  // owned as child widgets
 
   QFrame* controlBar_ = nullptr;
-  QFrame* panel4_ = nullptr;
-  QFrame* panel8_ = nullptr;
+  QFrame* commandBand_ = nullptr;
+  QFrame* viewBand_ = nullptr;
   QLabel* zoomLabel_ = nullptr;
   QScrollArea* scrollBox_ = nullptr;
   PictureView* image1_ = nullptr;
@@ -231,10 +232,10 @@ class TMyPicture : public QMainWindow, public ToolHost {
   QAction* redoAction_ = nullptr;
   QToolButton* downArrow_ = nullptr;
   QToolButton* upArrow_ = nullptr;
-  QListWidget* listView1_ = nullptr;
-  TBatchConvertOk* batchConvertOk_ = nullptr;
-  TAboutus* aboutBox_ = nullptr;
-  TImage_size* imageSize_ = nullptr;
+  QListWidget* batchFileList_ = nullptr;
+  BatchDoneDialog* batchDone_ = nullptr;
+  AboutBox* aboutBox_ = nullptr;
+  ImageSizeDialog* imageSize_ = nullptr;
 
   // Panning with the right mouse button, from a press on Image1 to its release.
   struct Panning {

@@ -54,7 +54,7 @@ QString DraggedFile(const QMimeData* data) {
 
 }  // namespace
 
-void TMyPicture::AddDesktopActions() {
+void MainWindow::AddDesktopActions() {
   struct Accelerator {
     const char* menu;
     char letter;
@@ -103,17 +103,17 @@ void TMyPicture::AddDesktopActions() {
   recentMenu_->setObjectName("OpenRecent1");
   recentMenu_->setToolTipsVisible(true);
   file->insertMenu(save, recentMenu_);
-  connect(recentMenu_, &QMenu::aboutToShow, this, &TMyPicture::FillRecentMenu);
+  connect(recentMenu_, &QMenu::aboutToShow, this, &MainWindow::FillRecentMenu);
   FillRecentMenu();
 
   setAcceptDrops(true);
 }
 
-QStringList TMyPicture::RecentFiles() const {
+QStringList MainWindow::RecentFiles() const {
   return StoredRecent();
 }
 
-void TMyPicture::RememberRecent(const QString& path) {
+void MainWindow::RememberRecent(const QString& path) {
   const QString full = QFileInfo(path).absoluteFilePath();
   QStringList files = StoredRecent();
   files.removeAll(full);
@@ -123,7 +123,7 @@ void TMyPicture::RememberRecent(const QString& path) {
   FillRecentMenu();
 }
 
-void TMyPicture::FillRecentMenu() {
+void MainWindow::FillRecentMenu() {
   if (recentMenu_ == nullptr) return;
   recentMenu_->clear();
   const QStringList files = StoredRecent();
@@ -140,7 +140,7 @@ void TMyPicture::FillRecentMenu() {
   recentMenu_->setEnabled(!files.isEmpty());
 }
 
-void TMyPicture::OpenRecentFile(const QString& path) {
+void MainWindow::OpenRecentFile(const QString& path) {
   if (!QFileInfo(path).isFile()) {
     QStringList files = StoredRecent();
     files.removeAll(path);
@@ -149,18 +149,18 @@ void TMyPicture::OpenRecentFile(const QString& path) {
     platform_.ShowMessage("Sorry", path + " no longer exists; it was taken off the recent list.");
     return;
   }
-  closetool();
+  CloseToolWindow();
   OpenPictureFile(path);
 }
 
-void TMyPicture::dragEnterEvent(QDragEnterEvent* event) {
+void MainWindow::dragEnterEvent(QDragEnterEvent* event) {
   if (!DraggedFile(event->mimeData()).isEmpty())
     event->acceptProposedAction();
   else
     event->ignore();
 }
 
-void TMyPicture::dropEvent(QDropEvent* event) {
+void MainWindow::dropEvent(QDropEvent* event) {
   const QString path = DraggedFile(event->mimeData());
   if (path.isEmpty()) {
     event->ignore();
@@ -168,7 +168,7 @@ void TMyPicture::dropEvent(QDropEvent* event) {
   }
   event->acceptProposedAction();
   // As File > Open does: the open tool window closes first.
-  closetool();
+  CloseToolWindow();
   OpenPictureFile(path);
 }
 

@@ -55,20 +55,20 @@ QString DownloadPage() {
 
 }  // namespace
 
-void TMyPicture::ConnectExportCommands() {
-  auto button = [this](const char* name) { return panel8_->findChild<QToolButton*>(name); };
-  connect(button("SpeedButton9"), &QToolButton::clicked, this, &TMyPicture::SpeedButton9Click);
-  connect(button("SpeedButton10"), &QToolButton::clicked, this, &TMyPicture::SpeedButton10Click);
-  connect(button("SpeedButton11"), &QToolButton::clicked, this, &TMyPicture::SpeedButton11Click);
+void MainWindow::ConnectExportCommands() {
+  auto button = [this](const char* name) { return viewBand_->findChild<QToolButton*>(name); };
+  connect(button("SpeedButton9"), &QToolButton::clicked, this, &MainWindow::OnSetWallpaper);
+  connect(button("SpeedButton10"), &QToolButton::clicked, this, &MainWindow::OnPrint);
+  connect(button("SpeedButton11"), &QToolButton::clicked, this, &MainWindow::OnMail);
   auto action = [this](const char* name) { return menuBar()->findChild<QAction*>(name); };
-  connect(action("Online1"), &QAction::triggered, this, &TMyPicture::Online1Click);
-  connect(action("About1"), &QAction::triggered, this, &TMyPicture::About1Click);
-  aboutBox_ = new TAboutus(this);
+  connect(action("Online1"), &QAction::triggered, this, &MainWindow::OnOnlineHelp);
+  connect(action("About1"), &QAction::triggered, this, &MainWindow::OnAbout);
+  aboutBox_ = new AboutBox(this);
   aboutBox_->hide();
 }
 
-void TMyPicture::SpeedButton10Click() {
-  const TBitmap32& picture = document_.Working();
+void MainWindow::OnPrint() {
+  const Bitmap32& picture = document_.Working();
   // An empty picture would be doubled for ever in search of half a page.
   if (picture.Empty()) {
     platform_.ShowMessage("Sorry", "There is no picture to print");
@@ -93,7 +93,7 @@ void TMyPicture::SpeedButton10Click() {
   }
 }
 
-void TMyPicture::SpeedButton9Click() {
+void MainWindow::OnSetWallpaper() {
   QString reason;
   const QString folder = ExportFolder(reason);
   if (folder.isEmpty()) {
@@ -116,7 +116,7 @@ void TMyPicture::SpeedButton9Click() {
   }
 }
 
-void TMyPicture::SpeedButton11Click() {
+void MainWindow::OnMail() {
   QString reason;
   const QString folder = ExportFolder(reason);
   if (folder.isEmpty()) {
@@ -140,7 +140,7 @@ void TMyPicture::SpeedButton11Click() {
   if (!result.accepted) tell(result.reason);
 }
 
-void TMyPicture::Online1Click() {
+void MainWindow::OnOnlineHelp() {
   const QString file =
       DocumentationFile(QCoreApplication::applicationDirPath(), QUILLANE_SOURCE_DIR);
   if (file.isEmpty()) {
@@ -150,7 +150,7 @@ void TMyPicture::Online1Click() {
   }
 }
 
-void TMyPicture::About1Click() {
+void MainWindow::OnAbout() {
   aboutBox_->show();
   aboutBox_->raise();
   aboutBox_->activateWindow();

@@ -18,17 +18,17 @@ const QString kSaveFilter = "*.jpg|*.jpg|*.bmp|*.bmp|*.wmf|*.wmf";
 
 }  // namespace
 
-void TMyPicture::SpeedButton1Click() {
-  closetool();
+void MainWindow::OnOpen() {
+  CloseToolWindow();
   const std::optional<FileChoice> choice = platform_.OpenPictureDialog(kOpenFilter);
   if (!choice) return;
   OpenPictureFile(choice->path);
 }
 
-bool TMyPicture::OpenPictureFile(const QString& path) {
+bool MainWindow::OpenPictureFile(const QString& path) {
   // Decoded once into a bitmap of its own: a file that cannot be read leaves the document as
   // it was.
-  std::optional<TBitmap32> picture;
+  std::optional<Bitmap32> picture;
   try {
     picture = LoadPictureFile(
         LocalPath(path), [this](const std::string& caption, const std::string& text) {
@@ -54,7 +54,7 @@ bool TMyPicture::OpenPictureFile(const QString& path) {
   return true;
 }
 
-void TMyPicture::SpeedButton2Click() {
+void MainWindow::OnSave() {
   const std::optional<FileChoice> choice = platform_.SavePictureDialog(kSaveFilter);
   if (!choice) return;
   const std::string name = LocalPath(choice->path);

@@ -20,12 +20,12 @@
 
 namespace quillane {
 
-void TMyPicture::ShowNewPicture(TBitmap32 picture, bool resetHistory) {
+void MainWindow::ShowNewPicture(Bitmap32 picture, bool resetHistory) {
   document_.Load(std::move(picture));
   ShowLoadedPicture(resetHistory);
 }
 
-void TMyPicture::ShowLoadedPicture(bool resetHistory) {
+void MainWindow::ShowLoadedPicture(bool resetHistory) {
   if (resetHistory) document_.ResetHistory();
   ShowWorking(zoomPercent_);
   scrollBox_->horizontalScrollBar()->setValue(0);
@@ -67,7 +67,7 @@ class IgnoreInput : public QObject {
 
 }  // namespace
 
-void TMyPicture::RunWhileWindowsWait(const QString& what, const std::function<void()>& work) {
+void MainWindow::RunWhileWindowsWait(const QString& what, const std::function<void()>& work) {
   effectRunning_ = true;
   QApplication::setOverrideCursor(Qt::WaitCursor);
   statusBar()->showMessage(what);
@@ -86,7 +86,7 @@ void TMyPicture::RunWhileWindowsWait(const QString& what, const std::function<vo
   effectRunning_ = false;
 }
 
-bool TMyPicture::ApplyEffect(const EffectSpec& effect, const EffectParams& params,
+bool MainWindow::ApplyEffect(const EffectSpec& effect, const EffectParams& params,
                              bool recordHistory) {
   // The picture a second apply would start from is still being made.
   if (effectRunning_) return false;
@@ -107,7 +107,7 @@ bool TMyPicture::ApplyEffect(const EffectSpec& effect, const EffectParams& param
     if (failure) std::rethrow_exception(failure);
     run.Land(document_, recordHistory);
   } catch (const std::bad_alloc&) {
-    const TBitmap32& source = document_.Source();
+    const Bitmap32& source = document_.Source();
     platform_.ShowError(QString::fromStdString(
         effect.statusText + " on the picture of " + std::to_string(source.Width()) + " by " +
         std::to_string(source.Height()) + " pixels " +
@@ -125,30 +125,30 @@ bool TMyPicture::ApplyEffect(const EffectSpec& effect, const EffectParams& param
   return true;
 }
 
-void TMyPicture::SetWorkingPicture(TBitmap32 picture, bool recordHistory) {
+void MainWindow::SetWorkingPicture(Bitmap32 picture, bool recordHistory) {
   document_.SetWorking(std::move(picture));
   if (recordHistory) document_.Backup();
   ShowWorkingChanged();
 }
 
-void TMyPicture::ShowWorkingChanged() {
+void MainWindow::ShowWorkingChanged() {
   ShowWorking(zoomPercent_);
   UpdateHistoryControls();
 }
 
-void TMyPicture::backup() {
+void MainWindow::RecordHistoryStep() {
   document_.Backup();
   UpdateHistoryControls();
 }
 
-void TMyPicture::UpdateHistoryControls() {
+void MainWindow::UpdateHistoryControls() {
   undoButton_->setEnabled(document_.CanUndo());
   undoAction_->setEnabled(document_.CanUndo());
   redoButton_->setEnabled(document_.CanRedo());
   redoAction_->setEnabled(document_.CanRedo());
 }
 
-void TMyPicture::SpeedButton3Click() {
+void MainWindow::OnUndo() {
   if (document_.Undo()) {
     ShowWorking(ZoomFromLabel());
     SetStatusText("Undo");
@@ -156,7 +156,7 @@ void TMyPicture::SpeedButton3Click() {
   UpdateHistoryControls();
 }
 
-void TMyPicture::SpeedButton18Click() {
+void MainWindow::OnRedo() {
   if (document_.Redo()) {
     ShowWorking(ZoomFromLabel());
     SetStatusText("Redo");
@@ -164,7 +164,7 @@ void TMyPicture::SpeedButton18Click() {
   UpdateHistoryControls();
 }
 
-void TMyPicture::SpeedButton7Click() {
+void MainWindow::OnRenew() {
   document_.Renew();
   ShowWorking(zoomPercent_);
   scrollBox_->horizontalScrollBar()->setValue(0);
@@ -172,11 +172,11 @@ void TMyPicture::SpeedButton7Click() {
   UpdateHistoryControls();
 }
 
-QString TMyPicture::StatusText() const {
+QString MainWindow::StatusText() const {
   return statusLine_->text();
 }
 
-void TMyPicture::SetStatusText(const QString& text) {
+void MainWindow::SetStatusText(const QString& text) {
   statusLine_->setText(text);
   statusLine_->adjustSize();
 }

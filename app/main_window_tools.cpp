@@ -9,29 +9,29 @@
 #include "app/local_path.h"
 #include "app/main_window.h"
 #include "batch/batch_convert.h"
-#include "batch/batch_convert_ok.h"
+#include "ui/batch_done_dialog.h"
 #include "ui/platform.h"
 #include "ui/tool_window.h"
 
 namespace quillane {
 
-void TMyPicture::RegisterToolWindow(ToolWindow* window) {
+void MainWindow::RegisterToolWindow(ToolWindow* window) {
   const int number = window->Number();
   if (number < 1 || number >= static_cast<int>(toolWindows_.size())) return;
   toolWindows_[static_cast<std::size_t>(number)] = window;
 }
 
-ToolWindow* TMyPicture::ToolWindowAt(int number) const {
+ToolWindow* MainWindow::ToolWindowAt(int number) const {
   if (number < 1 || number >= static_cast<int>(toolWindows_.size())) return nullptr;
   return toolWindows_[static_cast<std::size_t>(number)];
 }
 
-void TMyPicture::closetool() {
+void MainWindow::CloseToolWindow() {
   if (ToolWindow* open = ToolWindowAt(activeTool_)) open->close();
 }
 
-void TMyPicture::OpenTool(int number) {
-  closetool();
+void MainWindow::OpenTool(int number) {
+  CloseToolWindow();
   ToolWindow* window = ToolWindowAt(number);
   if (window == nullptr) return;
   const QRect main = frameGeometry();
@@ -43,27 +43,27 @@ void TMyPicture::OpenTool(int number) {
   window->activateWindow();
 }
 
-QIcon TMyPicture::DownArrowIcon() const {
+QIcon MainWindow::DownArrowIcon() const {
   return downArrow_->icon();
 }
-QIcon TMyPicture::UpArrowIcon() const {
+QIcon MainWindow::UpArrowIcon() const {
   return upArrow_->icon();
 }
 
-void TMyPicture::OpenDir() {
+void MainWindow::ChooseInputFolder() {
   const std::optional<QString> folder =
       platform_.BrowseFolder("Open a directory to input pictures to convert.", inputFolder_);
   if (!folder) return;
   inputFolder_ = *folder;
-  listView1_->clear();
+  batchFileList_->clear();
   // A name is any bytes: the list shows it readably and keeps the bytes themselves to load.
   for (const std::string& name : ScanBatchFolder(LocalPath(inputFolder_))) {
-    auto* item = new QListWidgetItem(QString::fromStdString(ShownName(name)), listView1_);
+    auto* item = new QListWidgetItem(QString::fromStdString(ShownName(name)), batchFileList_);
     item->setData(Qt::UserRole, QByteArray::fromStdString(name));
   }
 }
 
-void TMyPicture::OpenDir2() {
+void MainWindow::ChooseOutputFolder() {
   // Opens at the input folder, as the batch panels always have.
   const std::optional<QString> folder =
       platform_.BrowseFolder("Open a directory to output pictures.", inputFolder_);
@@ -71,20 +71,20 @@ void TMyPicture::OpenDir2() {
   outputFolder_ = *folder;
 }
 
-QStringList TMyPicture::BatchFiles() const {
+QStringList MainWindow::BatchFiles() const {
   QStringList names;
-  for (int i = 0; i < listView1_->count(); ++i) names << listView1_->item(i)->text();
+  for (int i = 0; i < batchFileList_->count(); ++i) names << batchFileList_->item(i)->text();
   return names;
 }
 
-BatchResult TMyPicture::ConvertBatchFolder(const EffectSpec& effect, const EffectParams& params,
+BatchResult MainWindow::ConvertBatchFolder(const EffectSpec& effect, const EffectParams& params,
                                            const QString& inputField, const QString& outputField,
                                            const std::function<void()>& afterEffect) {
   BatchJob job;
   job.inputFolder = TrimBlanks(LocalPath(inputField));
   job.outputFolder = TrimBlanks(LocalPath(outputField));
-  for (int i = 0; i < listView1_->count(); ++i)
-    job.files.push_back(listView1_->item(i)->data(Qt::UserRole).toByteArray().toStdString());
+  for (int i = 0; i < batchFileList_->count(); ++i)
+    job.files.push_back(batchFileList_->item(i)->data(Qt::UserRole).toByteArray().toStdString());
   inputFolder_ = FromLocalPath(job.inputFolder);
 
   BatchObserver observer;
@@ -142,10 +142,10 @@ BatchResult TMyPicture::ConvertBatchFolder(const EffectSpec& effect, const Effec
   return result;
 }
 
-void TMyPicture::ShowBatchConvertOk() {
-  batchConvertOk_->show();
-  batchConvertOk_->raise();
-  batchConvertOk_->activateWindow();
+void MainWindow::ShowBatchDone() {
+  batchDone_->show();
+  batchDone_->raise();
+  batchDone_->activateWindow();
 }
 
 }  // namespace quillane

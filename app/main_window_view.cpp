@@ -41,15 +41,15 @@ std::int64_t DisplaySide(int side, double zoom) {
 
 }  // namespace
 
-void TMyPicture::BuildViewControls() {
+void MainWindow::BuildViewControls() {
   auto button = [this](const char* name) { return findChild<QToolButton*>(name); };
-  connect(button("SpeedButton5"), &QToolButton::clicked, this, &TMyPicture::SpeedButton5Click);
-  connect(button("SpeedButton6"), &QToolButton::clicked, this, &TMyPicture::SpeedButton6Click);
-  connect(button("SpeedButton12"), &QToolButton::clicked, this, &TMyPicture::SpeedButton12Click);
-  connect(button("SpeedButton8"), &QToolButton::clicked, this, &TMyPicture::SpeedButton8Click);
-  connect(button("SpeedButton4"), &QToolButton::clicked, this, &TMyPicture::Imagesize1Click);
+  connect(button("SpeedButton5"), &QToolButton::clicked, this, &MainWindow::OnZoomOut);
+  connect(button("SpeedButton6"), &QToolButton::clicked, this, &MainWindow::OnZoomIn);
+  connect(button("SpeedButton12"), &QToolButton::clicked, this, &MainWindow::OnRotateClockwise);
+  connect(button("SpeedButton8"), &QToolButton::clicked, this, &MainWindow::OnRotateAnticlockwise);
+  connect(button("SpeedButton4"), &QToolButton::clicked, this, &MainWindow::OnImageSize);
   for (const char* name : {"Imagesize1", "Imagesize2"})
-    connect(findChild<QAction*>(name), &QAction::triggered, this, &TMyPicture::Imagesize1Click);
+    connect(findChild<QAction*>(name), &QAction::triggered, this, &MainWindow::OnImageSize);
 
   // The zoom where a desktop user looks for it, with the usual keys.
   auto* view = new QMenu(" View", menuBar());
@@ -65,13 +65,13 @@ void TMyPicture::BuildViewControls() {
   };
   connect(addEntry("Zoom in", "ZoomIn1",
                    {QKeySequence::ZoomIn, QKeySequence(Qt::CTRL | Qt::Key_Equal)}),
-          &QAction::triggered, this, &TMyPicture::imgzoomin);
+          &QAction::triggered, this, &MainWindow::ZoomIn);
   connect(addEntry("Zoom out", "ZoomOut1", {QKeySequence::ZoomOut}), &QAction::triggered, this,
-          &TMyPicture::imgzoomout);
+          &MainWindow::ZoomOut);
   connect(addEntry("Actual size", "ActualSize1", {QKeySequence(Qt::CTRL | Qt::Key_0)}),
-          &QAction::triggered, this, &TMyPicture::ZoomToActualSize);
+          &QAction::triggered, this, &MainWindow::ZoomToActualSize);
 
-  imageSize_ = new TImage_size(
+  imageSize_ = new ImageSizeDialog(
       platform_,
       [this] { return QSize(document_.Working().Width(), document_.Working().Height()); },
       [this](int w, int h) {
@@ -87,13 +87,13 @@ void TMyPicture::BuildViewControls() {
 
 // --- Zoom ----------------------------------------------------------------------------------
 
-void TMyPicture::ShowWorking(double zoom) {
+void MainWindow::ShowWorking(double zoom) {
   image1_->SetPicture(document_.Working());
   SetDisplaySize(zoom);
 }
 
-void TMyPicture::SetDisplaySize(double zoom) {
-  const TBitmap32& picture = document_.Working();
+void MainWindow::SetDisplaySize(double zoom) {
+  const Bitmap32& picture = document_.Working();
   // A picture opened or resized at a zoom meant for another one may come out of range: it is
   // shown at least one pixel and at most the largest widget in each direction.
   const auto side = [zoom](int s) {
@@ -102,13 +102,13 @@ void TMyPicture::SetDisplaySize(double zoom) {
   image1_->resize(side(picture.Width()), side(picture.Height()));
 }
 
-QString TMyPicture::ZoomLabelText(double zoom) {
+QString MainWindow::ZoomLabelText(double zoom) {
   QLocale locale;
   locale.setNumberOptions(QLocale::OmitGroupSeparator);
   return locale.toString(zoom, 'f', 1) + "%";
 }
 
-double TMyPicture::ZoomFromLabel() const {
+double MainWindow::ZoomFromLabel() const {
   QString number = zoomLabel_->text();
   number.chop(1);
   bool ok = false;
@@ -120,55 +120,55 @@ double TMyPicture::ZoomFromLabel() const {
   return ok ? c : zoomPercent_;
 }
 
-void TMyPicture::SetZoom(double zoom) {
+void MainWindow::SetZoom(double zoom) {
   zoomPercent_ = zoom;
   zoomLabel_->setText(ZoomLabelText(zoom));
   SetDisplaySize(zoom);
 }
 
-void TMyPicture::imgzoomin() {
+void MainWindow::ZoomIn() {
   const double zoom = static_cast<double>(zoomPercent_ * kZoomInFactor);
-  const TBitmap32& p = document_.Working();
+  const Bitmap32& p = document_.Working();
   if (std::max(DisplaySide(p.Width(), zoom), DisplaySide(p.Height(), zoom)) > QWIDGETSIZE_MAX)
     return;
   SetZoom(zoom);
 }
 
-void TMyPicture::imgzoomout() {
+void MainWindow::ZoomOut() {
   const double zoom = static_cast<double>(zoomPercent_ * kZoomOutFactor);
-  const TBitmap32& p = document_.Working();
+  const Bitmap32& p = document_.Working();
   if (std::min(DisplaySide(p.Width(), zoom), DisplaySide(p.Height(), zoom)) < 1) return;
   SetZoom(zoom);
 }
 
-void TMyPicture::ZoomToActualSize() {
+void MainWindow::ZoomToActualSize() {
   SetZoom(100.0);
 }
 
-void TMyPicture::SpeedButton5Click() {
-  imgzoomout();
+void MainWindow::OnZoomOut() {
+  ZoomOut();
 }
 
-void TMyPicture::SpeedButton6Click() {
-  imgzoomin();
+void MainWindow::OnZoomIn() {
+  ZoomIn();
 }
 
 // --- The application-wide filter -----------------------------------------------------------
 
-bool TMyPicture::eventFilter(QObject* watched, QEvent* event) {
+bool MainWindow::eventFilter(QObject* watched, QEvent* event) {
   switch (event->type()) {
     case QEvent::Wheel:
       if (WheelZoom(watched, static_cast<QWheelEvent*>(event))) return true;
       break;
     case QEvent::MouseButtonPress:
     case QEvent::MouseButtonDblClick:  // the second press of a double click
-      if (watched == image1_) Image1MouseDown(static_cast<QMouseEvent*>(event));
+      if (watched == image1_) PictureMouseDown(static_cast<QMouseEvent*>(event));
       break;
     case QEvent::MouseMove:
-      if (watched == image1_) Image1MouseMove(static_cast<QMouseEvent*>(event));
+      if (watched == image1_) PictureMouseMove(static_cast<QMouseEvent*>(event));
       break;
     case QEvent::MouseButtonRelease:
-      if (watched == image1_) Image1MouseUp(static_cast<QMouseEvent*>(event));
+      if (watched == image1_) PictureMouseUp(static_cast<QMouseEvent*>(event));
       break;
     default:
       break;
@@ -176,7 +176,7 @@ bool TMyPicture::eventFilter(QObject* watched, QEvent* event) {
   return QMainWindow::eventFilter(watched, event);
 }
 
-bool TMyPicture::WheelZoom(QObject* watched, QWheelEvent* event) {
+bool MainWindow::WheelZoom(QObject* watched, QWheelEvent* event) {
   auto* widget = qobject_cast<QWidget*>(watched);
   if (widget == nullptr || widget->window() != this) return false;
   const int turn = event->angleDelta().y();
@@ -185,30 +185,30 @@ bool TMyPicture::WheelZoom(QObject* watched, QWheelEvent* event) {
     // away from the user zooms in, one step per notch however finely the wheel reports.
     if ((turn > 0) != (ctrlWheelRest_ > 0)) ctrlWheelRest_ = 0;
     ctrlWheelRest_ += turn;
-    for (; ctrlWheelRest_ >= kWheelNotch; ctrlWheelRest_ -= kWheelNotch) imgzoomin();
-    for (; ctrlWheelRest_ <= -kWheelNotch; ctrlWheelRest_ += kWheelNotch) imgzoomout();
+    for (; ctrlWheelRest_ >= kWheelNotch; ctrlWheelRest_ -= kWheelNotch) ZoomIn();
+    for (; ctrlWheelRest_ <= -kWheelNotch; ctrlWheelRest_ += kWheelNotch) ZoomOut();
     return true;
   }
   // Over the picture or its scroll box, every wheel message is one step: towards the user in,
   // away from the user out; the scroll box does not scroll.
   if (turn == 0 || !(widget == scrollBox_ || scrollBox_->isAncestorOf(widget))) return false;
   if (turn < 0)
-    imgzoomin();
+    ZoomIn();
   else
-    imgzoomout();
+    ZoomOut();
   return true;
 }
 
 // --- Panning -------------------------------------------------------------------------------
 
-void TMyPicture::Image1MouseDown(QMouseEvent* event) {
+void MainWindow::PictureMouseDown(QMouseEvent* event) {
   panning_ =
       Panning{true, true, event->position().toPoint(), scrollBox_->horizontalScrollBar()->value(),
               scrollBox_->verticalScrollBar()->value()};
   if (event->button() == Qt::RightButton) image1_->setCursor(Qt::ClosedHandCursor);
 }
 
-void TMyPicture::Image1MouseMove(QMouseEvent* event) {
+void MainWindow::PictureMouseMove(QMouseEvent* event) {
   if (!(event->buttons() & Qt::RightButton) || !panning_.dragging) return;
   // The picture moves with the scroll, so the point under the mouse stays under it.
   const QPoint moved = panning_.press - event->position().toPoint();
@@ -220,7 +220,7 @@ void TMyPicture::Image1MouseMove(QMouseEvent* event) {
     panning_.unmoved = false;
 }
 
-void TMyPicture::Image1MouseUp(QMouseEvent* event) {
+void MainWindow::PictureMouseUp(QMouseEvent* event) {
   panning_.dragging = false;
   image1_->unsetCursor();
   if (event->button() == Qt::RightButton && panning_.unmoved)
@@ -229,8 +229,8 @@ void TMyPicture::Image1MouseUp(QMouseEvent* event) {
 
 // --- Rotation and image size ---------------------------------------------------------------
 
-void TMyPicture::Rotate(QuarterTurn turn) {
-  const TBitmap32& working = document_.Working();
+void MainWindow::Rotate(QuarterTurn turn) {
+  const Bitmap32& working = document_.Working();
   const int width = working.Width(), height = working.Height();
   bool turned = false;
   try {
@@ -254,15 +254,15 @@ void TMyPicture::Rotate(QuarterTurn turn) {
   ShowLoadedPicture(false);
 }
 
-void TMyPicture::SpeedButton12Click() {
+void MainWindow::OnRotateClockwise() {
   Rotate(QuarterTurn::Clockwise);
 }
 
-void TMyPicture::SpeedButton8Click() {
+void MainWindow::OnRotateAnticlockwise() {
   Rotate(QuarterTurn::Anticlockwise);
 }
 
-void TMyPicture::Imagesize1Click() {
+void MainWindow::OnImageSize() {
   imageSize_->show();
   imageSize_->raise();
   imageSize_->activateWindow();
@@ -270,7 +270,7 @@ void TMyPicture::Imagesize1Click() {
 
 // --- Thumbnails ----------------------------------------------------------------------------
 
-QRect TMyPicture::DisplayImageGeometry(int pictureWidth, int pictureHeight) {
+QRect MainWindow::DisplayImageGeometry(int pictureWidth, int pictureHeight) {
   if (pictureWidth < 1 || pictureHeight < 1) return QRect(2, 2, 0, 0);
   if (static_cast<Extended>(pictureWidth) / pictureHeight >= 1) {
     const int h = MulDiv(105, pictureHeight, pictureWidth);
@@ -282,7 +282,7 @@ QRect TMyPicture::DisplayImageGeometry(int pictureWidth, int pictureHeight) {
   return QRect(l + 2, 2, w + 2, 105);
 }
 
-void TMyPicture::DisplayImage(PictureView& control) const {
+void MainWindow::DisplayImage(PictureView& control) const {
   const QSize size = control.PictureSize();
   control.setGeometry(DisplayImageGeometry(size.width(), size.height()));
 }

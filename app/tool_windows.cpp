@@ -2,14 +2,15 @@
 
 #include <algorithm>
 #include <iterator>
+#include <string_view>
 
 #include "app/main_window.h"
-#include "effects/adjust/color_panel_window.h"
-#include "effects/adjust/preview_window.h"
-#include "effects/mono/bw_sketch_window.h"
-#include "effects/surface/snapshot_window.h"
-#include "effects/surface/texture_window.h"
-#include "freehand/painting_window.h"
+#include "ui/effects/bw_sketch_window.h"
+#include "ui/effects/color_panel_window.h"
+#include "ui/effects/preview_window.h"
+#include "ui/effects/snapshot_window.h"
+#include "ui/effects/texture_window.h"
+#include "ui/freehand/painting_window.h"
 #include "ui/tool_window.h"
 
 namespace quillane {
@@ -22,25 +23,29 @@ ToolWindow* Make(const EffectSpec& spec, ToolHost& host, QWidget* parent) {
   return new Window(spec, host, parent);
 }
 
-// The windows with behaviour of their own, by tool number.
+// The windows with behaviour of their own, by their effect's command-line name.
 struct SpecialWindow {
-  int toolNumber;
+  std::string_view effect;
   ToolWindowFactory make;
 };
 constexpr SpecialWindow kSpecialWindows[] = {
-    {1, Make<TBack_and_White_Sketch>}, {12, Make<TColor_variety>}, {13, Make<TColor_Panel>},
-    {16, Make<TColor_Filter>},         {17, Make<TStria>},         {14, Make<TTexture>},
+    {"pencil-sketch", Make<BwSketchWindow>},
+    {"color-variety", Make<ColorVarietyWindow>},
+    {"color-panel", Make<ColorPanelWindow>},
+    {"color-filter", Make<ColorFilterWindow>},
+    {"stria", Make<StriaWindow>},
+    {"texture", Make<TextureWindow>},
 };
 
 }  // namespace
 
-void CreateToolWindows(TMyPicture& main) {
+void CreateToolWindows(MainWindow& main) {
   // The freehand windows the drawing styles' "Color up" opens; they go with the main window.
   auto* freehand = new FreehandPainting(main, &main);
   for (const EffectSpec* spec : Effects()) {
     const auto special =
         std::find_if(std::begin(kSpecialWindows), std::end(kSpecialWindows),
-                     [&](const SpecialWindow& w) { return w.toolNumber == spec->toolNumber; });
+                     [&](const SpecialWindow& w) { return w.effect == spec->cliName; });
     const ToolWindowFactory make =
         special != std::end(kSpecialWindows) ? special->make : Make<ToolWindow>;
     ToolWindow* window = make(*spec, main, &main);

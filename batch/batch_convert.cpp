@@ -121,7 +121,7 @@ namespace {
 
 // A listed picture read apart from the document, with the notices the loader gave meanwhile.
 struct Decoded {
-  std::shared_ptr<TBitmap32> picture;  // alpha 255 already; null when reason says why not
+  std::shared_ptr<Bitmap32> picture;  // alpha 255 already; null when reason says why not
   std::string reason;
   bool outOfMemory = false;  // worth another try once nothing else holds memory
   std::vector<std::pair<std::string, std::string>> notices;
@@ -130,7 +130,7 @@ struct Decoded {
 Decoded DecodeApart(const std::string& path) {
   Decoded decoded;
   try {
-    std::optional<TBitmap32> picture =
+    std::optional<Bitmap32> picture =
         LoadPictureFile(path, [&decoded](const std::string& caption, const std::string& text) {
           decoded.notices.emplace_back(caption, text);
         });
@@ -138,7 +138,7 @@ Decoded DecodeApart(const std::string& path) {
       decoded.reason = NotValidFormat(path);
     } else {
       SetAlphaChannel(*picture, 255);
-      decoded.picture = std::make_shared<TBitmap32>(std::move(*picture));
+      decoded.picture = std::make_shared<Bitmap32>(std::move(*picture));
     }
   } catch (const std::bad_alloc&) {
     decoded = Decoded();
@@ -296,7 +296,7 @@ class BatchLoop {
       document_.Load(std::move(prepared.decoded->picture));
     } else {
       ahead_ = {};  // read now as the one-at-a-time loop does, alone
-      std::optional<TBitmap32> picture;
+      std::optional<Bitmap32> picture;
       std::string reason;
       try {
         picture = LoadPictureFile(path, observer_.message);

@@ -90,7 +90,7 @@ void BM_DecodeAndEncodeAlone(benchmark::State& state) {
   fs::create_directories(folders.Out());
   for (auto _ : state) {
     for (const std::string& name : files) {
-      const std::optional<TBitmap32> picture = LoadPictureFile(folders.In() + "/" + name);
+      const std::optional<Bitmap32> picture = LoadPictureFile(folders.In() + "/" + name);
       if (!picture) {
         state.SkipWithError("a picture did not load");
         return;

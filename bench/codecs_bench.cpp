@@ -13,13 +13,13 @@
 
 namespace {
 
+using quillane::Bitmap32;
 using quillane::Pixel;
-using quillane::TBitmap32;
 
 constexpr int kWidth = 6000, kHeight = 4000;
 
-const TBitmap32& Photo() {
-  static const TBitmap32 photo = quillane::bench::SyntheticPhoto(kWidth, kHeight);
+const Bitmap32& Photo() {
+  static const Bitmap32 photo = quillane::bench::SyntheticPhoto(kWidth, kHeight);
   return photo;
 }
 
@@ -57,7 +57,7 @@ void BM_JpegDecode24Mpx(benchmark::State& state) {
 BENCHMARK(BM_JpegDecode24Mpx)->Unit(benchmark::kMillisecond)->MinTime(3);
 
 void BM_JpegEncode24Mpx(benchmark::State& state) {
-  const TBitmap32& photo = Photo();
+  const Bitmap32& photo = Photo();
   for (auto _ : state) {
     auto bytes = quillane::codecs::EncodeJpeg(photo, 90);
     benchmark::DoNotOptimize(bytes.data());
@@ -68,7 +68,7 @@ BENCHMARK(BM_JpegEncode24Mpx)->Unit(benchmark::kMillisecond)->MinTime(3);
 
 // Encoding plus the safe write: temporary file, fsync and rename.
 void BM_SaveJpeg24Mpx(benchmark::State& state) {
-  const TBitmap32& photo = Photo();
+  const Bitmap32& photo = Photo();
   const std::string path = (SavedPhoto().folder / "saved.jpg").string();
   for (auto _ : state) quillane::SaveJpeg(photo, path);
   state.SetItemsProcessed(state.iterations() * kWidth * kHeight);

@@ -18,8 +18,8 @@ namespace {
 using bench::Photo;
 
 void Memcpy(benchmark::State& state) {
-  const TBitmap32& photo = Photo();
-  TBitmap32 copy(photo.Width(), photo.Height());
+  const Bitmap32& photo = Photo();
+  Bitmap32 copy(photo.Width(), photo.Height());
   for (auto _ : state) {
     std::memcpy(static_cast<void*>(copy.Data()), photo.Data(), photo.PixelCount() * sizeof(Pixel));
     benchmark::ClobberMemory();
@@ -33,7 +33,7 @@ void Run(benchmark::State& state, Routine routine) {
   SetRowSplit({static_cast<int>(state.range(1)), kParallelThreshold});
   routine();  // later runs find their memory kept, as they do in the program
   for (auto _ : state) {
-    const TBitmap32 result = routine();
+    const Bitmap32 result = routine();
     benchmark::DoNotOptimize(result.Data());
   }
   SetRowSplit({});
@@ -56,7 +56,7 @@ void Stria(benchmark::State& state) {
 BENCHMARK(Stria)->ArgsProduct({{1, 2}, {1, 0}})->Unit(benchmark::kMillisecond)->UseRealTime();
 
 void Filter(benchmark::State& state) {
-  Run(state, [&] { return filter(Photo(), ColorFilterKind(state.range(0))); });
+  Run(state, [&] { return ColorFilter(Photo(), ColorFilterKind(state.range(0))); });
 }
 BENCHMARK(Filter)->ArgsProduct({{1, 4}, {1, 0}})->Unit(benchmark::kMillisecond)->UseRealTime();
 

@@ -12,11 +12,11 @@
 #include "app/main_window.h"
 #include "app/tool_windows.h"
 #include "bench/synthetic_photo.h"
-#include "freehand/control_panel_window.h"
-#include "freehand/painting_window.h"
 #include "freehand/stroke_history.h"
 #include "freehand/strokes.h"
-#include "freehand/work_area_window.h"
+#include "ui/freehand/control_panel_window.h"
+#include "ui/freehand/painting_window.h"
+#include "ui/freehand/work_area_window.h"
 #include "ui/platform.h"
 
 namespace quillane {
@@ -33,7 +33,7 @@ QPoint PathPoint(std::int64_t i) {
 }
 
 void BM_WholePictureCopy(benchmark::State& state) {
-  TBitmap32 copy(kWidth, kHeight);
+  Bitmap32 copy(kWidth, kHeight);
   for (auto _ : state) {
     std::memcpy(copy.Data(), Photo().Data(), Photo().PixelCount() * sizeof(Pixel));
     benchmark::DoNotOptimize(copy.Data());
@@ -42,7 +42,7 @@ void BM_WholePictureCopy(benchmark::State& state) {
 BENCHMARK(BM_WholePictureCopy)->Unit(benchmark::kMicrosecond);
 
 void BM_BrushDab(benchmark::State& state) {
-  TBitmap32 picture = Photo();
+  Bitmap32 picture = Photo();
   const int size = static_cast<int>(state.range(0));
   const FreehandHsl red = RGBtoHSL(Pixel{0, 0, 255, 255});
   StrokeHistory strokes;
@@ -76,7 +76,7 @@ void BM_BrushMoveEvent(benchmark::State& state) {
                                      QPointingDevice::PointerType::Generic,
                                      QInputDevice::Capability::Position, 1, 3);
   NoPlatform platform;
-  TMyPicture main(platform, Photo());
+  MainWindow main(platform, Photo());
   CreateToolWindows(main);
   main.show();
   FreehandPainting* painting = main.findChild<FreehandPainting*>();
@@ -101,13 +101,13 @@ void BM_BrushMoveEvent(benchmark::State& state) {
 BENCHMARK(BM_BrushMoveEvent)->Unit(benchmark::kMicrosecond);
 
 void BM_Thin(benchmark::State& state) {
-  TBitmap32 picture = Photo();
+  Bitmap32 picture = Photo();
   for (auto _ : state) Thin(picture);
 }
 BENCHMARK(BM_Thin)->Unit(benchmark::kMillisecond);
 
 void BM_Thick(benchmark::State& state) {
-  TBitmap32 picture = Photo();
+  Bitmap32 picture = Photo();
   for (auto _ : state) Thick(picture);
 }
 BENCHMARK(BM_Thick)->Unit(benchmark::kMillisecond);

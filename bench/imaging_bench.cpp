@@ -36,18 +36,18 @@ constexpr int kWidth = bench::kPhotoWidth;
 constexpr int kHeight = bench::kPhotoHeight;
 using bench::Photo;
 
-const TBitmap32& EdgeMap() {
-  static const TBitmap32 edges = [] {
-    TBitmap32 e = Photo();
-    picsobel(e);
+const Bitmap32& EdgeMap() {
+  static const Bitmap32 edges = [] {
+    Bitmap32 e = Photo();
+    InvertedSobelEdges(e);
     return e;
   }();
   return edges;
 }
 
-const TBitmap32& GrayEdgeMap() {
-  static const TBitmap32 gray = [] {
-    TBitmap32 g = EdgeMap();
+const Bitmap32& GrayEdgeMap() {
+  static const Bitmap32 gray = [] {
+    Bitmap32 g = EdgeMap();
     ConvertToGray(g);
     return g;
   }();
@@ -59,8 +59,8 @@ void SetBytes(benchmark::State& state) {
 }
 
 void BM_Memcpy(benchmark::State& state) {
-  const TBitmap32& photo = Photo();
-  TBitmap32 copy(kWidth, kHeight);
+  const Bitmap32& photo = Photo();
+  Bitmap32 copy(kWidth, kHeight);
   for (auto _ : state) {
     std::memcpy(copy.Data(), photo.Data(), photo.PixelCount() * sizeof(Pixel));
     benchmark::ClobberMemory();
@@ -73,7 +73,7 @@ BENCHMARK(BM_Memcpy)->Unit(benchmark::kMillisecond)->MeasureProcessCPUTime()->Us
 // faults of the new block, not the copying, set this floor.
 void BM_FreshCopy(benchmark::State& state) {
   for (auto _ : state) {
-    TBitmap32 copy = Photo();
+    Bitmap32 copy = Photo();
     benchmark::DoNotOptimize(copy.Data());
   }
   SetBytes(state);
@@ -82,8 +82,8 @@ BENCHMARK(BM_FreshCopy)->Unit(benchmark::kMillisecond)->MeasureProcessCPUTime()-
 
 // Routines that work in place get a fresh copy each round, outside the timing.
 template <typename Routine>
-void InPlace(benchmark::State& state, const TBitmap32& input, Routine routine) {
-  TBitmap32 work;
+void InPlace(benchmark::State& state, const Bitmap32& input, Routine routine) {
+  Bitmap32 work;
   for (auto _ : state) {
     state.PauseTiming();
     work = input;
@@ -95,12 +95,12 @@ void InPlace(benchmark::State& state, const TBitmap32& input, Routine routine) {
 }
 
 void BM_Picsobel(benchmark::State& state) {
-  InPlace(state, Photo(), [](TBitmap32& b) { picsobel(b); });
+  InPlace(state, Photo(), [](Bitmap32& b) { InvertedSobelEdges(b); });
 }
 BENCHMARK(BM_Picsobel)->Unit(benchmark::kMillisecond)->MeasureProcessCPUTime()->UseRealTime();
 
 void BM_ConvertToGray(benchmark::State& state) {
-  InPlace(state, EdgeMap(), [](TBitmap32& b) { ConvertToGray(b); });
+  InPlace(state, EdgeMap(), [](Bitmap32& b) { ConvertToGray(b); });
 }
 BENCHMARK(BM_ConvertToGray)->Unit(benchmark::kMillisecond)->MeasureProcessCPUTime()->UseRealTime();
 
@@ -130,7 +130,7 @@ BENCHMARK(BM_LightingPass)->Unit(benchmark::kMillisecond)->MeasureProcessCPUTime
 
 void BM_PencilSketch(benchmark::State& state) {
   const auto mode = static_cast<PencilToneMode>(state.range(0));
-  for (auto _ : state) benchmark::DoNotOptimize(peccilsketch(Photo(), mode, 60, 150).Data());
+  for (auto _ : state) benchmark::DoNotOptimize(PencilSketch(Photo(), mode, 60, 150).Data());
   SetBytes(state);
 }
 BENCHMARK(BM_PencilSketch)
@@ -164,7 +164,7 @@ BENCHMARK(BM_Vuzorar)
 
 void BM_PenAndInk(benchmark::State& state) {
   const bool colorInk = state.range(0) != 0;
-  for (auto _ : state) benchmark::DoNotOptimize(Pen_and_Ink(Photo(), 128, colorInk).Data());
+  for (auto _ : state) benchmark::DoNotOptimize(PenAndInk(Photo(), 128, colorInk).Data());
   SetBytes(state);
 }
 BENCHMARK(BM_PenAndInk)
@@ -183,7 +183,7 @@ BENCHMARK(BM_PenAndInk)
   BENCHMARK(name)->Unit(benchmark::kMillisecond)->MeasureProcessCPUTime()->UseRealTime()
 
 void BM_ColorPencil(benchmark::State& state) {
-  TBitmap32 out(kWidth, kHeight);
+  Bitmap32 out(kWidth, kHeight);
   for (auto _ : state) {
     ColorSketchInto(Photo(), 45, out);
     benchmark::DoNotOptimize(out.Data());
@@ -194,7 +194,7 @@ QUILLANE_EFFECT_BENCHMARK(BM_ColorPencil);
 
 // One median pass on its own.
 void BM_MedianPass(benchmark::State& state) {
-  TBitmap32 out = Photo();
+  Bitmap32 out = Photo();
   for (auto _ : state) {
     MedianPass(Photo(), out);
     benchmark::DoNotOptimize(out.Data());
@@ -204,7 +204,7 @@ void BM_MedianPass(benchmark::State& state) {
 QUILLANE_EFFECT_BENCHMARK(BM_MedianPass);
 
 void BM_WaterColor(benchmark::State& state) {
-  TBitmap32 out(kWidth, kHeight);
+  Bitmap32 out(kWidth, kHeight);
   for (auto _ : state) {
     WaterColorInto(Photo(), 3, out);
     benchmark::DoNotOptimize(out.Data());
@@ -214,7 +214,7 @@ void BM_WaterColor(benchmark::State& state) {
 QUILLANE_EFFECT_BENCHMARK(BM_WaterColor);
 
 void BM_Realism(benchmark::State& state) {
-  TBitmap32 out(kWidth, kHeight);
+  Bitmap32 out(kWidth, kHeight);
   for (auto _ : state) {
     ConvolveInto(Photo(), {1, 2, 1, 0, 0, 0, -1, -1, -1}, 1, out);
     benchmark::DoNotOptimize(out.Data());
@@ -224,7 +224,7 @@ void BM_Realism(benchmark::State& state) {
 QUILLANE_EFFECT_BENCHMARK(BM_Realism);
 
 void BM_PopArt(benchmark::State& state) {
-  TBitmap32 out(kWidth, kHeight);
+  Bitmap32 out(kWidth, kHeight);
   for (auto _ : state) {
     KernelGradientFilterInto(Photo(), {-1, -2, -1, 0, 0, 0, 1, 2, 1}, Gradient::RightMinusLeftSobel,
                              out);
@@ -235,7 +235,7 @@ void BM_PopArt(benchmark::State& state) {
 QUILLANE_EFFECT_BENCHMARK(BM_PopArt);
 
 void BM_Abstract(benchmark::State& state) {
-  TBitmap32 out(kWidth, kHeight);
+  Bitmap32 out(kWidth, kHeight);
   for (auto _ : state) {
     KernelGradientFilterInto(Photo(), {-1, -1, -1, 0, 0, 0, -1, -1, -1}, Gradient::LeftMinusRight,
                              out);
@@ -246,7 +246,7 @@ void BM_Abstract(benchmark::State& state) {
 QUILLANE_EFFECT_BENCHMARK(BM_Abstract);
 
 void BM_Brume(benchmark::State& state) {
-  TBitmap32 out(kWidth, kHeight);
+  Bitmap32 out(kWidth, kHeight);
   std::uint32_t seed = 0;
   for (auto _ : state) {
     BrumeInto(Photo(), 3, seed, out);
@@ -265,9 +265,9 @@ QUILLANE_EFFECT_BENCHMARK(BM_Brume);
   BENCHMARK(name)->Unit(benchmark::kMillisecond)->MeasureProcessCPUTime()->UseRealTime()
 
 // What every routine that returns a new picture pays before its own work.
-QUILLANE_EFFECT_BENCH(BM_PictureCopy, TBitmap32(Photo()));
+QUILLANE_EFFECT_BENCH(BM_PictureCopy, Bitmap32(Photo()));
 QUILLANE_EFFECT_BENCH(BM_Emboss, emboss(Photo(), 100, 3));
-QUILLANE_EFFECT_BENCH(BM_ColorFilter, filter(Photo(), ColorFilterKind::Yellow));
+QUILLANE_EFFECT_BENCH(BM_ColorFilter, ColorFilter(Photo(), ColorFilterKind::Yellow));
 QUILLANE_EFFECT_BENCH(BM_ColorVariety, VarietyClicks(Photo(), {1, 5, 5}));
 QUILLANE_EFFECT_BENCH(BM_Panel2x2, ColorPanel(Photo(), PanelLayout::Panel2x2));
 QUILLANE_EFFECT_BENCH(BM_Panel3x3, ColorPanel(Photo(), PanelLayout::Panel3x3));
@@ -295,7 +295,7 @@ BENCHMARK(BM_RotatePicture)
     ->UseRealTime();
 
 void BM_ZoomInandOut(benchmark::State& state) {
-  InPlace(state, Photo(), [](TBitmap32& b) { ZoomInandOut(b, 400.0L / 521, 400.0L / 521); });
+  InPlace(state, Photo(), [](Bitmap32& b) { ResampleNearest(b, 400.0L / 521, 400.0L / 521); });
 }
 BENCHMARK(BM_ZoomInandOut)->Unit(benchmark::kMillisecond)->MeasureProcessCPUTime()->UseRealTime();
 

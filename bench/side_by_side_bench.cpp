@@ -31,8 +31,8 @@ constexpr int kHeight = bench::kPhotoHeight;
 using bench::Photo;
 
 void Memcpy(benchmark::State& state) {
-  const TBitmap32& photo = Photo();
-  TBitmap32 copy(kWidth, kHeight);
+  const Bitmap32& photo = Photo();
+  Bitmap32 copy(kWidth, kHeight);
   for (auto _ : state) {
     std::memcpy(static_cast<void*>(copy.Data()), photo.Data(), photo.PixelCount() * sizeof(Pixel));
     benchmark::ClobberMemory();
@@ -47,7 +47,7 @@ void Effect(benchmark::State& state, const EffectSpec* effect, int threads) {
   // One run outside the timing: later runs find their memory kept, as they do in the program.
   effect->routine({Photo(), Photo(), params, &seed});
   for (auto _ : state) {
-    const TBitmap32 result = effect->routine({Photo(), Photo(), params, &seed});
+    const Bitmap32 result = effect->routine({Photo(), Photo(), params, &seed});
     benchmark::DoNotOptimize(result.Data());
   }
   SetRowSplit({});
@@ -68,7 +68,7 @@ const std::map<std::string, std::string>& Comparable() {
 
 #ifdef QUILLANE_HAVE_OPENCV
 cv::Mat PhotoMat() {
-  const TBitmap32& p = Photo();
+  const Bitmap32& p = Photo();
   return cv::Mat(kHeight, kWidth, CV_8UC4, const_cast<Pixel*>(p.Data()));
 }
 

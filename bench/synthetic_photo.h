@@ -21,9 +21,9 @@ inline std::uint32_t Hash(std::uint32_t x) {
   return x;
 }
 
-inline TBitmap32 SyntheticPhoto(int width, int height) {
-  const TBitmap32 small = StartupPicture();
-  TBitmap32 big(width, height);
+inline Bitmap32 SyntheticPhoto(int width, int height) {
+  const Bitmap32 small = StartupPicture();
+  Bitmap32 big(width, height);
   const int sw = small.Width(), sh = small.Height();
   for (int y = 0; y < height; ++y) {
     const double fy = (y + 0.5) * sh / height - 0.5;
@@ -55,8 +55,8 @@ inline TBitmap32 SyntheticPhoto(int width, int height) {
 // The 12-megapixel photo the benchmarks share, made once per program.
 constexpr int kPhotoWidth = 4000;
 constexpr int kPhotoHeight = 3000;
-inline const TBitmap32& Photo() {
-  static const TBitmap32 photo = SyntheticPhoto(kPhotoWidth, kPhotoHeight);
+inline const Bitmap32& Photo() {
+  static const Bitmap32 photo = SyntheticPhoto(kPhotoWidth, kPhotoHeight);
   return photo;
 }
 

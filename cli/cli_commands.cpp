@@ -63,10 +63,10 @@ std::string ExtensionForContent(const std::string& bytes) {
 
 // The picture named by --input or INPUT ("-": standard input), or the built-in one when none is
 // named; nothing (with the reason told on err) when it cannot be read.
-std::optional<TBitmap32> InputOrBuiltInPicture(const Options& o, std::ostream& err) {
+std::optional<Bitmap32> InputOrBuiltInPicture(const Options& o, std::ostream& err) {
   if (o.input.empty()) return StartupPicture();
   std::string error;
-  std::optional<TBitmap32> loaded;
+  std::optional<Bitmap32> loaded;
   if (o.input == "-") {
     const std::string bytes{std::istreambuf_iterator<char>(std::cin),
                             std::istreambuf_iterator<char>()};
@@ -82,7 +82,7 @@ std::optional<TBitmap32> InputOrBuiltInPicture(const Options& o, std::ostream& e
 }
 
 // Writes picture to o.output, or as o.format to out when the output is "-".
-void WriteOutput(const TBitmap32& picture, const Options& o, std::ostream& out) {
+void WriteOutput(const Bitmap32& picture, const Options& o, std::ostream& out) {
   if (o.output != "-") {
     SaveOutputPicture(picture, o.output);
     return;
@@ -96,7 +96,7 @@ void WriteOutput(const TBitmap32& picture, const Options& o, std::ostream& out) 
 }
 
 // WriteOutput, with a failure written to err as the reason the command failed.
-bool WriteOutputOrSay(const TBitmap32& picture, const Options& o, std::ostream& out,
+bool WriteOutputOrSay(const Bitmap32& picture, const Options& o, std::ostream& out,
                       std::ostream& err) {
   try {
     WriteOutput(picture, o, out);
@@ -110,7 +110,7 @@ bool WriteOutputOrSay(const TBitmap32& picture, const Options& o, std::ostream& 
 }
 
 int ApplyCommand(const Options& o, std::ostream& out, std::ostream& err) {
-  std::optional<TBitmap32> picture = InputOrBuiltInPicture(o, err);
+  std::optional<Bitmap32> picture = InputOrBuiltInPicture(o, err);
   if (!picture) return kExitFailed;
   const std::string name = o.input.empty() ? "the built-in picture" : o.input;
   const int width = picture->Width(), height = picture->Height();
@@ -139,7 +139,7 @@ int ApplyCommand(const Options& o, std::ostream& out, std::ostream& err) {
 // rotate, resize and convert: the picture opened as the program opens it (alpha 255), turned or
 // resampled as the program does it, and written in the type the output names.
 int PictureCommand(const Options& o, std::ostream& out, std::ostream& err) {
-  std::optional<TBitmap32> picture = InputOrBuiltInPicture(o, err);
+  std::optional<Bitmap32> picture = InputOrBuiltInPicture(o, err);
   if (!picture) return kExitFailed;
   const std::string name = o.input == "-" ? std::string("standard input") : o.input;
   const int width = picture->Width(), height = picture->Height();
@@ -164,7 +164,7 @@ int PictureCommand(const Options& o, std::ostream& out, std::ostream& err) {
       }
       if (result == ResizeResult::TooLarge) {
         err << "quillane-cli: resize: " << o.width << " by " << o.height
-            << " pixels is larger than the " << TBitmap32::kMaxPixels
+            << " pixels is larger than the " << Bitmap32::kMaxPixels
             << " pixels a picture may have\n";
         return kExitUsage;
       }
@@ -313,7 +313,7 @@ std::string GalleryHtml(const std::string& sourceName, const GalleryEntry& origi
 }
 
 int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
-  std::optional<TBitmap32> picture = InputOrBuiltInPicture(o, err);
+  std::optional<Bitmap32> picture = InputOrBuiltInPicture(o, err);
   if (!picture) return kExitFailed;
   const std::string sourceName =
       o.input.empty() ? "the built-in picture" : fs::path(o.input).filename().string();
@@ -328,7 +328,7 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
   const fs::path folder(o.output);
   PictureDocument document(std::move(*picture));
   int status = kExitOk;
-  auto write = [&](const TBitmap32& p, const std::string& file) {
+  auto write = [&](const Bitmap32& p, const std::string& file) {
     try {
       SavePng(p, (folder / file).string());
       return true;
@@ -389,10 +389,10 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
 
 }  // namespace
 
-std::optional<TBitmap32> LoadInputPicture(const std::string& path, std::string& error,
-                                          std::ostream& notices) {
+std::optional<Bitmap32> LoadInputPicture(const std::string& path, std::string& error,
+                                         std::ostream& notices) {
   try {
-    std::optional<TBitmap32> picture =
+    std::optional<Bitmap32> picture =
         AsciiLower(fs::path(path).extension().string()) == ".png"
             ? LoadPng(path)
             : LoadPictureFile(path, [&](const std::string& caption, const std::string& text) {
@@ -413,7 +413,7 @@ std::optional<TBitmap32> LoadInputPicture(const std::string& path, std::string& 
   }
 }
 
-void SaveOutputPicture(const TBitmap32& picture, const std::string& path) {
+void SaveOutputPicture(const Bitmap32& picture, const std::string& path) {
   switch (OutputTypeFor(path)) {
     case OutputType::Jpeg:
       SaveJpeg(picture, path, 90);

@@ -17,11 +17,11 @@ int RunCommand(const Options& options, std::ostream& out, std::ostream& err, boo
 
 // Reads an input picture: whatever LoadPictureFile reads, plus PNG. On failure returns nothing
 // and sets error to a sentence naming the file.
-std::optional<TBitmap32> LoadInputPicture(const std::string& path, std::string& error,
-                                          std::ostream& notices);
+std::optional<Bitmap32> LoadInputPicture(const std::string& path, std::string& error,
+                                         std::ostream& notices);
 
 // Writes picture in the type its extension names (OutputTypeFor). Throws PictureFileError.
-void SaveOutputPicture(const TBitmap32& picture, const std::string& path);
+void SaveOutputPicture(const Bitmap32& picture, const std::string& path);
 
 // The text of "list".
 std::string EffectListText();

@@ -40,7 +40,7 @@ class MemorySink : public ByteSink {
 
 // JPEG through libjpeg-turbo: baseline, progressive, grayscale, RGB, CMYK and YCCK (Adobe
 // files store inverted inks; both forms give the right colours). Alpha is 255.
-TBitmap32 DecodeJpeg(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels);
+Bitmap32 DecodeJpeg(Bytes data, std::int64_t maxPixels = Bitmap32::kMaxPixels);
 
 // The formats read through Qt's image readers, each with its own reader only (the content is
 // not sniffed, so a PNG named .bmp is refused as a bad bitmap).
@@ -52,24 +52,24 @@ enum class QtFormat {
 // For icons and GIFs, transparent and partly transparent pixels are composited over white (the
 // background a freshly made bitmap shows); the alpha bytes are returned as the decoder gives
 // them. Bitmaps keep their stored colours and alpha.
-TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels = TBitmap32::kMaxPixels);
+Bitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels = Bitmap32::kMaxPixels);
 
 // Metafiles are told apart by their content: an enhanced metafile starts with an EMR_HEADER
 // record carrying the " EMF" signature; anything else must be a Windows metafile (placeable
 // or not). The picture is played onto a white background; alpha is 255. Windows metafiles, and
 // enhanced metafiles with more than bitmaps in them, are drawn in a separate, limited process
 // (codecs/metafile_render.h); a file that keeps it drawing too long is refused.
-TBitmap32 DecodeMetafile(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels);
+Bitmap32 DecodeMetafile(Bytes data, std::int64_t maxPixels = Bitmap32::kMaxPixels);
 bool LooksLikeEnhancedMetafile(Bytes data);
-TBitmap32 DecodeEnhancedMetafile(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels);
-TBitmap32 DecodeWindowsMetafile(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels);
+Bitmap32 DecodeEnhancedMetafile(Bytes data, std::int64_t maxPixels = Bitmap32::kMaxPixels);
+Bitmap32 DecodeWindowsMetafile(Bytes data, std::int64_t maxPixels = Bitmap32::kMaxPixels);
 
 // Encoders. quality is clamped to 1..100.
-std::vector<std::uint8_t> EncodeJpeg(const TBitmap32& picture, int quality);
-void EncodeBitmap24(const TBitmap32& picture, ByteSink& sink);
-void EncodeBitmap32(const TBitmap32& picture, ByteSink& sink);
-void EncodeEnhancedMetafile(const TBitmap32& picture, ByteSink& sink);
-std::vector<std::uint8_t> EncodePng(const TBitmap32& picture);
+std::vector<std::uint8_t> EncodeJpeg(const Bitmap32& picture, int quality);
+void EncodeBitmap24(const Bitmap32& picture, ByteSink& sink);
+void EncodeBitmap32(const Bitmap32& picture, ByteSink& sink);
+void EncodeEnhancedMetafile(const Bitmap32& picture, ByteSink& sink);
+std::vector<std::uint8_t> EncodePng(const Bitmap32& picture);
 
 // Little-endian writers for building headers in a byte buffer.
 inline void Put16(std::uint8_t*& at, std::uint16_t v) {
@@ -83,8 +83,8 @@ inline void Put32(std::uint8_t*& at, std::uint32_t v) {
 // A device-independent bitmap of 24 bits per pixel, bottom-up, as both the bitmap file and the
 // metafile carry it: a 40-byte info header, then the rows in B, G, R order padded to four bytes.
 inline constexpr std::size_t kDibInfoHeaderSize = 40;
-std::uint64_t Dib24BitsSize(const TBitmap32& picture);
-void WriteDib24(const TBitmap32& picture, ByteSink& sink);
+std::uint64_t Dib24BitsSize(const Bitmap32& picture);
+void WriteDib24(const Bitmap32& picture, ByteSink& sink);
 
 // The pixel size a Windows playing device at 96 dots per inch gives an enhanced metafile.
 inline constexpr int kMetafileDotsPerInch = 96;
@@ -103,7 +103,7 @@ void CheckPictureSize(std::int64_t width, std::int64_t height, std::int64_t maxP
 
 // PNG through libpng's simplified reader, alpha kept as stored (not premultiplied). libpng's
 // complaints become the error message; none goes to the terminal.
-TBitmap32 DecodePng(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels);
+Bitmap32 DecodePng(Bytes data, std::int64_t maxPixels = Bitmap32::kMaxPixels);
 
 // The family a file's first bytes belong to ("JPEG", "PNG", "GIF", "bitmap", "icon",
 // "metafile"), or "" when none is recognised.

@@ -109,8 +109,8 @@ struct DcState {
 
 // The bitmap of a record, decoded through the bitmap reader by putting a file header in
 // front of the record's BITMAPINFO and bits.
-TBitmap32 DecodeRecordBitmap(Bytes record, std::uint32_t offBmi, std::uint32_t cbBmi,
-                             std::uint32_t offBits, std::uint32_t cbBits, std::int64_t maxPixels) {
+Bitmap32 DecodeRecordBitmap(Bytes record, std::uint32_t offBmi, std::uint32_t cbBmi,
+                            std::uint32_t offBits, std::uint32_t cbBits, std::int64_t maxPixels) {
   const std::uint64_t size = record.size();
   if (cbBmi < 12 || offBmi > size || cbBmi > size - offBmi || offBits > size ||
       cbBits > size - offBits) {
@@ -159,8 +159,8 @@ class Player {
     return vector;
   }
 
-  TBitmap32 Play() {
-    canvas_ = TBitmap32(width_, height_, Pixel{255, 255, 255, 255});
+  Bitmap32 Play() {
+    canvas_ = Bitmap32(width_, height_, Pixel{255, 255, 255, 255});
     std::size_t at = headerSize_;
     while (at < data_.size()) {
       if (data_.size() - at < 8) throw PictureFileError("The metafile ends inside a record");
@@ -177,7 +177,7 @@ class Player {
     return std::move(canvas_);
   }
 
-  TBitmap32 Render() const;
+  Bitmap32 Render() const;
 
  private:
   // The records played here, and those that only set state the bitmaps do not depend on.
@@ -392,7 +392,7 @@ class Player {
                   std::int32_t dh, std::int32_t sx, std::int32_t sy, std::int32_t sw,
                   std::int32_t sh, bool rowsFromBottom) {
     if (dw == 0 || dh == 0 || sw == 0 || sh == 0) return;
-    const TBitmap32 bitmap = DecodeRecordBitmap(r, offBmi, cbBmi, offBits, cbBits, maxPixels_);
+    const Bitmap32 bitmap = DecodeRecordBitmap(r, offBmi, cbBmi, offBits, cbBits, maxPixels_);
     // Source y counts from the bottom row of a bottom-up bitmap.
     const std::int32_t infoHeight = cbBmi >= 40 ? I32(r, offBmi + 8) : 1;
     std::int64_t srcX = sx, srcY = sy, srcW = sw, srcH = sh;
@@ -458,14 +458,14 @@ class Player {
   std::int64_t maxPixels_;
   std::size_t headerSize_ = 0;
   int width_ = 0, height_ = 0;
-  TBitmap32 canvas_;
+  Bitmap32 canvas_;
   Transform deviceToCanvas_;
   DcState dc_;
   std::vector<DcState> saved_;
   std::int64_t paintBudget_ = 0;
 };
 
-TBitmap32 Player::Render() const {
+Bitmap32 Player::Render() const {
   if (data_.size() > 0x7FFFFFFF) throw PictureFileError("The metafile is too large");
   if (!deviceToCanvas_.Finite()) throw PictureFileError("The metafile cannot be drawn");
   const std::string renderer = FindRenderer("QUILLANE_EMF_RENDER", metafile_render::kEmfProgramName,
@@ -499,7 +499,7 @@ bool LooksLikeEnhancedMetafile(Bytes data) {
   return data.size() >= 88 && U32(data, 0) == kEmrHeader && U32(data, 40) == kEmfSignature;
 }
 
-TBitmap32 DecodeEnhancedMetafile(Bytes data, std::int64_t maxPixels) {
+Bitmap32 DecodeEnhancedMetafile(Bytes data, std::int64_t maxPixels) {
   Player player(data, maxPixels);
   return player.HasVectorDrawing() ? player.Render() : player.Play();
 }
@@ -507,7 +507,7 @@ TBitmap32 DecodeEnhancedMetafile(Bytes data, std::int64_t maxPixels) {
 // A header, one StretchDIBits record holding the picture as a bottom-up 24-bit DIB drawn at
 // (0, 0) with its own size, and the closing record. The reference device is a 96 dpi screen
 // (4800 by 2400 pixels on 1270 by 635 mm), so the frame reads back as the picture's size.
-void EncodeEnhancedMetafile(const TBitmap32& picture, ByteSink& sink) {
+void EncodeEnhancedMetafile(const Bitmap32& picture, ByteSink& sink) {
   if (picture.Empty()) throw PictureFileError("There is no picture to save");
   const std::uint32_t w = static_cast<std::uint32_t>(picture.Width());
   const std::uint32_t h = static_cast<std::uint32_t>(picture.Height());

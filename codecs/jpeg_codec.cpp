@@ -112,7 +112,7 @@ struct Decompressor {
 };
 
 // Everything libjpeg touches happens here; returns false with err.message set on failure.
-bool RunDecoder(Decompressor& d, Bytes data, std::int64_t maxPixels, TBitmap32& result,
+bool RunDecoder(Decompressor& d, Bytes data, std::int64_t maxPixels, Bitmap32& result,
                 std::vector<JSAMPLE>& inkRows, std::string& sizeProblem) {
   if (setjmp(d.err.jump)) return false;
   jpeg_create_decompress(&d.cinfo);
@@ -238,7 +238,7 @@ struct Compressor {
   }
 };
 
-bool RunEncoder(Compressor& c, const TBitmap32& picture, int quality,
+bool RunEncoder(Compressor& c, const Bitmap32& picture, int quality,
                 std::vector<std::uint8_t>& out) {
   if (setjmp(c.err.jump)) return false;
   jpeg_create_compress(&c.cinfo);
@@ -272,12 +272,12 @@ bool RunEncoder(Compressor& c, const TBitmap32& picture, int quality,
 
 }  // namespace
 
-TBitmap32 DecodeJpeg(Bytes data, std::int64_t maxPixels) {
+Bitmap32 DecodeJpeg(Bytes data, std::int64_t maxPixels) {
   if (data.empty()) throw PictureFileError("The JPEG file is empty");
   Decompressor d;
   InstallErrorManager(d.err);
   d.cinfo.err = &d.err.pub;
-  TBitmap32 result;
+  Bitmap32 result;
   std::vector<JSAMPLE> inkRows;
   std::string sizeProblem;
   if (!RunDecoder(d, data, maxPixels, result, inkRows, sizeProblem)) {
@@ -287,7 +287,7 @@ TBitmap32 DecodeJpeg(Bytes data, std::int64_t maxPixels) {
   return result;
 }
 
-std::vector<std::uint8_t> EncodeJpeg(const TBitmap32& picture, int quality) {
+std::vector<std::uint8_t> EncodeJpeg(const Bitmap32& picture, int quality) {
   if (picture.Empty()) throw PictureFileError("There is no picture to save");
   if (picture.Width() > JPEG_MAX_DIMENSION || picture.Height() > JPEG_MAX_DIMENSION) {
     throw PictureFileError("The picture is too large for a JPEG file (at most " +

@@ -87,12 +87,12 @@ std::string SniffFamily(Bytes data) {
   return "";
 }
 
-std::uint64_t Dib24BitsSize(const TBitmap32& picture) {
+std::uint64_t Dib24BitsSize(const Bitmap32& picture) {
   const std::uint64_t stride = (static_cast<std::uint64_t>(picture.Width()) * 3 + 3) / 4 * 4;
   return stride * static_cast<std::uint64_t>(picture.Height());
 }
 
-void WriteDib24(const TBitmap32& picture, ByteSink& sink) {
+void WriteDib24(const Bitmap32& picture, ByteSink& sink) {
   const auto w = static_cast<std::uint32_t>(picture.Width());
   const auto h = static_cast<std::uint32_t>(picture.Height());
   std::uint8_t header[kDibInfoHeaderSize] = {};
@@ -124,7 +124,7 @@ void WriteDib24(const TBitmap32& picture, ByteSink& sink) {
 }
 
 // A bitmap file: the 14-byte file header, then the 24-bit DIB.
-void EncodeBitmap24(const TBitmap32& picture, ByteSink& sink) {
+void EncodeBitmap24(const Bitmap32& picture, ByteSink& sink) {
   if (picture.Empty()) throw PictureFileError("There is no picture to save");
   constexpr std::uint32_t kFileHeaderSize = 14;
   const std::uint64_t fileSize = kFileHeaderSize + kDibInfoHeaderSize + Dib24BitsSize(picture);
@@ -143,7 +143,7 @@ void EncodeBitmap24(const TBitmap32& picture, ByteSink& sink) {
 
 // The same file with 32 bits per pixel: rows are the picture's own B, G, R, A bytes, never
 // padded, still bottom-up and uncompressed (BI_RGB), as the desktop's wallpaper readers expect.
-void EncodeBitmap32(const TBitmap32& picture, ByteSink& sink) {
+void EncodeBitmap32(const Bitmap32& picture, ByteSink& sink) {
   if (picture.Empty()) throw PictureFileError("There is no picture to save");
   constexpr std::uint32_t kFileHeaderSize = 14;
   const std::uint64_t bitsSize = static_cast<std::uint64_t>(picture.Width()) * 4 *
@@ -186,7 +186,7 @@ bool Exists(const std::string& path) {
 // Every failure names the file, and one whose content is another known family says so: a JPEG
 // under a .gif name is otherwise only "not a valid GIF picture".
 template <typename Decoder>
-std::optional<TBitmap32> Decode(const std::string& path, const char* family, Decoder decode) {
+std::optional<Bitmap32> Decode(const std::string& path, const char* family, Decoder decode) {
   if (!Exists(path)) return std::nullopt;
   std::vector<std::uint8_t> bytes;
   try {
@@ -207,7 +207,7 @@ std::optional<TBitmap32> Decode(const std::string& path, const char* family, Dec
 }
 
 template <typename Encoder>
-void SaveAtomically(const TBitmap32& picture, const std::string& path, Encoder encode) {
+void SaveAtomically(const Bitmap32& picture, const std::string& path, Encoder encode) {
   const std::string prefix = "Cannot save \"" + path + "\": ";
   if (picture.Empty()) throw PictureFileError(prefix + "there is no picture to save");
   try {
@@ -223,7 +223,7 @@ void SaveAtomically(const TBitmap32& picture, const std::string& path, Encoder e
 
 }  // namespace
 
-std::optional<TBitmap32> LoadPictureFile(const std::string& path, const LoaderNotice& notice) {
+std::optional<Bitmap32> LoadPictureFile(const std::string& path, const LoaderNotice& notice) {
   const std::string key = AsciiLower(path.size() > 4 ? path.substr(path.size() - 4) : path);
   using codecs::Bytes;
   using codecs::QtFormat;
@@ -235,7 +235,7 @@ std::optional<TBitmap32> LoadPictureFile(const std::string& path, const LoaderNo
       return Decode(path, "icon", [](Bytes b) { return DecodeWithQt(b, QtFormat::kIcon); });
     } catch (const std::exception& error) {
       if (notice) notice("Exit", "Input picture" + path + "Error." + error.what());
-      return TBitmap32();
+      return Bitmap32();
     }
   }
   if (key == ".jpg" || key == "jpeg") {
@@ -248,36 +248,36 @@ std::optional<TBitmap32> LoadPictureFile(const std::string& path, const LoaderNo
     return Decode(path, "metafile", [](Bytes b) { return codecs::DecodeMetafile(b); });
   }
   if (!Exists(path)) return std::nullopt;
-  return TBitmap32();
+  return Bitmap32();
 }
 
-std::optional<TBitmap32> LoadPng(const std::string& path) {
+std::optional<Bitmap32> LoadPng(const std::string& path) {
   return Decode(path, "PNG", [](codecs::Bytes b) { return codecs::DecodePng(b); });
 }
 
-void SaveJpeg(const TBitmap32& picture, const std::string& path, int quality) {
+void SaveJpeg(const Bitmap32& picture, const std::string& path, int quality) {
   SaveAtomically(picture, path, [&](codecs::ByteSink& sink) {
     const std::vector<std::uint8_t> bytes = codecs::EncodeJpeg(picture, quality);
     sink.Write(bytes.data(), bytes.size());
   });
 }
 
-void SaveBitmap24(const TBitmap32& picture, const std::string& path) {
+void SaveBitmap24(const Bitmap32& picture, const std::string& path) {
   SaveAtomically(picture, path,
                  [&](codecs::ByteSink& sink) { codecs::EncodeBitmap24(picture, sink); });
 }
 
-void SaveBitmap32(const TBitmap32& picture, const std::string& path) {
+void SaveBitmap32(const Bitmap32& picture, const std::string& path) {
   SaveAtomically(picture, path,
                  [&](codecs::ByteSink& sink) { codecs::EncodeBitmap32(picture, sink); });
 }
 
-void SaveMetafile(const TBitmap32& picture, const std::string& path) {
+void SaveMetafile(const Bitmap32& picture, const std::string& path) {
   SaveAtomically(picture, path,
                  [&](codecs::ByteSink& sink) { codecs::EncodeEnhancedMetafile(picture, sink); });
 }
 
-void SavePng(const TBitmap32& picture, const std::string& path) {
+void SavePng(const Bitmap32& picture, const std::string& path) {
   SaveAtomically(picture, path, [&](codecs::ByteSink& sink) {
     const std::vector<std::uint8_t> bytes = codecs::EncodePng(picture);
     sink.Write(bytes.data(), bytes.size());

@@ -29,24 +29,24 @@ using LoaderNotice = std::function<void(const std::string& caption, const std::s
 // - PictureFileError "<path> is not a picture file" for a folder, FIFO, device or socket;
 // - otherwise the decoded 32-bit picture. Its alpha bytes are whatever the decoder gives;
 //   callers set them to 255.
-// A corrupt file, a picture larger than TBitmap32::kMaxPixels or one that would not fit in the
+// A corrupt file, a picture larger than Bitmap32::kMaxPixels or one that would not fit in the
 // memory available (the message says how much it needs) throws PictureFileError; an
 // icon that cannot be read is reported through notice (caption "Exit") and gives an empty
 // bitmap.
-std::optional<TBitmap32> LoadPictureFile(const std::string& path,
-                                         const LoaderNotice& notice = nullptr);
+std::optional<Bitmap32> LoadPictureFile(const std::string& path,
+                                        const LoaderNotice& notice = nullptr);
 
 // A PNG file (not one of the program's own input types; the command line reads it), alpha kept
 // as stored. Throws PictureFileError as LoadPictureFile does; std::nullopt when no file exists.
-std::optional<TBitmap32> LoadPng(const std::string& path);
+std::optional<Bitmap32> LoadPng(const std::string& path);
 
 // Writers. Each writes beside the target and renames over it only when complete, so a failed
 // write leaves any existing file as it was. They throw PictureFileError.
-void SaveJpeg(const TBitmap32& picture, const std::string& path, int quality = 90);
-void SaveBitmap24(const TBitmap32& picture, const std::string& path);
-void SaveBitmap32(const TBitmap32& picture, const std::string& path);  // B, G, R, A as held
-void SaveMetafile(const TBitmap32& picture, const std::string& path);
-void SavePng(const TBitmap32& picture, const std::string& path);  // keeps the alpha byte
+void SaveJpeg(const Bitmap32& picture, const std::string& path, int quality = 90);
+void SaveBitmap24(const Bitmap32& picture, const std::string& path);
+void SaveBitmap32(const Bitmap32& picture, const std::string& path);  // B, G, R, A as held
+void SaveMetafile(const Bitmap32& picture, const std::string& path);
+void SavePng(const Bitmap32& picture, const std::string& path);  // keeps the alpha byte
 
 // If the name's last ".", "\" or "/" or ":" is a ".", everything from that dot on is replaced
 // by extension (given with its dot); otherwise extension is appended.

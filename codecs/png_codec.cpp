@@ -8,7 +8,7 @@
 
 namespace quillane::codecs {
 
-TBitmap32 DecodePng(Bytes data, std::int64_t maxPixels) {
+Bitmap32 DecodePng(Bytes data, std::int64_t maxPixels) {
   if (data.empty()) throw PictureFileError("The PNG file is empty");
   png_image image{};
   image.version = PNG_IMAGE_VERSION;
@@ -19,7 +19,7 @@ TBitmap32 DecodePng(Bytes data, std::int64_t maxPixels) {
   }
   CheckPictureSize(image.width, image.height, maxPixels, "PNG");
   image.format = PNG_FORMAT_BGRA;
-  TBitmap32 result(static_cast<int>(image.width), static_cast<int>(image.height));
+  Bitmap32 result(static_cast<int>(image.width), static_cast<int>(image.height));
   if (!png_image_finish_read(&image, nullptr, result.Data(), 0, nullptr)) {
     throw PictureFileError(std::string("Cannot read the PNG picture: ") + image.message);
   }

@@ -105,7 +105,7 @@ std::uint8_t OverWhite(unsigned channel, unsigned alpha) {
   return static_cast<std::uint8_t>((channel * alpha + 255 * (255 - alpha) + 127) / 255);
 }
 
-void CompositeOverWhite(TBitmap32& bitmap) {
+void CompositeOverWhite(Bitmap32& bitmap) {
   for (int y = 0; y < bitmap.Height(); ++y) {
     Pixel* row = bitmap.ScanLine(y);
     for (int x = 0; x < bitmap.Width(); ++x) {
@@ -206,7 +206,7 @@ std::vector<std::uint8_t> GifWithFittedScreen(Bytes data, std::int64_t maxPixels
 
 }  // namespace
 
-TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
+Bitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
   const char* family = FamilyName(format);
   if (data.empty()) throw PictureFileError(std::string("The ") + family + " file is empty");
   if (data.size() > static_cast<std::size_t>(std::numeric_limits<int>::max())) {
@@ -255,7 +255,7 @@ TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
     image.convertTo(QImage::Format_ARGB32);
     if (image.isNull()) throw PictureFileError("Out of memory");
   }
-  TBitmap32 result(image.width(), image.height());
+  Bitmap32 result(image.width(), image.height());
   const std::size_t rowBytes = static_cast<std::size_t>(image.width()) * sizeof(Pixel);
   for (int y = 0; y < image.height(); ++y) {
     std::memcpy(result.ScanLine(y), image.constScanLine(y), rowBytes);
@@ -264,7 +264,7 @@ TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
   return result;
 }
 
-std::vector<std::uint8_t> EncodePng(const TBitmap32& picture) {
+std::vector<std::uint8_t> EncodePng(const Bitmap32& picture) {
   if (picture.Empty()) throw PictureFileError("There is no picture to save");
   const QImage image(reinterpret_cast<const uchar*>(picture.Data()), picture.Width(),
                      picture.Height(), static_cast<qsizetype>(picture.Width()) * 4,

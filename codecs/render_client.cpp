@@ -56,9 +56,9 @@ class RenderReply : public HelperOutput {
     answer_.width = words[1];
     answer_.height = words[2];
     if (answer_.reply != Reply::kPicture) return;
-    // At most TBitmap32::kMaxPixels, so each side fits an int.
+    // At most Bitmap32::kMaxPixels, so each side fits an int.
     CheckPictureSize(answer_.width, answer_.height, maxPixels_, "metafile");
-    answer_.picture = TBitmap32(static_cast<int>(answer_.width), static_cast<int>(answer_.height));
+    answer_.picture = Bitmap32(static_cast<int>(answer_.width), static_cast<int>(answer_.height));
   }
 
   std::int64_t maxPixels_;

@@ -20,7 +20,7 @@ std::string FindRenderer(const char* environmentVariable, const char* programNam
 struct RendererAnswer {
   metafile_render::Reply reply{};
   std::uint32_t width = 0, height = 0;
-  TBitmap32 picture;  // for kPicture
+  Bitmap32 picture;  // for kPicture
 };
 
 // Runs the renderer with the file on its standard input and returns its complete reply; a

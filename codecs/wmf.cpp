@@ -61,7 +61,7 @@ class BitmapOnlyMetafile {
  public:
   BitmapOnlyMetafile(Bytes data, std::size_t header) : data_(data), header_(header) {}
 
-  TBitmap32 Draw(std::int64_t maxPixels) {
+  Bitmap32 Draw(std::int64_t maxPixels) {
     if (!Walk()) return {};
     // The DIB: its info header, then the colour table, then the bits.
     const Bytes dib = data_.subspan(dibAt_, dibSize_);
@@ -79,7 +79,7 @@ class BitmapOnlyMetafile {
     Put32(at, 0);
     Put32(at, static_cast<std::uint32_t>(14 + bitsAt));
     file.insert(file.end(), dib.begin(), dib.end());
-    const TBitmap32 bitmap = DecodeWithQt(file, QtFormat::kBitmap, maxPixels);
+    const Bitmap32 bitmap = DecodeWithQt(file, QtFormat::kBitmap, maxPixels);
     if (src_[0] != 0 || src_[1] != 0 || src_[2] != bitmap.Width() || src_[3] != bitmap.Height() ||
         dest_[2] <= 0 || dest_[3] <= 0)
       return {};
@@ -109,7 +109,7 @@ class BitmapOnlyMetafile {
     const std::int64_t left = toX(dest_[0]), top = toY(dest_[1]);
     const std::int64_t right = toX(dest_[0] + dest_[2]), bottom = toY(dest_[1] + dest_[3]);
     if (right <= left || bottom <= top) return {};
-    TBitmap32 picture(static_cast<int>(width), static_cast<int>(height), Pixel{255, 255, 255, 255});
+    Bitmap32 picture(static_cast<int>(width), static_cast<int>(height), Pixel{255, 255, 255, 255});
     for (std::int64_t y = std::max<std::int64_t>(top, 0);
          y < std::min<std::int64_t>(bottom, picture.Height()); ++y) {
       const Pixel* from =
@@ -213,7 +213,7 @@ class BitmapOnlyMetafile {
 
 }  // namespace
 
-TBitmap32 DecodeWindowsMetafile(Bytes data, std::int64_t maxPixels) {
+Bitmap32 DecodeWindowsMetafile(Bytes data, std::int64_t maxPixels) {
   std::size_t header = 0;
   if (data.size() >= 4 && ReadDword(data, 0) == kPlaceableKey) header = kPlaceableSize;
   if (!StandardHeaderAt(data, header)) {
@@ -224,7 +224,7 @@ TBitmap32 DecodeWindowsMetafile(Bytes data, std::int64_t maxPixels) {
   // value there would have it allocate gigabytes (or too little). The true value is known
   // from the walk, so the player gets a copy of the file carrying it.
   const std::uint32_t largest = CheckRecords(data, header);
-  if (TBitmap32 picture = BitmapOnlyMetafile(data, header).Draw(maxPixels); !picture.Empty()) {
+  if (Bitmap32 picture = BitmapOnlyMetafile(data, header).Draw(maxPixels); !picture.Empty()) {
     return picture;
   }
   std::vector<std::uint8_t> file(data.begin(), data.end());
@@ -239,7 +239,7 @@ TBitmap32 DecodeWindowsMetafile(Bytes data, std::int64_t maxPixels) {
   if (renderer.empty()) throw PictureFileError("The metafile reader is not installed");
   // The renderer never makes a picture larger than the program could hold.
   const std::int64_t rendererMaxPixels =
-      std::clamp<std::int64_t>(maxPixels, 0, TBitmap32::kMaxPixels);
+      std::clamp<std::int64_t>(maxPixels, 0, Bitmap32::kMaxPixels);
   RendererAnswer answer =
       RunRenderer(renderer, {std::to_string(rendererMaxPixels), std::to_string(file.size())}, file,
                   rendererMaxPixels);
@@ -266,7 +266,7 @@ TBitmap32 DecodeWindowsMetafile(Bytes data, std::int64_t maxPixels) {
   throw PictureFileError("The metafile cannot be drawn");
 }
 
-TBitmap32 DecodeMetafile(Bytes data, std::int64_t maxPixels) {
+Bitmap32 DecodeMetafile(Bytes data, std::int64_t maxPixels) {
   if (data.empty()) throw PictureFileError("The metafile is empty");
   if (LooksLikeEnhancedMetafile(data)) return DecodeEnhancedMetafile(data, maxPixels);
   return DecodeWindowsMetafile(data, maxPixels);

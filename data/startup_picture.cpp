@@ -28,7 +28,7 @@ std::uint16_t U16(std::span<const std::uint8_t> b, std::size_t at) {
 
 }  // namespace
 
-TBitmap32 DecodeBitmap24(std::span<const std::uint8_t> bytes) {
+Bitmap32 DecodeBitmap24(std::span<const std::uint8_t> bytes) {
   constexpr std::size_t kFileHeader = 14;
   constexpr std::size_t kInfoHeader = 40;
   if (bytes.size() < kFileHeader + kInfoHeader || bytes[0] != 'B' || bytes[1] != 'M')
@@ -44,7 +44,7 @@ TBitmap32 DecodeBitmap24(std::span<const std::uint8_t> bytes) {
     Fail("bad size");
   const bool topDown = rawHeight < 0;
   const std::int32_t height = topDown ? -rawHeight : rawHeight;
-  if (static_cast<std::int64_t>(width) * height > TBitmap32::kMaxPixels) Fail("too large");
+  if (static_cast<std::int64_t>(width) * height > Bitmap32::kMaxPixels) Fail("too large");
 
   const std::uint64_t stride = (static_cast<std::uint64_t>(width) * 3 + 3) & ~std::uint64_t{3};
   const std::uint64_t needed = static_cast<std::uint64_t>(dataOffset) +
@@ -52,7 +52,7 @@ TBitmap32 DecodeBitmap24(std::span<const std::uint8_t> bytes) {
                                static_cast<std::uint64_t>(width) * 3;
   if (dataOffset < kFileHeader + infoSize || needed > bytes.size()) Fail("truncated");
 
-  TBitmap32 picture(width, height);
+  Bitmap32 picture(width, height);
   for (std::int32_t y = 0; y < height; ++y) {
     const std::int32_t fileRow = topDown ? y : height - 1 - y;
     const std::uint8_t* src =
@@ -63,7 +63,7 @@ TBitmap32 DecodeBitmap24(std::span<const std::uint8_t> bytes) {
   return picture;
 }
 
-TBitmap32 StartupPicture() {
+Bitmap32 StartupPicture() {
   return DecodeBitmap24(
       std::span<const std::uint8_t>(embedded::startup_bmp, embedded::startup_bmp_size));
 }

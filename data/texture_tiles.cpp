@@ -44,7 +44,7 @@ std::uint32_t U32(std::span<const std::uint8_t> b, std::size_t at) {
 
 }  // namespace
 
-TBitmap32 DecodeBitmap(std::span<const std::uint8_t> bytes) {
+Bitmap32 DecodeBitmap(std::span<const std::uint8_t> bytes) {
   constexpr std::size_t kHeaders = 14 + 40;
   if (bytes.size() < kHeaders || bytes[28] != 8 || bytes[29] != 0) return DecodeBitmap24(bytes);
   if (bytes[0] != 'B' || bytes[1] != 'M') Fail("not a bitmap file");
@@ -60,14 +60,14 @@ TBitmap32 DecodeBitmap(std::span<const std::uint8_t> bytes) {
       width > (1 << 20))
     Fail("bad size");
   const std::int32_t height = rawHeight < 0 ? -rawHeight : rawHeight;
-  if (static_cast<std::int64_t>(width) * height > TBitmap32::kMaxPixels) Fail("too large");
+  if (static_cast<std::int64_t>(width) * height > Bitmap32::kMaxPixels) Fail("too large");
   const std::uint64_t palette = 14 + static_cast<std::uint64_t>(infoSize);
   const std::uint64_t stride = (static_cast<std::uint64_t>(width) + 3) & ~std::uint64_t{3};
   if (palette + 4 * colours > dataOffset ||
       dataOffset + stride * static_cast<std::uint64_t>(height - 1) + width > bytes.size())
     Fail("truncated");
 
-  TBitmap32 picture(width, height);
+  Bitmap32 picture(width, height);
   for (std::int32_t y = 0; y < height; ++y) {
     const std::int32_t fileRow = rawHeight < 0 ? y : height - 1 - y;
     const std::uint8_t* src =
@@ -86,7 +86,7 @@ TBitmap32 DecodeBitmap(std::span<const std::uint8_t> bytes) {
   return picture;
 }
 
-TBitmap32 TextureTile(int n) {
+Bitmap32 TextureTile(int n) {
 #define QUILLANE_TILE_SPAN(n) \
   std::span<const std::uint8_t>(embedded::texture_##n##_bmp, embedded::texture_##n##_bmp_size)
   static const std::array<std::span<const std::uint8_t>, kTextureTiles> kFiles{

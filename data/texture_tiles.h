@@ -11,12 +11,12 @@ namespace quillane {
 constexpr int kTextureTiles = 15;
 
 // Tile n (1..15): 58 by 58 gray pixels, alpha 255. std::out_of_range for any other n.
-TBitmap32 TextureTile(int n);
+Bitmap32 TextureTile(int n);
 
 // Decodes an uncompressed bottom-up or top-down BMP with 24 bits per pixel, or with 8 bits and
 // a palette, into a 32-bit bitmap with alpha 255. Anything else, or a file whose headers,
 // palette or pixels do not fit its length, throws std::runtime_error; nothing is read outside
 // bytes.
-TBitmap32 DecodeBitmap(std::span<const std::uint8_t> bytes);
+Bitmap32 DecodeBitmap(std::span<const std::uint8_t> bytes);
 
 }  // namespace quillane

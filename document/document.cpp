@@ -18,7 +18,7 @@ namespace quillane {
 struct PictureDocument::SlotState {
   explicit SlotState(Picture picture) : seen(picture), picture(std::move(picture)) {}
   std::mutex mutex;
-  std::weak_ptr<const TBitmap32> seen;
+  std::weak_ptr<const Bitmap32> seen;
   Picture picture;  // until packed
   std::shared_ptr<const PackedPicture> packed;
 };
@@ -88,14 +88,14 @@ class HistoryPacker {
   std::thread thread_;
 };
 
-const TBitmap32& EmptyPicture() {
-  static const TBitmap32 empty;
+const Bitmap32& EmptyPicture() {
+  static const Bitmap32 empty;
   return empty;
 }
 
 }  // namespace
 
-PictureDocument::PictureDocument(TBitmap32 picture) {
+PictureDocument::PictureDocument(Bitmap32 picture) {
   Load(std::move(picture));
   ResetHistory();
 }
@@ -128,7 +128,7 @@ PictureDocument::SlotHandle PictureDocument::Record(Picture picture) {
   return slot;
 }
 
-const TBitmap32& PictureDocument::Slot(int slot) const {
+const Bitmap32& PictureDocument::Slot(int slot) const {
   const SlotHandle& state = slots_.at(static_cast<std::size_t>(slot - 1));
   if (!state) return EmptyPicture();
   std::shared_ptr<const PackedPicture> packed;
@@ -141,19 +141,19 @@ const TBitmap32& PictureDocument::Slot(int slot) const {
   return *slotView_;
 }
 
-void PictureDocument::Load(TBitmap32 picture) {
-  spare_.storage = TBitmap32();
+void PictureDocument::Load(Bitmap32 picture) {
+  spare_.storage = Bitmap32();
   SetAlphaChannel(picture, 255);
   working_ = source_ = opened_ = Share(std::move(picture));
 }
 
-void PictureDocument::Load(std::shared_ptr<TBitmap32> picture) {
-  spare_.storage = TBitmap32();
+void PictureDocument::Load(std::shared_ptr<Bitmap32> picture) {
+  spare_.storage = Bitmap32();
   working_ = source_ = opened_ = std::move(picture);
 }
 
 void PictureDocument::Backup() {
-  spare_.storage = TBitmap32();
+  spare_.storage = Bitmap32();
   currentSlot_ = currentSlot_ % kSlots + 1;
   SlotAt(currentSlot_) = Record(working_);
   if (undoCount_ < kMaxSteps) ++undoCount_;
@@ -170,8 +170,8 @@ PictureDocument::Picture PictureDocument::TakeSlot(int target, int leaving) {
     const bool same = !from->seen.owner_before(working_) && !working_.owner_before(from->seen);
     if (same && from->packed && !from->picture) leavingPacked = from->packed;
   }
-  const auto lend = [&](TBitmap32& storage) {
-    storage = std::move(const_cast<TBitmap32&>(*working_));
+  const auto lend = [&](Bitmap32& storage) {
+    storage = std::move(const_cast<Bitmap32&>(*working_));
     working_.reset();
   };
 
@@ -187,12 +187,12 @@ PictureDocument::Picture PictureDocument::TakeSlot(int target, int leaving) {
     packed = state.packed;
   }
 
-  TBitmap32 storage;
+  Bitmap32 storage;
   if (leavingPacked) {
     lend(storage);
   } else {
     storage = std::move(spare_.storage);
-    spare_.storage = TBitmap32();
+    spare_.storage = Bitmap32();
   }
   try {
     packed->UnpackInto(storage);
@@ -223,8 +223,8 @@ void PictureDocument::Restore(int target) {
     const long double heightFactor =
         static_cast<long double>(working_->Height()) / source_->Height();
     const long double widthFactor = static_cast<long double>(working_->Width()) / source_->Width();
-    TBitmap32 resampled = *source_;
-    ZoomInandOut(resampled, heightFactor, widthFactor);
+    Bitmap32 resampled = *source_;
+    ResampleNearest(resampled, heightFactor, widthFactor);
     source_ = Share(std::move(resampled));
   }
 }

@@ -29,22 +29,22 @@ class PictureDocument {
 
   // Starts with picture (its alpha set to 255) as working, source and opened picture and in
   // slot 1.
-  explicit PictureDocument(TBitmap32 picture = TBitmap32());
+  explicit PictureDocument(Bitmap32 picture = Bitmap32());
 
-  const TBitmap32& Working() const { return *working_; }
-  const TBitmap32& Source() const { return *source_; }
-  const TBitmap32& Opened() const { return *opened_; }
+  const Bitmap32& Working() const { return *working_; }
+  const Bitmap32& Source() const { return *source_; }
+  const Bitmap32& Opened() const { return *opened_; }
 
   // Effects write their result here; record it with Backup afterwards.
-  void SetWorking(TBitmap32 picture) { working_ = Share(std::move(picture)); }
+  void SetWorking(Bitmap32 picture) { working_ = Share(std::move(picture)); }
   // Rotation and resizing change the source picture as well.
-  void SetSource(TBitmap32 picture) { source_ = Share(std::move(picture)); }
+  void SetSource(Bitmap32 picture) { source_ = Share(std::move(picture)); }
 
   // Makes picture (alpha set to 255) the working, source and opened picture, as loading a file
   // does. The history is left alone; opening a file follows this with ResetHistory.
-  void Load(TBitmap32 picture);
+  void Load(Bitmap32 picture);
   // The same for a picture whose alpha is 255 already, taken over without a copy.
-  void Load(std::shared_ptr<TBitmap32> picture);
+  void Load(std::shared_ptr<Bitmap32> picture);
 
   // The history step: the next slot (21 wraps to 1) takes the working picture; the undo count
   // grows up to 20, the redo count becomes 0.
@@ -66,12 +66,12 @@ class PictureDocument {
   int CurrentSlot() const { return currentSlot_; }  // 1..21
   // The state held in slot (1..21), unpacked when it is packed; empty for a slot no history
   // operation can reach. The reference holds until the next call or change of the document.
-  const TBitmap32& Slot(int slot) const;
+  const Bitmap32& Slot(int slot) const;
 
   // Shared handles on the pictures, for work that runs on another thread while the document
   // goes on: the pictures themselves never change.
-  std::shared_ptr<const TBitmap32> SharedSource() const { return source_; }
-  std::shared_ptr<const TBitmap32> SharedWorking() const { return working_; }
+  std::shared_ptr<const Bitmap32> SharedSource() const { return source_; }
+  std::shared_ptr<const Bitmap32> SharedWorking() const { return working_; }
 
   // Waits until every history state recorded so far (by any document) is packed.
   static void WaitForHistoryPacking();
@@ -82,11 +82,9 @@ class PictureDocument {
   std::uint32_t RandomState() const { return randomState_; }
 
  private:
-  using Picture = std::shared_ptr<const TBitmap32>;
+  using Picture = std::shared_ptr<const Bitmap32>;
   // Made writable, so that a picture nobody else holds can lend its storage to the next one.
-  static Picture Share(TBitmap32 picture) {
-    return std::make_shared<TBitmap32>(std::move(picture));
-  }
+  static Picture Share(Bitmap32 picture) { return std::make_shared<Bitmap32>(std::move(picture)); }
   struct SlotState;
   using SlotHandle = std::shared_ptr<SlotState>;
   SlotHandle& SlotAt(int slot) { return slots_[static_cast<std::size_t>(slot - 1)]; }
@@ -104,7 +102,7 @@ class PictureDocument {
     Spare() = default;
     Spare(const Spare&) {}
     Spare& operator=(const Spare&) { return *this; }
-    TBitmap32 storage;
+    Bitmap32 storage;
   };
 
   Picture working_;

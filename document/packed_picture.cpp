@@ -33,7 +33,7 @@ inline std::uint8_t Byte(int v) {
   return static_cast<std::uint8_t>(v);
 }
 
-void SplitRows(const TBitmap32& picture, int y0, int y1, std::uint8_t* data) {
+void SplitRows(const Bitmap32& picture, int y0, int y1, std::uint8_t* data) {
   const int width = picture.Width();
   Planes planes(data, static_cast<std::size_t>(width) * static_cast<std::size_t>(y1 - y0));
   for (int y = y0; y < y1; ++y) {
@@ -65,7 +65,7 @@ void SplitRows(const TBitmap32& picture, int y0, int y1, std::uint8_t* data) {
   }
 }
 
-void JoinRows(std::uint8_t* data, int y0, int y1, TBitmap32& picture) {
+void JoinRows(std::uint8_t* data, int y0, int y1, Bitmap32& picture) {
   const int width = picture.Width();
   Planes planes(data, static_cast<std::size_t>(width) * static_cast<std::size_t>(y1 - y0));
   for (int y = y0; y < y1; ++y) {
@@ -102,7 +102,7 @@ void Check(std::size_t code) {
 
 }  // namespace
 
-PackedPicture PackedPicture::Pack(const TBitmap32& picture) {
+PackedPicture PackedPicture::Pack(const Bitmap32& picture) {
   PackedPicture packed;
   packed.width_ = picture.Width();
   packed.height_ = picture.Height();
@@ -145,7 +145,7 @@ std::size_t PackedPicture::Bytes() const {
   return bytes;
 }
 
-void PackedPicture::UnpackInto(TBitmap32& target) const {
+void PackedPicture::UnpackInto(Bitmap32& target) const {
   if (target.Width() != width_ || target.Height() != height_) target.SetSize(width_, height_);
   if (target.Empty()) return;
   const std::size_t rowBytes = static_cast<std::size_t>(width_) * sizeof(Pixel);
@@ -174,8 +174,8 @@ void PackedPicture::UnpackInto(TBitmap32& target) const {
   });
 }
 
-TBitmap32 PackedPicture::Unpack() const {
-  TBitmap32 picture;
+Bitmap32 PackedPicture::Unpack() const {
+  Bitmap32 picture;
   UnpackInto(picture);
   return picture;
 }

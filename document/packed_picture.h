@@ -13,7 +13,7 @@ namespace quillane {
 class PackedPicture {
  public:
   // Bands of rows are packed on several threads; throws std::bad_alloc when memory runs out.
-  static PackedPicture Pack(const TBitmap32& picture);
+  static PackedPicture Pack(const Bitmap32& picture);
 
   int Width() const { return width_; }
   int Height() const { return height_; }
@@ -22,8 +22,8 @@ class PackedPicture {
 
   // target becomes the packed picture. Its pixel storage is reused when it already has the
   // size, so unpacking into a picture about to be dropped touches no fresh memory.
-  void UnpackInto(TBitmap32& target) const;
-  TBitmap32 Unpack() const;
+  void UnpackInto(Bitmap32& target) const;
+  Bitmap32 Unpack() const;
 
  private:
   int width_ = 0;

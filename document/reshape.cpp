@@ -9,12 +9,12 @@
 namespace quillane {
 
 bool RotateDocument(PictureDocument& document, QuarterTurn turn) {
-  const auto turned = [turn](const TBitmap32& p) {
+  const auto turned = [turn](const Bitmap32& p) {
     return RotatePicture(p, RotationCentre(p.Width()), RotationCentre(p.Height()), turn);
   };
-  std::optional<TBitmap32> working = turned(document.Working());
+  std::optional<Bitmap32> working = turned(document.Working());
   if (!working) return false;
-  std::optional<TBitmap32> source = turned(document.Source());
+  std::optional<Bitmap32> source = turned(document.Source());
   if (!source) return false;
   document.SetWorking(std::move(*working));
   document.SetSource(std::move(*source));
@@ -32,25 +32,25 @@ std::int64_t ResampledSide(int side, double factor) {
 }
 
 ResizeResult ResizeDocument(PictureDocument& document, int w, int h) {
-  const TBitmap32& working = document.Working();
-  const TBitmap32& source = document.Source();
+  const Bitmap32& working = document.Working();
+  const Bitmap32& source = document.Source();
   if (w <= 0 || h <= 0 || working.Empty()) return ResizeResult::TooSmall;
   const SizeFactors f = ImageSizeFactors(w, h, working.Width(), working.Height());
   ResizeResult result = ResizeResult::Resized;
-  for (const TBitmap32* p : {&working, &source}) {
+  for (const Bitmap32* p : {&working, &source}) {
     const std::int64_t newW = ResampledSide(p->Width(), f.width);
     const std::int64_t newH = ResampledSide(p->Height(), f.height);
     if (newW < 1 || newH < 1) return ResizeResult::TooSmall;
-    if (newW > TBitmap32::kMaxPixels / newH) result = ResizeResult::TooLarge;
+    if (newW > Bitmap32::kMaxPixels / newH) result = ResizeResult::TooLarge;
   }
   if (result != ResizeResult::Resized) return result;
   CheckMemoryFor(ResampledSide(working.Width(), f.width), ResampledSide(working.Height(), f.height),
                  "The resized picture");
 
-  TBitmap32 newWorking = working;
-  ZoomInandOut(newWorking, f.height, f.width);
-  TBitmap32 newSource = source;
-  ZoomInandOut(newSource, f.height, f.width);
+  Bitmap32 newWorking = working;
+  ResampleNearest(newWorking, f.height, f.width);
+  Bitmap32 newSource = source;
+  ResampleNearest(newSource, f.height, f.width);
   document.SetWorking(std::move(newWorking));
   document.SetSource(std::move(newSource));
   document.Backup();

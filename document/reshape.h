@@ -16,7 +16,7 @@ namespace quillane {
 bool RotateDocument(PictureDocument& document, QuarterTurn turn);
 
 // The factors for resampling a W by H picture to w by h: w / W and h / H, each divided in
-// extended precision and stored as a double. Since ZoomInandOut truncates W * (w / W), a
+// extended precision and stored as a double. Since ResampleNearest truncates W * (w / W), a
 // quotient rounded downward gives w - 1 (400 / 521 of 521 is 399).
 struct SizeFactors {
   double width = 0;
@@ -24,16 +24,16 @@ struct SizeFactors {
 };
 SizeFactors ImageSizeFactors(int w, int h, int W, int H);
 
-// What ZoomInandOut makes of side with factor: Trunc(side * factor) in extended precision.
+// What ResampleNearest makes of side with factor: Trunc(side * factor) in extended precision.
 std::int64_t ResampledSide(int side, double factor);
 
 enum class ResizeResult {
   Resized,
   TooSmall,  // a size of 0, or one that resamples to less than one pixel
-  TooLarge,  // more pixels than TBitmap32::kMaxPixels
+  TooLarge,  // more pixels than Bitmap32::kMaxPixels
 };
 
-// Resamples the working and then the source picture with ZoomInandOut by the factors for w by h
+// Resamples the working and then the source picture with ResampleNearest by the factors for w by h
 // taken from the working picture's size (the source picture may differ in size), then takes the
 // history step. Anything but Resized leaves the document unchanged; so does a failed
 // allocation, which passes on: NotEnoughMemory, with a sentence for the user, when the new

@@ -25,7 +25,7 @@ EffectRun::EffectRun(const PictureDocument& document, const EffectSpec& effect,
       startState_(document.RandomState()),
       random_(startState_) {}
 
-EffectRun::EffectRun(std::shared_ptr<const TBitmap32> picture, std::uint32_t randomState,
+EffectRun::EffectRun(std::shared_ptr<const Bitmap32> picture, std::uint32_t randomState,
                      const EffectSpec& effect, const EffectParams& params)
     : effect_(&effect),
       settings_(Settings(effect, params)),

@@ -26,7 +26,7 @@ class EffectRun {
   EffectRun(const PictureDocument& document, const EffectSpec& effect, const EffectParams& params);
   // For picture loaded as the document's picture (working and source alike), with the random
   // state the document will have then.
-  EffectRun(std::shared_ptr<const TBitmap32> picture, std::uint32_t randomState,
+  EffectRun(std::shared_ptr<const Bitmap32> picture, std::uint32_t randomState,
             const EffectSpec& effect, const EffectParams& params);
 
   // Runs the routine; safe on any thread. Throws whatever the routine throws.
@@ -40,11 +40,11 @@ class EffectRun {
  private:
   const EffectSpec* effect_;
   EffectParams settings_;
-  std::shared_ptr<const TBitmap32> source_;
-  std::shared_ptr<const TBitmap32> working_;
+  std::shared_ptr<const Bitmap32> source_;
+  std::shared_ptr<const Bitmap32> working_;
   std::uint32_t startState_;
   std::uint32_t random_;
-  TBitmap32 result_;
+  Bitmap32 result_;
 };
 
 }  // namespace quillane

@@ -4,24 +4,38 @@
 
 namespace quillane {
 
-// Each effect's entry is defined beside its routine. This list, in tool-number order, is the
-// only place that names them all.
-#define QUILLANE_EFFECTS(X)                                                           \
-  X(PencilSketch)                                                                     \
-  X(PenSketch)                                                                        \
-  X(Vuzorar)                                                                          \
-  X(PenAndInk)                                                                        \
-  X(ColorPencil) X(Realism) X(Abstract) X(PopArt) X(WaterColor) X(Brume) X(HslAdjust) \
-      X(ColorVariety) X(ColorPanel) X(Texture) X(Emboss) X(ColorFilter) X(Stria)
+// Each effect's entry is defined beside its routine. This list is the only place that names them
+// all; its order is the tool numbers' and the gallery's.
+#define QUILLANE_EFFECTS(X)                                                               \
+  X(PencilSketch)                                                                         \
+  X(PenSketch)                                                                            \
+  X(Vuzorar)                                                                              \
+  X(PenAndInk)                                                                            \
+  X(ColorPencil)                                                                          \
+  X(Realism)                                                                              \
+  X(Abstract) X(PopArt) X(WaterColor) X(Brume) X(HslAdjust) X(ColorVariety) X(ColorPanel) \
+      X(Texture) X(Emboss) X(ColorFilter) X(Stria)
 
 #define QUILLANE_DECLARE_EFFECT(name) const EffectSpec& name##Effect();
 QUILLANE_EFFECTS(QUILLANE_DECLARE_EFFECT)
 #undef QUILLANE_DECLARE_EFFECT
 
 const std::vector<const EffectSpec*>& Effects() {
-#define QUILLANE_LIST_EFFECT(name) &name##Effect(),
-  static const std::vector<const EffectSpec*> all = {QUILLANE_EFFECTS(QUILLANE_LIST_EFFECT)};
+  // Each entry is taken once, with its place in the list as its tool number, so that inserting
+  // an effect never renumbers another file.
+  static const std::vector<EffectSpec> numbered = [] {
+#define QUILLANE_LIST_EFFECT(name) name##Effect(),
+    std::vector<EffectSpec> entries = {QUILLANE_EFFECTS(QUILLANE_LIST_EFFECT)};
 #undef QUILLANE_LIST_EFFECT
+    for (std::size_t i = 0; i < entries.size(); ++i)
+      entries[i].toolNumber = static_cast<int>(i) + 1;
+    return entries;
+  }();
+  static const std::vector<const EffectSpec*> all = [] {
+    std::vector<const EffectSpec*> pointers;
+    for (const EffectSpec& e : numbered) pointers.push_back(&e);
+    return pointers;
+  }();
   return all;
 }
 

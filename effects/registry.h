@@ -20,13 +20,13 @@ namespace quillane {
 // every parameter of the effect present. random is the program's one random generator state,
 // which a routine that draws continues (null where nothing draws).
 struct EffectInput {
-  const TBitmap32& source;
-  const TBitmap32& working;
+  const Bitmap32& source;
+  const Bitmap32& working;
   const EffectParams& params;
   std::uint32_t* random = nullptr;
 };
 
-using EffectRoutine = std::function<TBitmap32(const EffectInput&)>;
+using EffectRoutine = std::function<Bitmap32(const EffectInput&)>;
 
 // The four effect menus, in the order the main window shows them.
 enum class EffectMenu { Mono, Color, Adjust, Veins };
@@ -44,18 +44,31 @@ struct ButtonSpec {
   std::string hint;
 };
 
+// What an effect gives with its defaults on the built-in picture (521 x 346): the FNV-1a hash
+// of its pixel bytes, row by row, and three pixels (at (0, 0), (260, 173) and (520, 345), opaque,
+// as 0xBBGGRR in memory order). The table test checks every entry against it, so that no
+// effect's bytes change unseen.
+struct ReferenceResult {
+  std::uint64_t hash = 0;
+  std::uint32_t topLeft = 0;
+  std::uint32_t centre = 0;
+  std::uint32_t bottomRight = 0;
+};
+
 struct EffectSpec {
-  int toolNumber = 0;  // 1..17, the active tool number while the window is open
+  // The active tool number while the window is open: the entry's place in Effects(), from 1.
+  // Set by the registry, never written in an entry.
+  int toolNumber = 0;
   EffectMenu menu = EffectMenu::Mono;
-  int menuPosition = 0;     // 1-based place in its menu
-  std::string menuEntry;    // the entry's caption as the menu takes it: "Pen && Ink"
-  std::string menuHandler;  // "Pencilsketch1Click"; the action is named without "Click"
-  std::string windowClass;  // "TBack_and_White_Sketch"; the window's object name
-  std::string caption;      // window title: "Pencil_Sketch"
-  std::string statusText;   // status line after apply: "Pencil Sketch"
-  std::string cliName;      // "pencil-sketch"
-  std::string batchTag;     // output name tag; empty when the window has no batch panel
-  int collapsedHeight = 0;  // 0 for windows without a batch panel
+  int menuPosition = 0;          // 1-based place in its menu
+  std::string menuEntry;         // the entry's caption as the menu takes it: "Pen && Ink"
+  std::string menuObjectName;    // the menu action's object name: "Pencilsketch1"
+  std::string windowObjectName;  // the tool window's object name: "TBack_and_White_Sketch"
+  std::string caption;           // window title: "Pencil_Sketch"
+  std::string statusText;        // status line after apply: "Pencil Sketch"
+  std::string cliName;           // "pencil-sketch"
+  std::string batchTag;          // output name tag; empty when the window has no batch panel
+  int collapsedHeight = 0;       // 0 for windows without a batch panel
   int expandedHeight = 0;
   bool colorUp = false;             // has the "Color up" button
   bool batchPushesHistory = false;  // its batch routine records a history step per picture
@@ -70,6 +83,7 @@ struct EffectSpec {
   std::string inputField = "Edit1";
   std::string outputField = "Edit2";
   std::vector<ParamSpec> params;
+  ReferenceResult reference;
   EffectRoutine routine;  // empty until the effect is built
 
   bool HasBatchPanel() const { return !batchTag.empty(); }
@@ -78,10 +92,10 @@ struct EffectSpec {
   EffectParams Defaults() const;
 };
 
-// Every effect in tool-number order.
+// Every effect in tool-number order: the order of the registry's list.
 const std::vector<const EffectSpec*>& Effects();
 
-// By tool number (1..17), or by command-line name; nullptr when there is none.
+// By tool number (1 to the number of effects), or by command-line name; nullptr when there is none.
 const EffectSpec* FindEffect(int toolNumber);
 const EffectSpec* FindEffectByCliName(const std::string& cliName);
 

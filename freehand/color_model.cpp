@@ -41,7 +41,7 @@ Pixel HSLtoRGB(double l, double s, double h) {
                Level(Channel(m1, m2, h + 1.0 / 3.0)), 255};
 }
 
-Pixel drawcolor(Pixel pixel, const FreehandHsl& brush) {
+Pixel BrushColour(Pixel pixel, const FreehandHsl& brush) {
   double l = RGBtoHSL(pixel).l;
   if (l < brush.l) l = brush.l;
   l -= 0.01;

@@ -41,6 +41,6 @@ Pixel HSLtoRGB(double l, double s, double h);
 
 // The brush colour of one stroke pixel: the brush's hue and saturation with the pixel's own
 // lightness, raised to at least the brush's, less 0.01 (not below 0).
-Pixel drawcolor(Pixel pixel, const FreehandHsl& brush);
+Pixel BrushColour(Pixel pixel, const FreehandHsl& brush);
 
 }  // namespace quillane

@@ -18,7 +18,7 @@ PaintRect StrokeHistory::TileRect(const Stroke& stroke, int index) const {
                    std::min(top + kTile, stroke.height)};
 }
 
-void StrokeHistory::Begin(const TBitmap32& picture) {
+void StrokeHistory::Begin(const Bitmap32& picture) {
   End();
   Stroke stroke;
   stroke.width = picture.Width();
@@ -30,7 +30,7 @@ void StrokeHistory::Begin(const TBitmap32& picture) {
   open_ = true;
 }
 
-void StrokeHistory::Keep(const TBitmap32& picture, const PaintRect& area) {
+void StrokeHistory::Keep(const Bitmap32& picture, const PaintRect& area) {
   if (!open_) return;
   Stroke& stroke = strokes_.back();
   if (picture.Width() != stroke.width || picture.Height() != stroke.height) return;
@@ -74,7 +74,7 @@ void StrokeHistory::End() {
   }
 }
 
-PaintRect StrokeHistory::Undo(TBitmap32& picture) {
+PaintRect StrokeHistory::Undo(Bitmap32& picture) {
   End();
   if (strokes_.empty()) return {};
   Stroke stroke = std::move(strokes_.back());

@@ -21,10 +21,10 @@ class StrokeHistory {
       : budgetBytes_(budgetBytes) {}
 
   // Starts a stroke on picture (one that is still open is closed first).
-  void Begin(const TBitmap32& picture);
+  void Begin(const Bitmap32& picture);
   // Called before the open stroke writes into area of picture. Without an open stroke, or for
   // a picture of another size than the stroke began on, nothing is kept.
-  void Keep(const TBitmap32& picture, const PaintRect& area);
+  void Keep(const Bitmap32& picture, const PaintRect& area);
   // Closes the open stroke; one that kept nothing is dropped.
   void End();
   bool Open() const { return open_; }
@@ -33,7 +33,7 @@ class StrokeHistory {
   std::size_t Count() const { return strokes_.size(); }
   // Puts back the pixels the last stroke changed and forgets it; the area it restored, empty
   // when there was nothing to undo (or picture has another size than the stroke's).
-  PaintRect Undo(TBitmap32& picture);
+  PaintRect Undo(Bitmap32& picture);
   void Clear();
 
  private:

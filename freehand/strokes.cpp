@@ -31,7 +31,7 @@ std::vector<int> DiscReach(int size) {
 }
 
 template <typename Paint>
-PaintRect ForDisc(TBitmap32& picture, int x, int y, int size, Paint paint) {
+PaintRect ForDisc(Bitmap32& picture, int x, int y, int size, Paint paint) {
   size = std::max(size, 0);
   x = Near(x);
   y = Near(y);
@@ -51,33 +51,33 @@ PaintRect ForDisc(TBitmap32& picture, int x, int y, int size, Paint paint) {
 
 }  // namespace
 
-PaintRect DiscBounds(const TBitmap32& picture, int x, int y, int size) {
+PaintRect DiscBounds(const Bitmap32& picture, int x, int y, int size) {
   size = std::max(size, 0);
   x = Near(x);
   y = Near(y);
   return PaintRect{x - size, y - size, x + size + 1, y + size + 1}.ClippedTo(picture);
 }
 
-PaintRect RubDisc(TBitmap32& picture, int x, int y, int size) {
+PaintRect RubDisc(Bitmap32& picture, int x, int y, int size) {
   return ForDisc(picture, x, y, size, [](Pixel& p) { p = kPaperWhite; });
 }
 
-PaintRect BrushDisc(TBitmap32& picture, int x, int y, int size, const FreehandHsl& brush) {
-  // Strokes are mostly a few shades of gray, and drawcolor depends on nothing but the pixel's
+PaintRect BrushDisc(Bitmap32& picture, int x, int y, int size, const FreehandHsl& brush) {
+  // Strokes are mostly a few shades of gray, and BrushColour depends on nothing but the pixel's
   // colour: the last answer is kept for the next pixel.
   Pixel lastIn{0, 0, 0, 0};
-  Pixel lastOut = drawcolor(lastIn, brush);
+  Pixel lastOut = BrushColour(lastIn, brush);
   return ForDisc(picture, x, y, size, [&](Pixel& p) {
     if (IsPaperColor(p)) return;
     if (!SameColor(p, lastIn)) {
       lastIn = p;
-      lastOut = drawcolor(p, brush);
+      lastOut = BrushColour(p, brush);
     }
     p = lastOut;
   });
 }
 
-PaintRect LineBounds(const TBitmap32& picture, int x0, int y0, int x1, int y1, int width) {
+PaintRect LineBounds(const Bitmap32& picture, int x0, int y0, int x1, int y1, int width) {
   x0 = Near(x0), y0 = Near(y0), x1 = Near(x1), y1 = Near(y1);
   const int r = std::max(width, 1) / 2 + 1;
   return PaintRect{std::min(x0, x1) - r, std::min(y0, y1) - r, std::max(x0, x1) + r + 1,
@@ -85,7 +85,7 @@ PaintRect LineBounds(const TBitmap32& picture, int x0, int y0, int x1, int y1, i
       .ClippedTo(picture);
 }
 
-PaintRect DrawLine(TBitmap32& picture, LinePen& pen, int x0, int y0, int x1, int y1, bool withEnd) {
+PaintRect DrawLine(Bitmap32& picture, LinePen& pen, int x0, int y0, int x1, int y1, bool withEnd) {
   x0 = Near(x0), y0 = Near(y0), x1 = Near(x1), y1 = Near(y1);
   const Pixel color{pen.color.b, pen.color.g, pen.color.r, 255};
   PaintRect changed;
@@ -136,10 +136,10 @@ PaintRect DrawLine(TBitmap32& picture, LinePen& pen, int x0, int y0, int x1, int
   return changed;
 }
 
-void Thin(TBitmap32& picture) {
+void Thin(Bitmap32& picture) {
   const int w = picture.Width(), h = picture.Height();
   if (w < 3 || h < 3) return;
-  TBitmap32 result = picture;
+  Bitmap32 result = picture;
   const Pixel white{255, 255, 255, 255};
   const Pixel tint{kPaperTint.b, kPaperTint.g, kPaperTint.r, 0};
   for (int y = 1; y < h - 1; ++y) {
@@ -168,10 +168,10 @@ void Thin(TBitmap32& picture) {
   picture = std::move(result);
 }
 
-void Thick(TBitmap32& picture) {
+void Thick(Bitmap32& picture) {
   const int w = picture.Width(), h = picture.Height();
   if (w < 3 || h < 3) return;
-  const TBitmap32 before = picture;
+  const Bitmap32 before = picture;
   for (int y = 1; y < h - 1; ++y) {
     const Pixel* up = before.ScanLine(y - 1);
     const Pixel* mid = before.ScanLine(y);

@@ -27,7 +27,7 @@ struct PaintRect {
     return {std::min(left, other.left), std::min(top, other.top), std::max(right, other.right),
             std::max(bottom, other.bottom)};
   }
-  PaintRect ClippedTo(const TBitmap32& picture) const {
+  PaintRect ClippedTo(const Bitmap32& picture) const {
     PaintRect r{std::max(left, 0), std::max(top, 0), std::min(right, picture.Width()),
                 std::min(bottom, picture.Height())};
     return r.Empty() ? PaintRect{} : r;
@@ -37,12 +37,12 @@ struct PaintRect {
 
 // The part of picture the disc of radius size around (x, y) covers: for each column c from
 // x - size to x + size, rows y - k to y + k with k = Round(sqrt(size^2 - (x - c)^2)).
-PaintRect DiscBounds(const TBitmap32& picture, int x, int y, int size);
+PaintRect DiscBounds(const Bitmap32& picture, int x, int y, int size);
 
 // The rubber: every disc pixel becomes white.
-PaintRect RubDisc(TBitmap32& picture, int x, int y, int size);
-// The brush: every disc pixel that is no paper colour becomes its drawcolor.
-PaintRect BrushDisc(TBitmap32& picture, int x, int y, int size, const FreehandHsl& brush);
+PaintRect RubDisc(Bitmap32& picture, int x, int y, int size);
+// The brush: every disc pixel that is no paper colour becomes its BrushColour.
+PaintRect BrushDisc(Bitmap32& picture, int x, int y, int size, const FreehandHsl& brush);
 
 // The pen of the picture: a width of 1 draws dashes (18 pixels on, 6 off, the pattern running
 // on from one line of a stroke to the next), wider pens draw solid lines with round ends,
@@ -54,11 +54,11 @@ struct LinePen {
 };
 
 // The pixels DrawLine may touch, before clipping.
-PaintRect LineBounds(const TBitmap32& picture, int x0, int y0, int x1, int y1, int width);
+PaintRect LineBounds(const Bitmap32& picture, int x0, int y0, int x1, int y1, int width);
 // A line from (x0, y0) towards (x1, y1): a one-pixel line leaves out its end point, so the
 // next line of a stroke starts there without drawing it twice, unless withEnd asks for it (a
 // single line that must reach the point it was drawn to).
-PaintRect DrawLine(TBitmap32& picture, LinePen& pen, int x0, int y0, int x1, int y1,
+PaintRect DrawLine(Bitmap32& picture, LinePen& pen, int x0, int y0, int x1, int y1,
                    bool withEnd = false);
 
 // One thinning pass: a pixel whose eight neighbours show 2 to 6 paper pixels, exactly one
@@ -66,12 +66,12 @@ PaintRect DrawLine(TBitmap32& picture, LinePen& pen, int x0, int y0, int x1, int
 // and among W, E, S becomes white when one of W, E, N, S is pure white, else the paper tint
 // with alpha 0. Tests read the picture as it was before the pass; the outermost rows and
 // columns never change.
-void Thin(TBitmap32& picture);
+void Thin(Bitmap32& picture);
 
 // One thickening pass: a pure white pixel takes the colour (alpha 255) of its last neighbour
 // in the order W, E, N, S that is not pure white; then a pixel in the paper tint takes the
 // colour of its last neighbour in that order that is not the tint. Neighbours are read from
 // the picture before the pass; the outermost rows and columns never change.
-void Thick(TBitmap32& picture);
+void Thick(Bitmap32& picture);
 
 }  // namespace quillane

@@ -14,7 +14,7 @@ namespace {
 // pixels (64 KB, 128 by 128) they run thousands.
 constexpr std::int64_t kFuzzMaxPixels = std::int64_t{1} << 14;
 
-quillane::TBitmap32 Decode(quillane::codecs::Bytes bytes) {
+quillane::Bitmap32 Decode(quillane::codecs::Bytes bytes) {
   using namespace quillane::codecs;
 #if defined(QUILLANE_FUZZ_FAMILY_jpeg)
   return DecodeJpeg(bytes, kFuzzMaxPixels);
@@ -46,7 +46,7 @@ extern "C" int LLVMFuzzerInitialize(int*, char***) {
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
   try {
-    const quillane::TBitmap32 picture = Decode({data, size});
+    const quillane::Bitmap32 picture = Decode({data, size});
     // Touch every pixel so that a short or misplaced buffer shows up under the sanitizers.
     unsigned sum = 0;
     for (int y = 0; y < picture.Height(); ++y) {

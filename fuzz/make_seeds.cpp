@@ -17,8 +17,8 @@
 
 namespace {
 
+using quillane::Bitmap32;
 using quillane::Pixel;
-using quillane::TBitmap32;
 using Bytes = std::vector<std::uint8_t>;
 
 struct Writer {
@@ -60,8 +60,8 @@ Bytes VectorEmf(const Bytes& written) {
   return w.b;
 }
 
-TBitmap32 Pattern(int w, int h) {
-  TBitmap32 p(w, h);
+Bitmap32 Pattern(int w, int h) {
+  Bitmap32 p(w, h);
   for (int y = 0; y < h; ++y) {
     for (int x = 0; x < w; ++x) {
       p.At(x, y) = Pixel{static_cast<std::uint8_t>(x * 8), static_cast<std::uint8_t>(y * 8),
@@ -205,7 +205,7 @@ int main(int argc, char** argv) {
   try {
     namespace c = quillane::codecs;
     const std::filesystem::path folder = argv[1];
-    const TBitmap32 picture = Pattern(24, 16);
+    const Bitmap32 picture = Pattern(24, 16);
 
     Save(folder, "jpeg", 0, c::EncodeJpeg(picture, 90));
     Save(folder, "jpeg", 1, Jpeg(3, true));

@@ -9,24 +9,24 @@
 
 namespace quillane {
 
-TBitmap32::Store::Store(const Store& other) : Store(other.count_) {
+Bitmap32::Store::Store(const Store& other) : Store(other.count_) {
   if (count_ != 0) std::memcpy(data_, other.data_, count_ * sizeof(Pixel));
 }
 
-TBitmap32::Store& TBitmap32::Store::operator=(const Store& other) {
+Bitmap32::Store& Bitmap32::Store::operator=(const Store& other) {
   if (this == &other) return *this;
   if (count_ != other.count_) return *this = Store(other);
   if (count_ != 0) std::memcpy(data_, other.data_, count_ * sizeof(Pixel));
   return *this;
 }
 
-TBitmap32::TBitmap32(int width, int height, Pixel fill) {
+Bitmap32::Bitmap32(int width, int height, Pixel fill) {
   Allocate(width, height);
   std::fill(pixels_.data(), pixels_.data() + pixels_.size(), fill);
 }
 
-TBitmap32 TBitmap32::ForOverwrite(int width, int height) {
-  TBitmap32 b;
+Bitmap32 Bitmap32::ForOverwrite(int width, int height) {
+  Bitmap32 b;
   b.Allocate(width, height);
 #ifndef NDEBUG
   // A pixel a routine forgets to write shows as this, not as the zeros fresh memory happens
@@ -37,7 +37,7 @@ TBitmap32 TBitmap32::ForOverwrite(int width, int height) {
   return b;
 }
 
-void TBitmap32::Allocate(int width, int height) {
+void Bitmap32::Allocate(int width, int height) {
   if (width <= 0 || height <= 0) {
     width = 0;
     height = 0;
@@ -53,19 +53,19 @@ void TBitmap32::Allocate(int width, int height) {
   height_ = height;
 }
 
-void TBitmap32::SetSize(int width, int height) {
+void Bitmap32::SetSize(int width, int height) {
   Allocate(width, height);
   if (pixels_.size() != 0)
     std::memset(static_cast<void*>(pixels_.data()), 0, pixels_.size() * sizeof(Pixel));
 }
 
-bool operator==(const TBitmap32& a, const TBitmap32& b) {
+bool operator==(const Bitmap32& a, const Bitmap32& b) {
   return a.width_ == b.width_ && a.height_ == b.height_ &&
          (a.pixels_.size() == 0 ||
           std::memcmp(a.Data(), b.Data(), a.pixels_.size() * sizeof(Pixel)) == 0);
 }
 
-void TBitmap32::DrawOver(int x, int y, TBitmap32& target) const {
+void Bitmap32::DrawOver(int x, int y, Bitmap32& target) const {
   // Work in 64 bits so that placements near the int limits cannot overflow.
   const std::int64_t left = std::max<std::int64_t>(0, x);
   const std::int64_t top = std::max<std::int64_t>(0, y);
@@ -100,13 +100,13 @@ void TBitmap32::DrawOver(int x, int y, TBitmap32& target) const {
   }
 }
 
-void SetAlphaChannel(TBitmap32& bitmap, std::uint8_t value) {
+void SetAlphaChannel(Bitmap32& bitmap, std::uint8_t value) {
   Pixel* p = bitmap.Data();
   const std::size_t n = bitmap.PixelCount();
   for (std::size_t i = 0; i < n; ++i) p[i].a = value;
 }
 
-void ZoomInandOut(TBitmap32& bitmap, long double heightFactor, long double widthFactor) {
+void ResampleNearest(Bitmap32& bitmap, long double heightFactor, long double widthFactor) {
   const int w = bitmap.Width();
   const int h = bitmap.Height();
   const Extended nw = static_cast<Extended>(w) * widthFactor;
@@ -115,14 +115,14 @@ void ZoomInandOut(TBitmap32& bitmap, long double heightFactor, long double width
   // being converted (an out-of-range float-to-int conversion is undefined).
   const auto valid = [](Extended v) { return std::isfinite(v) && v >= 1.0L && v < 2147483648.0L; };
   if (w == 0 || !valid(nw) || !valid(nh)) {
-    bitmap = TBitmap32();
+    bitmap = Bitmap32();
     return;
   }
   const int newW = Trunc(nw);
   const int newH = Trunc(nh);
   if (newW == w && newH == h) return;
 
-  TBitmap32 result(newW, newH);
+  Bitmap32 result(newW, newH);
   std::vector<int> column(static_cast<std::size_t>(newW));
   for (int x = 0; x < newW; ++x)
     column[static_cast<std::size_t>(x)] = static_cast<int>(static_cast<std::int64_t>(x) * w / newW);

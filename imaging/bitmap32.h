@@ -41,34 +41,34 @@ class ScanLineError : public std::out_of_range {
   ScanLineError() : std::out_of_range("Scan line index out of range") {}
 };
 
-class TBitmap32 {
+class Bitmap32 {
  public:
   // The largest picture the program accepts, in pixels (about 268 megapixels, 1 GiB of pixel
   // data). Decoders refuse larger pictures before allocating anything.
   static constexpr std::int64_t kMaxPixels = std::int64_t{1} << 28;
 
-  TBitmap32() = default;
+  Bitmap32() = default;
   // A bitmap of the given size with every byte 0 (alpha 0, as a converted picture has).
   // A width or height of 0 or below gives the empty 0 by 0 bitmap.
-  TBitmap32(int width, int height) { SetSize(width, height); }
+  Bitmap32(int width, int height) { SetSize(width, height); }
   // A bitmap of the given size filled with one pixel.
-  TBitmap32(int width, int height, Pixel fill);
+  Bitmap32(int width, int height, Pixel fill);
   // A bitmap of the given size whose bytes are left as the memory holds them, for routines
   // that write every pixel anyway (saving a pass over the whole picture).
-  static TBitmap32 ForOverwrite(int width, int height);
+  static Bitmap32 ForOverwrite(int width, int height);
 
-  TBitmap32(const TBitmap32&) = default;
-  TBitmap32& operator=(const TBitmap32& other) {
+  Bitmap32(const Bitmap32&) = default;
+  Bitmap32& operator=(const Bitmap32& other) {
     pixels_ = other.pixels_;  // first: if it throws, this bitmap stays as it was
     width_ = other.width_;
     height_ = other.height_;
     return *this;
   }
-  TBitmap32(TBitmap32&& other) noexcept
+  Bitmap32(Bitmap32&& other) noexcept
       : width_(std::exchange(other.width_, 0)),
         height_(std::exchange(other.height_, 0)),
         pixels_(std::move(other.pixels_)) {}
-  TBitmap32& operator=(TBitmap32&& other) noexcept {
+  Bitmap32& operator=(Bitmap32&& other) noexcept {
     width_ = std::exchange(other.width_, 0);
     height_ = std::exchange(other.height_, 0);
     pixels_ = std::move(other.pixels_);
@@ -101,7 +101,7 @@ class TBitmap32 {
   Pixel& At(int x, int y) { return ScanLine(y)[CheckedColumn(x)]; }
   const Pixel& At(int x, int y) const { return ScanLine(y)[CheckedColumn(x)]; }
 
-  friend bool operator==(const TBitmap32& a, const TBitmap32& b);
+  friend bool operator==(const Bitmap32& a, const Bitmap32& b);
 
   // Composites this bitmap (the overlay), its top-left pixel placed at (x, y) of target, over
   // target, in place. Per pixel with target alpha at and overlay alpha ao:
@@ -111,7 +111,7 @@ class TBitmap32 {
   //   otherwise, d = 255 (ao + at) - ao at:
   //     channel = (at (255 - ao) t + 255 ao o) div d, alpha = d div 255 (truncating).
   // Only the intersection of both rectangles is touched.
-  void DrawOver(int x, int y, TBitmap32& target) const;
+  void DrawOver(int x, int y, Bitmap32& target) const;
 
  private:
   void CheckRow(int y) const {
@@ -159,13 +159,13 @@ class TBitmap32 {
 };
 
 // Sets the alpha byte of every pixel to value; colour bytes are untouched.
-void SetAlphaChannel(TBitmap32& bitmap, std::uint8_t value);
+void SetAlphaChannel(Bitmap32& bitmap, std::uint8_t value);
 
 // Resamples bitmap in place to Trunc(W * widthFactor) by Trunc(H * heightFactor), both
 // computed in extended precision, by nearest pixel: target pixel (x, y) copies source pixel
 // (x * W / W', y * H / H') in integer arithmetic, so every target pixel is one source pixel and
 // the whole source rectangle is covered. A new size of 0 or below (or a factor that is not a
 // finite number) gives the empty bitmap.
-void ZoomInandOut(TBitmap32& bitmap, long double heightFactor, long double widthFactor);
+void ResampleNearest(Bitmap32& bitmap, long double heightFactor, long double widthFactor);
 
 }  // namespace quillane

@@ -28,7 +28,7 @@ void InvertedResponseRow(const std::uint8_t* __restrict above, const std::uint8_
 }
 
 // Pictures without an interior pixel: only the border copies and the inversion apply.
-void SmallPicsobel(TBitmap32& bitmap) {
+void SmallPicsobel(Bitmap32& bitmap) {
   const int w = bitmap.Width();
   const int h = bitmap.Height();
   const int innerLeft = std::min(1, w - 1);
@@ -57,7 +57,7 @@ void SmallPicsobel(TBitmap32& bitmap) {
 
 }  // namespace
 
-void picsobel(TBitmap32& bitmap) {
+void InvertedSobelEdges(Bitmap32& bitmap) {
   const int w = bitmap.Width();
   const int h = bitmap.Height();
   if (w == 0) return;
@@ -124,11 +124,11 @@ void picsobel(TBitmap32& bitmap) {
   }
 }
 
-TBitmap32 PicsobelReference(const TBitmap32& input) {
+Bitmap32 InvertedSobelEdgesReference(const Bitmap32& input) {
   const int w = input.Width();
   const int h = input.Height();
-  const TBitmap32 snapshot = input;
-  TBitmap32 work = input;
+  const Bitmap32 snapshot = input;
+  Bitmap32 work = input;
   const int lineKernel[3][3] = {{-1, -1, -1}, {0, 6, 0}, {-1, -1, -1}};
   const int gradientKernel[3][3] = {{1, 0, -1}, {1, 0, -1}, {1, 0, -1}};
   std::uint8_t Pixel::*const channels[] = {&Pixel::r, &Pixel::g, &Pixel::b};

@@ -18,29 +18,29 @@ namespace quillane {
 // corners equal the diagonal interior pixel. All bytes are then inverted; alpha is left to the
 // caller. A picture too small for a neighbour on one side repeats what it has: 1 wide or 1 high
 // gives the inverted input along that direction, 2 gives both lines the inverted second line.
-void picsobel(TBitmap32& bitmap);
+void InvertedSobelEdges(Bitmap32& bitmap);
 
 // A new picture whose every pixel is levels[gray value of the edge map's pixel] in B, G and R,
-// alpha 255: what picsobel on a copy of source, then ConvertToGray and a per-level table give,
-// in one pass over rows that stay in cache, without the edge map as a picture. source is not
+// alpha 255: what InvertedSobelEdges on a copy of source, then ConvertToGray and a per-level table
+// give, in one pass over rows that stay in cache, without the edge map as a picture. source is not
 // changed.
-TBitmap32 GrayEdgeLevels(const TBitmap32& source, const std::array<std::uint8_t, 256>& levels);
+Bitmap32 GrayEdgeLevels(const Bitmap32& source, const std::array<std::uint8_t, 256>& levels);
 
 // Row y (0 .. height - 1) of the edge map of source thresholded at level, one byte a pixel into
-// cells[0 .. width - 1]: 0xFF where the gray value (GrayValue) of what picsobel makes of a copy
-// of source is above level, 0 elsewhere; from source's rows y - 1 to y + 1 alone, without the
-// edge map or its gray values. For sources of at least 3 by 3.
-void GrayEdgeCells(const TBitmap32& source, int y, int level, std::uint8_t* cells);
+// cells[0 .. width - 1]: 0xFF where the gray value (GrayValue) of what InvertedSobelEdges makes of
+// a copy of source is above level, 0 elsewhere; from source's rows y - 1 to y + 1 alone, without
+// the edge map or its gray values. For sources of at least 3 by 3.
+void GrayEdgeCells(const Bitmap32& source, int y, int level, std::uint8_t* cells);
 
-// Row y of the edge map's gray values (GrayValue of what picsobel makes of a copy of source)
-// into gray[0 .. width - 1], from source's rows y - 1 to y + 1 alone, for passes that use them
-// beside the picture itself. For sources of at least 3 by 3; any thread, any order of rows.
-void GrayEdgeRow(const TBitmap32& source, int y, std::uint8_t* gray);
+// Row y of the edge map's gray values (GrayValue of what InvertedSobelEdges makes of a copy of
+// source) into gray[0 .. width - 1], from source's rows y - 1 to y + 1 alone, for passes that use
+// them beside the picture itself. For sources of at least 3 by 3; any thread, any order of rows.
+void GrayEdgeRow(const Bitmap32& source, int y, std::uint8_t* gray);
 
 // The same edge map computed the plain way, pixel by pixel and channel by channel from a
-// snapshot, border columns, border rows, then the inversion. picsobel must equal it byte for
-// byte, alpha included; it is kept as the oracle for the banded, threaded fast path. For
+// snapshot, border columns, border rows, then the inversion. InvertedSobelEdges must equal it byte
+// for byte, alpha included; it is kept as the oracle for the banded, threaded fast path. For
 // pictures of at least 3 by 3.
-TBitmap32 PicsobelReference(const TBitmap32& input);
+Bitmap32 InvertedSobelEdgesReference(const Bitmap32& input);
 
 }  // namespace quillane

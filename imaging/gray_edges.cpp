@@ -25,7 +25,7 @@ namespace {
 constexpr int kStretch = 1024;
 
 // The edge bytes of the pixels x0 .. x0 + n - 1 of an interior row (1 <= x0,
-// x0 + n <= width - 1), as picsobel makes them.
+// x0 + n <= width - 1), as InvertedSobelEdges makes them.
 [[gnu::always_inline]] inline void EdgeStretch(const std::uint8_t* __restrict above,
                                                const std::uint8_t* __restrict row,
                                                const std::uint8_t* __restrict below, int x0, int n,
@@ -443,7 +443,7 @@ PixelRow ChoosePixels() {
 
 // Gray values (or cells) of edge row y from source rows y - 1, y and y + 1, a stretch at a
 // time; the border rows and columns repeat their inner neighbours, and so do their gray values.
-void EdgeRowLevels(LevelStretch stretch, const TBitmap32& source, int y, int level,
+void EdgeRowLevels(LevelStretch stretch, const Bitmap32& source, int y, int level,
                    std::uint8_t* out) {
   const int w = source.Width();
   y = std::clamp(y, 1, source.Height() - 2);
@@ -458,22 +458,22 @@ void EdgeRowLevels(LevelStretch stretch, const TBitmap32& source, int y, int lev
 
 }  // namespace
 
-void GrayEdgeCells(const TBitmap32& source, int y, int level, std::uint8_t* cells) {
+void GrayEdgeCells(const Bitmap32& source, int y, int level, std::uint8_t* cells) {
   // Gray values are bytes: none is above 255, all are above -1.
   EdgeRowLevels(ChooseCells(), source, y, std::clamp(level, -1, 255), cells);
 }
 
-void GrayEdgeRow(const TBitmap32& source, int y, std::uint8_t* gray) {
+void GrayEdgeRow(const Bitmap32& source, int y, std::uint8_t* gray) {
   EdgeRowLevels(ChooseLevels(), source, y, 0, gray);
 }
 
-TBitmap32 GrayEdgeLevels(const TBitmap32& source, const std::array<std::uint8_t, 256>& levels) {
+Bitmap32 GrayEdgeLevels(const Bitmap32& source, const std::array<std::uint8_t, 256>& levels) {
   const int w = source.Width();
   const int h = source.Height();
   if (w < 3 || h < 3) {
     // No interior pixel: the border rules alone, the plain way.
-    TBitmap32 edges = source;
-    picsobel(edges);
+    Bitmap32 edges = source;
+    InvertedSobelEdges(edges);
     for (int y = 0; y < h; ++y) {
       Pixel* p = edges.ScanLine(y);
       for (int x = 0; x < w; ++x) {
@@ -489,7 +489,7 @@ TBitmap32 GrayEdgeLevels(const TBitmap32& source, const std::array<std::uint8_t,
   for (int v = 0; v < 256; ++v)
     pixelOf[v] = 0xFF000000u | 0x010101u * levels[static_cast<std::size_t>(v)];
 
-  TBitmap32 out = TBitmap32::ForOverwrite(w, h);
+  Bitmap32 out = Bitmap32::ForOverwrite(w, h);
   ParallelRowRuns(0, h, static_cast<std::size_t>(w) * 12, [&](int y0, int y1) {
     std::vector<std::uint8_t> level(static_cast<std::size_t>(w));
     for (int y = y0; y < y1; ++y) {

@@ -43,7 +43,7 @@ int RotationCentre(int side) {
   return Round(static_cast<Extended>(side) / 2);
 }
 
-std::optional<TBitmap32> RotatePicture(const TBitmap32& source, int cx, int cy, QuarterTurn turn) {
+std::optional<Bitmap32> RotatePicture(const Bitmap32& source, int cx, int cy, QuarterTurn turn) {
   const Index w = source.Width();
   const Index h = source.Height();
   if (w < 1 || h < 1) return std::nullopt;
@@ -111,9 +111,9 @@ std::optional<TBitmap32> RotatePicture(const TBitmap32& source, int cx, int cy, 
   const Index outW = canvasW - 2 * left;
   const Index outH = canvasH - 2 * top;
   if (outW < 1 || outH < 1) return std::nullopt;
-  if (outW * outH > TBitmap32::kMaxPixels)
+  if (outW * outH > Bitmap32::kMaxPixels)
     throw std::length_error("The turned picture would be too large");
-  TBitmap32 result(static_cast<int>(outW), static_cast<int>(outH), kRotationFill);
+  Bitmap32 result(static_cast<int>(outW), static_cast<int>(outH), kRotationFill);
 
   // Result pixel (x, y) is canvas pixel (left + x, top + y): source (u0 + su y, v0 + sv x).
   const Index u0 = ou + su * top;

@@ -27,8 +27,8 @@ inline constexpr Pixel kRotationFill{216, 233, 236, 0};
 //   top rows at the top and at the bottom.
 // Neither canvas is built: the result is copied straight from source. Returns nothing when the
 // trimmed size is below one pixel in either direction (a picture only a few pixels high or
-// wide). Throws std::length_error when the result would exceed TBitmap32::kMaxPixels.
-std::optional<TBitmap32> RotatePicture(const TBitmap32& source, int cx, int cy, QuarterTurn turn);
+// wide). Throws std::length_error when the result would exceed Bitmap32::kMaxPixels.
+std::optional<Bitmap32> RotatePicture(const Bitmap32& source, int cx, int cy, QuarterTurn turn);
 
 // The centre the rotation commands turn a picture about: (Round(W / 2), Round(H / 2)).
 int RotationCentre(int side);

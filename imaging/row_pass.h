@@ -13,17 +13,17 @@ namespace quillane {
 
 // A picture for a pass's result or its intermediate steps, from the kept picture memory and
 // not cleared: the pass must write every pixel.
-inline TBitmap32 ScratchPicture(int width, int height) {
-  return TBitmap32::ForOverwrite(width, height);
+inline Bitmap32 ScratchPicture(int width, int height) {
+  return Bitmap32::ForOverwrite(width, height);
 }
 
 // A new picture of in's size whose row y is written by row(in.ScanLine(y), out.ScanLine(y),
 // width, y); row must write all width pixels of out from nothing but in's rows and data that no
 // band changes. workPerPixel estimates the cost of one pixel, for the split.
 template <typename RowFunction>
-TBitmap32 MapRows(const TBitmap32& in, std::size_t workPerPixel, RowFunction&& row) {
+Bitmap32 MapRows(const Bitmap32& in, std::size_t workPerPixel, RowFunction&& row) {
   const int w = in.Width();
-  TBitmap32 out = ScratchPicture(w, in.Height());
+  Bitmap32 out = ScratchPicture(w, in.Height());
   ParallelRowRuns(0, in.Height(), static_cast<std::size_t>(w) * workPerPixel, [&](int y0, int y1) {
     for (int y = y0; y < y1; ++y) row(in.ScanLine(y), out.ScanLine(y), w, y);
   });

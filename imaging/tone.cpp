@@ -289,8 +289,8 @@ std::array<std::uint8_t, 101> LightnessContrastTable(int c) {
   return table;
 }
 
-TBitmap32 PencilContrastPass(const TBitmap32& input, int c) {
-  TBitmap32 out = input;
+Bitmap32 PencilContrastPass(const Bitmap32& input, int c) {
+  Bitmap32 out = input;
   const auto curve = LightnessContrastTable(c);
   // A gray pixel keeps hue and saturation 0, so its result depends on its level alone: one
   // table serves every gray pixel, and the edge map this pass usually gets is all gray.
@@ -336,8 +336,8 @@ std::array<std::uint8_t, 256> PencilLightingLevels(int v) {
   return levels;
 }
 
-TBitmap32 PencilLightingPass(const TBitmap32& input, int v) {
-  TBitmap32 out = input;
+Bitmap32 PencilLightingPass(const Bitmap32& input, int v) {
+  Bitmap32 out = input;
   const int w = out.Width();
   const int shift = 2 * (v - 128);
   ParallelRows(0, out.Height(), static_cast<std::size_t>(w), [&](int y0, int y1) {
@@ -346,7 +346,7 @@ TBitmap32 PencilLightingPass(const TBitmap32& input, int v) {
   return out;
 }
 
-void ConvertToGray(TBitmap32& bitmap) {
+void ConvertToGray(Bitmap32& bitmap) {
   const int w = bitmap.Width();
   ParallelRows(0, bitmap.Height(), static_cast<std::size_t>(w), [&](int y0, int y1) {
     for (int y = y0; y < y1; ++y) GrayRow(bitmap.ScanLine(y), bitmap.ScanLine(y), w, 0);
@@ -417,8 +417,8 @@ Rgb HslToRgbReference(int h, int s, int l) {
   return Rgb{c[0], c[1], c[2]};
 }
 
-TBitmap32 PencilContrastPassReference(const TBitmap32& input, int c) {
-  TBitmap32 out(input.Width(), input.Height());
+Bitmap32 PencilContrastPassReference(const Bitmap32& input, int c) {
+  Bitmap32 out(input.Width(), input.Height());
   for (int y = 0; y < input.Height(); ++y)
     for (int x = 0; x < input.Width(); ++x) {
       const Pixel p = input.At(x, y);

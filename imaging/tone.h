@@ -77,7 +77,7 @@ std::array<std::uint8_t, 101> LightnessContrastTable(int c);
 
 // Every pixel through RGB to HSL, the lightness contrast curve with c, and back; alpha 255.
 // The input is not changed.
-TBitmap32 PencilContrastPass(const TBitmap32& input, int c);
+Bitmap32 PencilContrastPass(const Bitmap32& input, int c);
 
 // What PencilContrastPass makes of each gray level (R = G = B = index): a gray level again.
 std::array<std::uint8_t, 256> PencilContrastGrayLevels(int c);
@@ -88,14 +88,14 @@ std::array<std::uint8_t, 256> PencilLightingLevels(int v);
 
 // PencilContrastPass pixel by pixel through the reference conversions and LightnessContrast;
 // the oracle that the fast pass must equal.
-TBitmap32 PencilContrastPassReference(const TBitmap32& input, int c);
+Bitmap32 PencilContrastPassReference(const Bitmap32& input, int c);
 
 // Every pixel becomes its gray value plus 2 (v - 128), limited to 0..255, in B, G and R;
 // alpha 255. The input is not changed.
-TBitmap32 PencilLightingPass(const TBitmap32& input, int v);
+Bitmap32 PencilLightingPass(const Bitmap32& input, int v);
 
 // Writes each pixel's gray value into B, G and R and 255 into alpha.
-void ConvertToGray(TBitmap32& bitmap);
+void ConvertToGray(Bitmap32& bitmap);
 
 // GrayValue of a colour whose weighted sum is an exact half (30 R + 59 G + 11 B ends in 50),
 // where only the extended-precision sum's own rounding decides; from a table.

@@ -17,7 +17,7 @@ int main(int argc, char* argv[]) {
   QApplication app(argc, argv);
   const QString out = argc > 1 ? QString::fromLocal8Bit(argv[1]) : "quillane.png";
   quillane::QtPlatformServices platform;
-  quillane::TMyPicture window(platform);
+  quillane::MainWindow window(platform);
   quillane::CreateToolWindows(window);
   window.show();
   // The tool window to show (1 unless a number follows the file name), its batch panel open
@@ -25,9 +25,9 @@ int main(int argc, char* argv[]) {
   const int tool = argc > 2 ? std::atoi(argv[2]) : 1;
   window.OpenTool(tool);
   if (quillane::ToolWindow* open = window.ToolWindowAt(tool)) {
-    open->SpeedButton1Click();
-    open->ApplyClick();
-    if (argc > 3 && QString(argv[3]) == "colorup") open->ColorUpClick();
+    open->OnOpen();
+    open->ApplyShown();
+    if (argc > 3 && QString(argv[3]) == "colorup") open->OpenColorUp();
   }
   QTimer::singleShot(700, [&] {
     const QPixmap screen = QApplication::primaryScreen()->grabWindow(0);

@@ -23,8 +23,8 @@
 
 namespace {
 
+using quillane::Bitmap32;
 using quillane::Pixel;
-using quillane::TBitmap32;
 
 constexpr int kWidth = 521;
 constexpr int kHeight = 346;
@@ -668,11 +668,11 @@ void Draw(Canvas& cv) {
   DrawTree(cv, 506, 330, 52, 407);
 }
 
-TBitmap32 Render() {
+Bitmap32 Render() {
   Canvas cv;
   Draw(cv);
   const std::vector<Colour> px = cv.Resolve();
-  TBitmap32 out(kWidth, kHeight);
+  Bitmap32 out(kWidth, kHeight);
   for (int y = 0; y < kHeight; ++y) {
     Pixel* row = out.ScanLine(y);
     for (int x = 0; x < kWidth; ++x) {
@@ -702,7 +702,7 @@ void PutLe(std::vector<std::uint8_t>& out, std::uint32_t v, int bytes) {
 }
 
 // A 24-bit bottom-up BMP with the usual 40-byte header, rows padded to four bytes.
-std::vector<std::uint8_t> EncodeBmp24(const TBitmap32& b) {
+std::vector<std::uint8_t> EncodeBmp24(const Bitmap32& b) {
   const std::uint32_t stride = (static_cast<std::uint32_t>(b.Width()) * 3 + 3) & ~3U;
   const std::uint32_t imageSize = stride * static_cast<std::uint32_t>(b.Height());
   std::vector<std::uint8_t> out;
@@ -741,7 +741,7 @@ bool WriteFile(const std::string& path, const std::vector<std::uint8_t>& bytes) 
   return static_cast<bool>(f);
 }
 
-std::vector<std::uint8_t> EncodePpm(const TBitmap32& b) {
+std::vector<std::uint8_t> EncodePpm(const Bitmap32& b) {
   const std::string head =
       "P6\n" + std::to_string(b.Width()) + " " + std::to_string(b.Height()) + "\n255\n";
   std::vector<std::uint8_t> out(head.begin(), head.end());
@@ -762,7 +762,7 @@ int main(int argc, char** argv) {
     std::cerr << "usage: make_startup_picture <out.bmp> [preview.ppm]\n";
     return 2;
   }
-  const TBitmap32 picture = Render();
+  const Bitmap32 picture = Render();
   if (!WriteFile(argv[1], EncodeBmp24(picture))) {
     std::cerr << "cannot write " << argv[1] << "\n";
     return 1;

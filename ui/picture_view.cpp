@@ -5,7 +5,7 @@
 
 namespace quillane {
 
-QImage OpaqueImage(const TBitmap32& picture) {
+QImage OpaqueImage(const Bitmap32& picture) {
   if (picture.Empty()) return QImage();
   // Pixels are B, G, R, A in memory, which is what Format_RGB32 reads on a little-endian
   // machine; that format also ignores the fourth byte.
@@ -20,7 +20,7 @@ PictureView::PictureView(QWidget* parent) : QWidget(parent) {
   setAttribute(Qt::WA_OpaquePaintEvent);
 }
 
-void PictureView::SetPicture(const TBitmap32& picture) {
+void PictureView::SetPicture(const Bitmap32& picture) {
   image_ = OpaqueImage(picture);
   update();
 }

@@ -16,7 +16,7 @@ class PictureView : public QWidget {
   explicit PictureView(QWidget* parent = nullptr);
 
   // Takes a copy of picture; the control's size is left to the caller.
-  void SetPicture(const TBitmap32& picture);
+  void SetPicture(const Bitmap32& picture);
   // Size of the picture (not of the control).
   QSize PictureSize() const { return image_.size(); }
   const QImage& Image() const { return image_; }
@@ -29,6 +29,6 @@ class PictureView : public QWidget {
 };
 
 // The picture as a QImage that ignores alpha, sharing nothing with picture.
-QImage OpaqueImage(const TBitmap32& picture);
+QImage OpaqueImage(const Bitmap32& picture);
 
 }  // namespace quillane

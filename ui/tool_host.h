@@ -32,7 +32,7 @@ class ToolHost {
                            bool recordHistory) = 0;
   // For a window that computed its result itself (a preview it kept): the working picture
   // becomes picture and is shown, with a history step if asked.
-  virtual void SetWorkingPicture(TBitmap32 picture, bool recordHistory) = 0;
+  virtual void SetWorkingPicture(Bitmap32 picture, bool recordHistory) = 0;
 
   virtual void SetStatusText(const QString& text) = 0;
   // The freehand windows keep the main window disabled while they are open.
@@ -45,15 +45,15 @@ class ToolHost {
   // folder's pictures).
   virtual QString InputFolder() const = 0;
   virtual QString OutputFolder() const = 0;
-  virtual void OpenDir() = 0;
-  virtual void OpenDir2() = 0;
+  virtual void ChooseInputFolder() = 0;
+  virtual void ChooseOutputFolder() = 0;
   // The Convert button: effect with params over every listed file of the folder typed in
   // inputField into the one typed in outputField; afterEffect runs after each picture's
-  // effect. Messages are shown here; the completion dialog is left to ShowBatchConvertOk.
+  // effect. Messages are shown here; the completion dialog is left to ShowBatchDone.
   virtual BatchResult ConvertBatchFolder(const EffectSpec& effect, const EffectParams& params,
                                          const QString& inputField, const QString& outputField,
                                          const std::function<void()>& afterEffect) = 0;
-  virtual void ShowBatchConvertOk() = 0;
+  virtual void ShowBatchDone() = 0;
 
   // The arrows the batch toggles show.
   virtual QIcon DownArrowIcon() const = 0;

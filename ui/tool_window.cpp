@@ -31,7 +31,7 @@ ToolWindow::ToolWindow(const EffectSpec& spec, ToolHost& host, QWidget* parent)
               Qt::Tool | Qt::CustomizeWindowHint | Qt::WindowTitleHint | Qt::WindowCloseButtonHint),
       spec_(spec),
       host_(host) {
-  setObjectName(QString::fromStdString(spec.windowClass));
+  setObjectName(QString::fromStdString(spec.windowObjectName));
   setWindowTitle(QString::fromStdString(spec.caption));
 
   auto* outer = new QVBoxLayout(this);
@@ -71,7 +71,7 @@ void ToolWindow::BuildButtonRow(QBoxLayout* outer) {
     batchToggle_->setIcon(host_.DownArrowIcon());
     batchToggle_->setIconSize(QSize(16, 16));
     batchToggle_->setToolTip("Show batch convert");
-    connect(batchToggle_, &QToolButton::clicked, this, &ToolWindow::SpeedButton1Click);
+    connect(batchToggle_, &QToolButton::clicked, this, &ToolWindow::ToggleBatchPanel);
     row->addWidget(batchToggle_);
   }
   row->addStretch(1);
@@ -84,7 +84,7 @@ void ToolWindow::BuildButtonRow(QBoxLayout* outer) {
     colorUp_->setIconSize(QSize(16, 16));
     colorUp_->setToolButtonStyle(Qt::ToolButtonTextBesideIcon);
     colorUp_->setEnabled(false);
-    connect(colorUp_, &QToolButton::clicked, this, &ToolWindow::ColorUpClick);
+    connect(colorUp_, &QToolButton::clicked, this, &ToolWindow::OpenColorUp);
     row->addWidget(colorUp_);
   }
   auto addButton = [&](const ButtonSpec& b, void (ToolWindow::*click)()) {
@@ -95,29 +95,29 @@ void ToolWindow::BuildButtonRow(QBoxLayout* outer) {
     connect(button, &QPushButton::clicked, this, click);
     row->addWidget(button);
   };
-  if (!spec_.apply.objectName.empty()) addButton(spec_.apply, &ToolWindow::ApplyClick);
+  if (!spec_.apply.objectName.empty()) addButton(spec_.apply, &ToolWindow::ApplyShown);
   if (!spec_.restoreDefaults.objectName.empty())
-    addButton(spec_.restoreDefaults, &ToolWindow::RestoreDefaultsClick);
+    addButton(spec_.restoreDefaults, &ToolWindow::RestoreDefaultsAndApply);
   outer->addLayout(row);
 }
 
 void ToolWindow::BuildBatchPanel(QBoxLayout* outer) {
-  panel2_ = new QFrame(this);
-  panel2_->setObjectName("Panel2");
-  panel2_->setFrameShape(QFrame::StyledPanel);
-  panel2_->setFixedHeight(spec_.expandedHeight - spec_.collapsedHeight);
-  auto* grid = new QGridLayout(panel2_);
+  batchPanel_ = new QFrame(this);
+  batchPanel_->setObjectName("Panel2");
+  batchPanel_->setFrameShape(QFrame::StyledPanel);
+  batchPanel_->setFixedHeight(spec_.expandedHeight - spec_.collapsedHeight);
+  auto* grid = new QGridLayout(batchPanel_);
   grid->setContentsMargins(10, 6, 10, 6);
   grid->setHorizontalSpacing(6);
   grid->setVerticalSpacing(4);
 
   auto addRow = [&](int row, const char* labelName, const char* caption, const char* editName,
                     const char* buttonName) {
-    auto* label = new QLabel(caption, panel2_);
+    auto* label = new QLabel(caption, batchPanel_);
     label->setObjectName(labelName);
-    auto* edit = new QLineEdit(panel2_);
+    auto* edit = new QLineEdit(batchPanel_);
     edit->setObjectName(editName);
-    auto* browse = new QToolButton(panel2_);
+    auto* browse = new QToolButton(batchPanel_);
     browse->setObjectName(buttonName);
     browse->setText("Browse");
     grid->addWidget(label, row, 0);
@@ -133,18 +133,18 @@ void ToolWindow::BuildBatchPanel(QBoxLayout* outer) {
   // A long folder does not fit the field; its tooltip shows the whole of it.
   for (QLineEdit* field : {input, output})
     connect(field, &QLineEdit::textChanged, field, &QLineEdit::setToolTip);
-  connect(browseIn, &QToolButton::clicked, this, &ToolWindow::SpeedButton2Click);
-  connect(browseOut, &QToolButton::clicked, this, &ToolWindow::SpeedButton3Click);
+  connect(browseIn, &QToolButton::clicked, this, &ToolWindow::BrowseInputFolder);
+  connect(browseOut, &QToolButton::clicked, this, &ToolWindow::BrowseOutputFolder);
 
-  auto* convert = new QToolButton(panel2_);
+  auto* convert = new QToolButton(batchPanel_);
   convert->setObjectName("SpeedButton4");
   convert->setText("Convert");
   convert->setSizePolicy(QSizePolicy::Preferred, QSizePolicy::Expanding);
   grid->addWidget(convert, 0, 3, 2, 1);
-  connect(convert, &QToolButton::clicked, this, &ToolWindow::SpeedButton4Click);
+  connect(convert, &QToolButton::clicked, this, &ToolWindow::ConvertBatch);
 
-  panel2_->hide();
-  outer->addWidget(panel2_);
+  batchPanel_->hide();
+  outer->addWidget(batchPanel_);
 }
 
 void ToolWindow::SetWindowHeights(int collapsed, int expanded) {
@@ -212,7 +212,7 @@ QWidget* ToolWindow::TakeControl(const QString& name) {
 void ToolWindow::showEvent(QShowEvent* event) {
   QWidget::showEvent(event);
   // Only the program's own show counts, not the window system restoring the window.
-  if (!event->spontaneous()) FormShow();
+  if (!event->spontaneous()) OnShown();
 }
 
 void ToolWindow::keyPressEvent(QKeyEvent* event) {
@@ -236,11 +236,11 @@ void ToolWindow::keyPressEvent(QKeyEvent* event) {
 }
 
 void ToolWindow::closeEvent(QCloseEvent* event) {
-  FormClose();
+  OnClosed();
   QWidget::closeEvent(event);
 }
 
-void ToolWindow::FormShow() {
+void ToolWindow::OnShown() {
   host_.SetActiveTool(Number());
   for (const ParamSpec& param : spec_.params)
     if (param.resetOnShow) SetParam(param.name, DefaultValue(param));
@@ -249,7 +249,7 @@ void ToolWindow::FormShow() {
   if (colorUp_ != nullptr) colorUp_->setEnabled(false);
 }
 
-void ToolWindow::FormClose() {
+void ToolWindow::OnClosed() {
   host_.SetActiveTool(0);
 }
 
@@ -270,50 +270,50 @@ void ToolWindow::AfterEffect() {
   AfterApply();
 }
 
-void ToolWindow::ApplyClick() {
+void ToolWindow::ApplyShown() {
   Apply(true);
 }
 
-void ToolWindow::RestoreDefaultsClick() {
+void ToolWindow::RestoreDefaultsAndApply() {
   for (const ParamSpec& param : spec_.params) SetParam(param.name, DefaultValue(param));
   Apply(true);
 }
 
-void ToolWindow::ColorUpClick() {
+void ToolWindow::OpenColorUp() {
   emit colorUpRequested();
 }
 
 bool ToolWindow::BatchPanelShown() const {
-  return panel2_ != nullptr && !panel2_->isHidden();
+  return batchPanel_ != nullptr && !batchPanel_->isHidden();
 }
 
-void ToolWindow::SpeedButton1Click() {
-  if (panel2_ == nullptr) return;
-  if (panel2_->isHidden()) {
+void ToolWindow::ToggleBatchPanel() {
+  if (batchPanel_ == nullptr) return;
+  if (batchPanel_->isHidden()) {
     setFixedHeight(expandedHeight_);
-    panel2_->show();
+    batchPanel_->show();
     batchToggle_->setIcon(host_.UpArrowIcon());
     batchToggle_->setToolTip("Hide batch convert");
   } else {
-    panel2_->hide();
+    batchPanel_->hide();
     setFixedHeight(collapsedHeight_);
     batchToggle_->setIcon(host_.DownArrowIcon());
     batchToggle_->setToolTip("Show batch convert");
   }
 }
 
-void ToolWindow::SpeedButton2Click() {
-  host_.OpenDir();
+void ToolWindow::BrowseInputFolder() {
+  host_.ChooseInputFolder();
   // Refreshed even after a cancel: the shared folder may have been chosen in another window.
   if (inputField_ != nullptr) inputField_->setText(host_.InputFolder());
 }
 
-void ToolWindow::SpeedButton3Click() {
-  host_.OpenDir2();
+void ToolWindow::BrowseOutputFolder() {
+  host_.ChooseOutputFolder();
   if (outputField_ != nullptr) outputField_->setText(host_.OutputFolder());
 }
 
-void ToolWindow::SpeedButton4Click() {
+void ToolWindow::ConvertBatch() {
   if (inputField_ == nullptr || outputField_ == nullptr || !spec_.routine) return;
   // The window's own first step may change a setting ("For current" is cleared).
   BeforeBatch();
@@ -326,7 +326,7 @@ void ToolWindow::SpeedButton4Click() {
       spec_, *params, inputField_->text(), outputField_->text(), [this] { AfterEffect(); });
   if (result.end != BatchResult::End::Completed) return;
   AfterBatch(result);
-  host_.ShowBatchConvertOk();
+  host_.ShowBatchDone();
 }
 
 }  // namespace quillane

@@ -52,13 +52,13 @@ class ToolWindow : public QWidget {
 
  public slots:
   // The apply button (OK, or "Convert" in the kernel windows).
-  virtual void ApplyClick();
-  void RestoreDefaultsClick();  // "Default": every parameter back to its default, then apply
-  void ColorUpClick();          // "Color up"
-  void SpeedButton1Click();     // show or hide the batch panel
-  void SpeedButton2Click();     // Browse for the input folder
-  void SpeedButton3Click();     // Browse for the output folder
-  void SpeedButton4Click();     // Convert
+  virtual void ApplyShown();
+  void RestoreDefaultsAndApply();  // "Default": every parameter back to its default, then apply
+  void OpenColorUp();              // "Color up"
+  void ToggleBatchPanel();
+  void BrowseInputFolder();
+  void BrowseOutputFolder();
+  void ConvertBatch();
 
  signals:
   // "Color up" was pressed: the freehand painting windows take over the working picture.
@@ -66,8 +66,8 @@ class ToolWindow : public QWidget {
 
  protected:
   // What showing and closing the window do; subclasses call the base version first.
-  virtual void FormShow();
-  virtual void FormClose();
+  virtual void OnShown();
+  virtual void OnClosed();
   // After a successful apply (OK or each picture of a batch), once the document has the result.
   virtual void AfterApply() {}
   // Convert's own steps for the windows that have some: before anything else (even before the
@@ -109,7 +109,7 @@ class ToolWindow : public QWidget {
   QVBoxLayout* controlsLayout_ = nullptr;
   QToolButton* colorUp_ = nullptr;
   QToolButton* batchToggle_ = nullptr;
-  QFrame* panel2_ = nullptr;
+  QFrame* batchPanel_ = nullptr;
   QLineEdit* inputField_ = nullptr;
   QLineEdit* outputField_ = nullptr;
 };

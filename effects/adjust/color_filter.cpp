@@ -23,15 +23,15 @@ std::uint32_t Raised(ColorFilterKind kind) {
 
 }  // namespace
 
-TBitmap32 filter(const TBitmap32& base, ColorFilterKind kind) {
+Bitmap32 ColorFilter(const Bitmap32& base, ColorFilterKind kind) {
   const std::uint32_t set = Raised(kind);
   return MapRows(base, 1,
                  [set](const Pixel* in, Pixel* out, int w, int) { GrayRowInto(in, out, w, set); });
 }
 
-TBitmap32 FilterReference(const TBitmap32& base, ColorFilterKind kind) {
+Bitmap32 FilterReference(const Bitmap32& base, ColorFilterKind kind) {
   const std::uint32_t set = Raised(kind);
-  TBitmap32 out = base;
+  Bitmap32 out = base;
   const int w = out.Width();
   for (int y = 0; y < out.Height(); ++y) {
     Pixel* row = out.ScanLine(y);
@@ -44,12 +44,11 @@ TBitmap32 FilterReference(const TBitmap32& base, ColorFilterKind kind) {
 
 const EffectSpec& ColorFilterEffect() {
   static const EffectSpec entry{
-      .toolNumber = 16,
       .menu = EffectMenu::Adjust,
       .menuPosition = 3,
       .menuEntry = "Color Filter",
-      .menuHandler = "ColorFilter2Click",
-      .windowClass = "TColor_Filter",
+      .menuObjectName = "ColorFilter2",
+      .windowObjectName = "TColor_Filter",
       .caption = "Color_Filter",
       .statusText = "Color Filter",
       .cliName = "color-filter",
@@ -73,10 +72,14 @@ const EffectSpec& ColorFilterEffect() {
                .help = "1: filter the picture as shown; 0: the source",
                .resetOnShow = true},
           },
+      .reference = {.hash = 0xdadfc27f50184b9b,
+                    .topLeft = 0x4d4dff,
+                    .centre = 0x9393ff,
+                    .bottomRight = 0x3d3dff},
       .routine =
           [](const EffectInput& in) {
-            return filter(in.params.GetInt("for-current") != 0 ? in.working : in.source,
-                          static_cast<ColorFilterKind>(in.params.GetInt("filter")));
+            return ColorFilter(in.params.GetInt("for-current") != 0 ? in.working : in.source,
+                               static_cast<ColorFilterKind>(in.params.GetInt("filter")));
           },
   };
   return entry;

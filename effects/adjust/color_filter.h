@@ -11,9 +11,9 @@ enum class ColorFilterKind { Red = 1, Green, Blue, Yellow, Cyan, Purple };
 // Every pixel of a copy of base becomes its gray value (Round(0.3 R + 0.59 G + 0.11 B),
 // extended precision, halves to even) in all three channels, then the filter's channels
 // become 255: red; green; blue; red and green; green and blue; red and blue. Alpha 255.
-TBitmap32 filter(const TBitmap32& base, ColorFilterKind kind);
+Bitmap32 ColorFilter(const Bitmap32& base, ColorFilterKind kind);
 
 // The same made the plain way, row by row in place on a copy: what filter must equal.
-TBitmap32 FilterReference(const TBitmap32& base, ColorFilterKind kind);
+Bitmap32 FilterReference(const Bitmap32& base, ColorFilterKind kind);
 
 }  // namespace quillane

@@ -61,9 +61,9 @@ struct Cuts {
 };
 
 template <typename RowZones>
-TBitmap32 ZonedReference(const TBitmap32& source, const Tint* tints, RowZones rowZones) {
+Bitmap32 ZonedReference(const Bitmap32& source, const Tint* tints, RowZones rowZones) {
   const int w = source.Width(), h = source.Height();
-  TBitmap32 out(w, h);
+  Bitmap32 out(w, h);
   if (h > 0)
     std::memcpy(out.ScanLine(0), source.ScanLine(0), sizeof(Pixel) * static_cast<std::size_t>(w));
   for (int y = 1; y < h; ++y) {
@@ -77,7 +77,7 @@ TBitmap32 ZonedReference(const TBitmap32& source, const Tint* tints, RowZones ro
 }
 
 template <std::size_t kZones, typename RowZones>
-TBitmap32 Zoned(const TBitmap32& source, const Tint (&tints)[kZones], RowZones rowZones) {
+Bitmap32 Zoned(const Bitmap32& source, const Tint (&tints)[kZones], RowZones rowZones) {
   ChannelTint channelTints[kZones];
   for (std::size_t i = 0; i < kZones; ++i) channelTints[i] = ChannelTintOf(tints[i]);
   return MapRows(source, 1, [&](const Pixel* in, Pixel* row, int w, int y) {
@@ -122,10 +122,10 @@ std::int64_t Floor(Extended v) {
   return static_cast<std::int64_t>(std::floor(v));
 }
 
-TBitmap32 Panel2x2Reference(const TBitmap32& source) {
-  TBitmap32 base = source;
-  TBitmap32 small = source;
-  ZoomInandOut(small, 0.5L, 0.5L);
+Bitmap32 Panel2x2Reference(const Bitmap32& source) {
+  Bitmap32 base = source;
+  Bitmap32 small = source;
+  ResampleNearest(small, 0.5L, 0.5L);
   const int w = small.Width(), h = small.Height();
   const auto put = [](Pixel& target, Pixel p, const Tint& t) {
     const Pixel q = Tinted(p, t);
@@ -149,10 +149,10 @@ TBitmap32 Panel2x2Reference(const TBitmap32& source) {
 // (x W div w, y H div h) = (2x, 2y): with W = 2w + e (e 0 or 1) and x < w, x W div w is
 // 2x + e x div w = 2x. So each band reads it straight from the source's even rows, and makes
 // the top and the bottom row that share one together.
-TBitmap32 Panel2x2(const TBitmap32& source) {
+Bitmap32 Panel2x2(const Bitmap32& source) {
   const int width = source.Width(), height = source.Height();
   const int w = width / 2, h = height / 2;
-  TBitmap32 out = ScratchPicture(width, height);
+  Bitmap32 out = ScratchPicture(width, height);
   const auto copyRow = [&](int y) {
     std::memcpy(out.ScanLine(y), source.ScanLine(y),
                 sizeof(Pixel) * static_cast<std::size_t>(width));
@@ -196,12 +196,12 @@ constexpr Tint kTiles[3][3] = {
      {.addR = 80, .addG = 80, .clear = kBlue}},
 };
 
-TBitmap32 Panel3x3Reference(const TBitmap32& source) {
-  TBitmap32 small = source;
-  ZoomInandOut(small, 1.0L / 3, 1.0L / 3);
-  if (small.Empty()) return TBitmap32();
+Bitmap32 Panel3x3Reference(const Bitmap32& source) {
+  Bitmap32 small = source;
+  ResampleNearest(small, 1.0L / 3, 1.0L / 3);
+  if (small.Empty()) return Bitmap32();
   const int w = small.Width(), h = small.Height();
-  TBitmap32 out(3 * w, 3 * h);
+  Bitmap32 out(3 * w, 3 * h);
   for (int y = 0; y < 3 * h; ++y) {
     const Pixel* s = small.ScanLine(y % h);
     Pixel* row = out.ScanLine(y);
@@ -216,13 +216,13 @@ TBitmap32 Panel3x3Reference(const TBitmap32& source) {
 }
 
 // The third-size copy is not made: each of its rows is picked from the source row it comes
-// from, as ZoomInandOut would, into a buffer that the nine tiles' rows are tinted from.
-TBitmap32 Panel3x3(const TBitmap32& source) {
+// from, as ResampleNearest would, into a buffer that the nine tiles' rows are tinted from.
+Bitmap32 Panel3x3(const Bitmap32& source) {
   const int width = source.Width(), height = source.Height();
-  // The size exactly as ZoomInandOut computes it.
+  // The size exactly as ResampleNearest computes it.
   const Extended nw = static_cast<Extended>(width) * (1.0L / 3);
   const Extended nh = static_cast<Extended>(height) * (1.0L / 3);
-  if (width == 0 || !(nw >= 1.0L) || !(nh >= 1.0L)) return TBitmap32();
+  if (width == 0 || !(nw >= 1.0L) || !(nh >= 1.0L)) return Bitmap32();
   const int w = Trunc(nw), h = Trunc(nh);
   std::vector<int> column(static_cast<std::size_t>(w));
   for (int x = 0; x < w; ++x)
@@ -234,7 +234,7 @@ TBitmap32 Panel3x3(const TBitmap32& source) {
       tiles[r][c] = ChannelTintOf(kTiles[r][c]);
       tiles[r][c].clear |= 0xFF000000u;
     }
-  TBitmap32 out = ScratchPicture(3 * w, 3 * h);
+  Bitmap32 out = ScratchPicture(3 * w, 3 * h);
   // Each row of the small copy makes one row in each row of tiles.
   ParallelRows(0, h, 9 * static_cast<std::size_t>(w), [&](int y0, int y1) {
     std::vector<Pixel> small(static_cast<std::size_t>(w));
@@ -349,7 +349,7 @@ auto Catercorner16Zones(int w, int h) {
 
 }  // namespace
 
-TBitmap32 ColorPanel(const TBitmap32& source, PanelLayout layout) {
+Bitmap32 ColorPanel(const Bitmap32& source, PanelLayout layout) {
   const int w = source.Width(), h = source.Height();
   switch (layout) {
     case PanelLayout::Panel2x2:
@@ -368,7 +368,7 @@ TBitmap32 ColorPanel(const TBitmap32& source, PanelLayout layout) {
   return source;
 }
 
-TBitmap32 ColorPanelReference(const TBitmap32& source, PanelLayout layout) {
+Bitmap32 ColorPanelReference(const Bitmap32& source, PanelLayout layout) {
   const int w = source.Width(), h = source.Height();
   switch (layout) {
     case PanelLayout::Panel2x2:
@@ -389,12 +389,11 @@ TBitmap32 ColorPanelReference(const TBitmap32& source, PanelLayout layout) {
 
 const EffectSpec& ColorPanelEffect() {
   static const EffectSpec entry{
-      .toolNumber = 13,
       .menu = EffectMenu::Adjust,
       .menuPosition = 1,
       .menuEntry = "Color panel",
-      .menuHandler = "Colorpanel1Click",
-      .windowClass = "TColor_Panel",
+      .menuObjectName = "Colorpanel1",
+      .windowObjectName = "TColor_Panel",
       .caption = "Color_Panel",
       .statusText = "Color Panels",
       .cliName = "color-panel",
@@ -413,6 +412,10 @@ const EffectSpec& ColorPanelEffect() {
                            {"catercorner-16", "Catercorner (16)", "RadioButton6", ""}},
                .help = "how the picture is divided into tinted zones"},
           },
+      .reference = {.hash = 0x0bcdb3260dab7c46,
+                    .topLeft = 0x88522e,
+                    .centre = 0x97968c,
+                    .bottomRight = 0x1c4930},
       .routine =
           [](const EffectInput& in) {
             return ColorPanel(in.source, static_cast<PanelLayout>(in.params.GetInt("layout")));

@@ -19,9 +19,9 @@ enum class PanelLayout {
 // blue = 255; D red = 255, blue = 255.
 //
 // Panel2x2: the source with its four quadrants overwritten (colour only) by a half-size copy
-//   (ZoomInandOut 0.5, w = W div 2, h = H div 2) flooded A (top left), B (top right),
+//   (ResampleNearest 0.5, w = W div 2, h = H div 2) flooded A (top left), B (top right),
 //   C (bottom left), D (bottom right), skipping each copy's first row and column; W x H.
-// Panel3x3: a third-size copy (ZoomInandOut by 1/3 in extended precision: w = W div 3,
+// Panel3x3: a third-size copy (ResampleNearest by 1/3 in extended precision: w = W div 3,
 //   h = H div 3) tiled 3 x 3 with each tile tinted its own way; 3w x 3h with alpha 0 (empty
 //   when W or H is below 3).
 // Pane2x2: floods A, C (top), B, D (bottom) on the quadrants split at x < W/2, y < H/2.
@@ -31,10 +31,10 @@ enum class PanelLayout {
 //   x >= W (H - y) / H.
 // Catercorner16: the same inside each quadrant (top where y <= H/2, left where x <= W/2).
 // Every layout but Panel3x3 keeps row 0 and column 0 of the source.
-TBitmap32 ColorPanel(const TBitmap32& source, PanelLayout layout);
+Bitmap32 ColorPanel(const Bitmap32& source, PanelLayout layout);
 
 // The same made the plain way, pixel by pixel through the half- and third-size copies: what
 // ColorPanel must equal.
-TBitmap32 ColorPanelReference(const TBitmap32& source, PanelLayout layout);
+Bitmap32 ColorPanelReference(const Bitmap32& source, PanelLayout layout);
 
 }  // namespace quillane

@@ -11,7 +11,7 @@ namespace quillane {
 namespace {
 
 // The raise of each channel, 10 per click of a swatch naming it, capped where any byte is full.
-TBitmap32 Raised(const TBitmap32& picture, int red, int green, int blue) {
+Bitmap32 Raised(const Bitmap32& picture, int red, int green, int blue) {
   std::array<std::array<std::uint8_t, 256>, 3> up{};  // b, g, r
   const int raise[3] = {std::min(blue, 255), std::min(green, 255), std::min(red, 255)};
   for (int c = 0; c < 3; ++c)
@@ -33,12 +33,12 @@ bool Names(int swatch, int channel) {  // channel 0 red, 1 green, 2 blue
 
 }  // namespace
 
-TBitmap32 variety(const TBitmap32& picture, int swatch) {
+Bitmap32 variety(const Bitmap32& picture, int swatch) {
   return Raised(picture, Names(swatch, 0) ? 10 : 0, Names(swatch, 1) ? 10 : 0,
                 Names(swatch, 2) ? 10 : 0);
 }
 
-TBitmap32 VarietyClicks(const TBitmap32& base, const std::vector<std::int64_t>& clicks) {
+Bitmap32 VarietyClicks(const Bitmap32& base, const std::vector<std::int64_t>& clicks) {
   if (clicks.empty()) return base;
   int raise[3] = {0, 0, 0};
   for (const std::int64_t click : clicks)
@@ -49,12 +49,11 @@ TBitmap32 VarietyClicks(const TBitmap32& base, const std::vector<std::int64_t>& 
 
 const EffectSpec& ColorVarietyEffect() {
   static const EffectSpec entry{
-      .toolNumber = 12,
       .menu = EffectMenu::Adjust,
       .menuPosition = 4,
       .menuEntry = "Color variety",
-      .menuHandler = "Colorvariety1Click",
-      .windowClass = "TColor_variety",
+      .menuObjectName = "Colorvariety1",
+      .windowObjectName = "TColor_variety",
       .caption = "Color_variety",
       .statusText = "Color Varied",
       .cliName = "color-variety",
@@ -77,6 +76,10 @@ const EffectSpec& ColorVarietyEffect() {
                .help = "1: start from the picture as shown; 0: the source",
                .resetOnShow = true},
           },
+      .reference = {.hash = 0x2847434fb20bf9df,
+                    .topLeft = 0x88522e,
+                    .centre = 0x97968c,
+                    .bottomRight = 0x1c4930},
       .routine =
           [](const EffectInput& in) {
             return VarietyClicks(in.params.GetInt("for-current") != 0 ? in.working : in.source,

@@ -13,10 +13,10 @@ namespace quillane {
 //
 // One click: a copy of picture with each channel of the swatch raised by 10, limited to 255;
 // alpha 255.
-TBitmap32 variety(const TBitmap32& picture, int swatch);
+Bitmap32 variety(const Bitmap32& picture, int swatch);
 
 // The clicks in order, starting from base: the same as variety click after click (the limits
 // compose), in one pass. No click gives base unchanged.
-TBitmap32 VarietyClicks(const TBitmap32& base, const std::vector<std::int64_t>& clicks);
+Bitmap32 VarietyClicks(const Bitmap32& base, const std::vector<std::int64_t>& clicks);
 
 }  // namespace quillane

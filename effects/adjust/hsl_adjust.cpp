@@ -10,7 +10,7 @@
 
 namespace quillane {
 
-TBitmap32 HslAdjust(const TBitmap32& source, int hue, int saturation, int lighting) {
+Bitmap32 HslAdjust(const Bitmap32& source, int hue, int saturation, int lighting) {
   HslChange change;
   change.hueTurn = (hue % 360 + 180) % 360;
   change.saturationShift = std::clamp(saturation, 0, 200) - 100;  // beyond, all S are 0 or 100
@@ -22,12 +22,11 @@ TBitmap32 HslAdjust(const TBitmap32& source, int hue, int saturation, int lighti
 
 const EffectSpec& HslAdjustEffect() {
   static const EffectSpec entry{
-      .toolNumber = 11,
       .menu = EffectMenu::Adjust,
       .menuPosition = 2,
       .menuEntry = "HSL adjust",
-      .menuHandler = "HSLadjust1Click",
-      .windowClass = "THSL_Adjust",
+      .menuObjectName = "HSLadjust1",
+      .windowObjectName = "THSL_Adjust",
       .caption = "HSL_Adjust",
       .statusText = "HSL Adjusted",
       .cliName = "hsl-adjust",
@@ -64,6 +63,10 @@ const EffectSpec& HslAdjustEffect() {
                .help = "lightness moved by position - 100 percent; 100 neutral",
                .resetOnShow = true},
           },
+      .reference = {.hash = 0xefd517a0fc12dbf8,
+                    .topLeft = 0x89532f,
+                    .centre = 0x97968d,
+                    .bottomRight = 0x1c4a31},
       .routine =
           [](const EffectInput& in) {
             return HslAdjust(in.source, in.params.GetInt("hue"), in.params.GetInt("saturation"),

@@ -10,6 +10,6 @@ namespace quillane {
 // 360, S' = S + saturation - 100 and L' = L + lighting - 100, both limited to 0..100, and back;
 // alpha 255. Positions: hue 0..360 (180 neutral), saturation and lighting 0..200 (100 neutral).
 // Neutral positions still shift many colours by the conversions' rounding.
-TBitmap32 HslAdjust(const TBitmap32& source, int hue, int saturation, int lighting);
+Bitmap32 HslAdjust(const Bitmap32& source, int hue, int saturation, int lighting);
 
 }  // namespace quillane

@@ -7,7 +7,7 @@
 
 namespace quillane {
 
-TBitmap32 peccilsketch(const TBitmap32& source, PencilToneMode mode, int contrast, int lighting) {
+Bitmap32 PencilSketch(const Bitmap32& source, PencilToneMode mode, int contrast, int lighting) {
   // Either tone turns each gray value of the edge map into one level: the lighting pass by
   // itself, the contrast pass because the gray copy it gets has hue and saturation 0.
   return GrayEdgeLevels(source, mode == PencilToneMode::Lighting
@@ -15,10 +15,10 @@ TBitmap32 peccilsketch(const TBitmap32& source, PencilToneMode mode, int contras
                                     : PencilContrastGrayLevels(contrast));
 }
 
-TBitmap32 PencilSketchReference(const TBitmap32& source, PencilToneMode mode, int contrast,
-                                int lighting) {
-  const TBitmap32 edges = PicsobelReference(source);
-  TBitmap32 toned = edges;
+Bitmap32 PencilSketchReference(const Bitmap32& source, PencilToneMode mode, int contrast,
+                               int lighting) {
+  const Bitmap32 edges = InvertedSobelEdgesReference(source);
+  Bitmap32 toned = edges;
   for (int y = 0; y < toned.Height(); ++y)
     for (int x = 0; x < toned.Width(); ++x) {
       Pixel& p = toned.At(x, y);
@@ -32,12 +32,11 @@ TBitmap32 PencilSketchReference(const TBitmap32& source, PencilToneMode mode, in
 
 const EffectSpec& PencilSketchEffect() {
   static const EffectSpec entry{
-      .toolNumber = 1,
       .menu = EffectMenu::Mono,
       .menuPosition = 1,
       .menuEntry = "Pencil sketch",
-      .menuHandler = "Pencilsketch1Click",
-      .windowClass = "TBack_and_White_Sketch",
+      .menuObjectName = "Pencilsketch1",
+      .windowObjectName = "TBack_and_White_Sketch",
       .caption = "Pencil_Sketch",
       .statusText = "Pencil Sketch",
       .cliName = "pencil-sketch",
@@ -79,9 +78,13 @@ const EffectSpec& PencilSketchEffect() {
                .help = "0 contrast, 1 lighting: the slider moved last",
                .resetOnShow = true},
           },
+      .reference = {.hash = 0x4673dd25e5dddaf0,
+                    .topLeft = 0xfcfcfc,
+                    .centre = 0xe6e6e6,
+                    .bottomRight = 0xffffff},
       .routine =
           [](const EffectInput& in) {
-            return peccilsketch(in.source,
+            return PencilSketch(in.source,
                                 static_cast<PencilToneMode>(in.params.GetInt("tone-mode")),
                                 in.params.GetInt("contrast"), in.params.GetInt("lighting"));
           },

@@ -14,11 +14,11 @@ enum class PencilToneMode { Contrast = 0, Lighting = 1 };
 //  Lighting: the edge map itself through the pencil lighting pass with position lighting
 //            (0..255).
 // The position of the mode not chosen is ignored. Alpha of the result is 255.
-TBitmap32 peccilsketch(const TBitmap32& source, PencilToneMode mode, int contrast, int lighting);
+Bitmap32 PencilSketch(const Bitmap32& source, PencilToneMode mode, int contrast, int lighting);
 
 // The same, step by step and pixel by pixel through the plain edge map, gray value and tone
-// pass; the oracle that peccilsketch must equal. For pictures of at least 3 by 3.
-TBitmap32 PencilSketchReference(const TBitmap32& source, PencilToneMode mode, int contrast,
-                                int lighting);
+// pass; the oracle that PencilSketch must equal. For pictures of at least 3 by 3.
+Bitmap32 PencilSketchReference(const Bitmap32& source, PencilToneMode mode, int contrast,
+                               int lighting);
 
 }  // namespace quillane

@@ -149,16 +149,16 @@ void InkThresholdCells(const Pixel* in, int count, int threshold, std::uint8_t* 
   ChooseInkCells()(in, count, std::clamp(threshold, -1, 255), cells);
 }
 
-void PictureTwoValue(TBitmap32& bitmap, int threshold) {
+void PictureTwoValue(Bitmap32& bitmap, int threshold) {
   Pixel* p = bitmap.Data();
   const std::size_t n = bitmap.PixelCount();
   for (std::size_t i = 0; i < n; ++i)
     p[i] = InkGrayValue(p[i].r, p[i].g, p[i].b) > threshold ? kPaper : kInk;
 }
 
-TBitmap32 penandink(const TBitmap32& thresholded) {
-  const TBitmap32 snapshot = thresholded;
-  TBitmap32 outline = thresholded;
+Bitmap32 OutlineDarkAreas(const Bitmap32& thresholded) {
+  const Bitmap32 snapshot = thresholded;
+  Bitmap32 outline = thresholded;
   const auto ink = [&](int x, int y) {
     const Pixel& p = snapshot.At(x, y);
     return p.b == 0 && p.g == 0 && p.r == 0;
@@ -173,7 +173,7 @@ TBitmap32 penandink(const TBitmap32& thresholded) {
   return outline;
 }
 
-void ColorValue(TBitmap32& outline, const TBitmap32& source) {
+void ColorValue(Bitmap32& outline, const Bitmap32& source) {
   for (int y = 0; y < outline.Height(); ++y)
     for (int x = 0; x < outline.Width(); ++x) {
       Pixel& p = outline.At(x, y);
@@ -183,9 +183,9 @@ void ColorValue(TBitmap32& outline, const TBitmap32& source) {
     }
 }
 
-TBitmap32 Pen_and_Ink(const TBitmap32& source, int threshold, bool colorInk) {
+Bitmap32 PenAndInk(const Bitmap32& source, int threshold, bool colorInk) {
   const int w = source.Width(), h = source.Height();
-  TBitmap32 result = ScratchPicture(w, h);
+  Bitmap32 result = ScratchPicture(w, h);
   if (result.Empty()) return result;
   threshold = std::clamp(threshold, -1, 255);
   const InkCellRow inkCells = ChooseInkCells();
@@ -218,12 +218,11 @@ TBitmap32 Pen_and_Ink(const TBitmap32& source, int threshold, bool colorInk) {
 
 const EffectSpec& PenAndInkEffect() {
   static const EffectSpec entry{
-      .toolNumber = 4,
       .menu = EffectMenu::Mono,
       .menuPosition = 4,
       .menuEntry = "Pen && Ink",
-      .menuHandler = "PenInk1Click",
-      .windowClass = "TPen_and_Ink",
+      .menuObjectName = "PenInk1",
+      .windowObjectName = "TPen_and_Ink",
       .caption = "Pen_and_Ink",
       .statusText = "Pen and Ink",
       .cliName = "pen-and-ink",
@@ -251,19 +250,23 @@ const EffectSpec& PenAndInkEffect() {
                .maximum = 1,
                .help = "the outlines take the photograph's colours"},
           },
+      .reference = {.hash = 0xf80d1c482dce032c,
+                    .topLeft = 0x000000,
+                    .centre = 0xffffff,
+                    .bottomRight = 0x000000},
       .routine =
           [](const EffectInput& in) {
-            return Pen_and_Ink(in.source, in.params.GetInt("adjust-thread"),
-                               in.params.Get("color-ink") != 0);
+            return PenAndInk(in.source, in.params.GetInt("adjust-thread"),
+                             in.params.Get("color-ink") != 0);
           },
   };
   return entry;
 }
 
-TBitmap32 PenAndInkReference(const TBitmap32& source, int threshold, bool colorInk) {
-  TBitmap32 thresholded = source;
+Bitmap32 PenAndInkReference(const Bitmap32& source, int threshold, bool colorInk) {
+  Bitmap32 thresholded = source;
   PictureTwoValue(thresholded, threshold);
-  TBitmap32 outline = penandink(thresholded);
+  Bitmap32 outline = OutlineDarkAreas(thresholded);
   if (colorInk) ColorValue(outline, source);
   return outline;
 }

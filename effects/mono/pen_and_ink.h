@@ -16,22 +16,22 @@ void InkThresholdCells(const Pixel* in, int count, int threshold, std::uint8_t* 
 
 // Every pixel whose InkGrayValue is above threshold becomes paper (255, 255, 255, 255), every
 // other pixel ink (0, 0, 0, 255).
-void PictureTwoValue(TBitmap32& bitmap, int threshold);
+void PictureTwoValue(Bitmap32& bitmap, int threshold);
 
 // The outline of a thresholded picture: every interior pixel whose whole 3 by 3 neighbourhood
 // is ink (B, G, R all 0) becomes paper (255, 255, 255, 255); every other pixel, the border rows
 // and columns included, is kept. Pictures under 3 rows or columns are returned unchanged.
-TBitmap32 penandink(const TBitmap32& thresholded);
+Bitmap32 OutlineDarkAreas(const Bitmap32& thresholded);
 
 // Every ink pixel (red 0) of outline takes the B, G, R of the same pixel of source, alpha 255;
 // paper is kept. Both pictures have the same size.
-void ColorValue(TBitmap32& outline, const TBitmap32& source);
+void ColorValue(Bitmap32& outline, const Bitmap32& source);
 
 // The whole effect: source thresholded at threshold (0..255), its outline, then with colorInk
 // the outline's ink in the source's colours. Identical to the three steps above in turn.
-TBitmap32 Pen_and_Ink(const TBitmap32& source, int threshold, bool colorInk);
+Bitmap32 PenAndInk(const Bitmap32& source, int threshold, bool colorInk);
 
-// Those three steps in turn; the oracle that the fused Pen_and_Ink must equal.
-TBitmap32 PenAndInkReference(const TBitmap32& source, int threshold, bool colorInk);
+// Those three steps in turn; the oracle that the fused PenAndInk must equal.
+Bitmap32 PenAndInkReference(const Bitmap32& source, int threshold, bool colorInk);
 
 }  // namespace quillane

@@ -13,7 +13,7 @@
 
 namespace quillane {
 
-void two_Value1Click(TBitmap32& bitmap, int level) {
+void ThresholdToInk(Bitmap32& bitmap, int level) {
   const int w = bitmap.Width();
   ParallelRows(0, bitmap.Height(), static_cast<std::size_t>(w), [&](int y0, int y1) {
     // One row of gray values at a time, so the picture is read and written in a single pass.
@@ -27,16 +27,16 @@ void two_Value1Click(TBitmap32& bitmap, int level) {
   });
 }
 
-TBitmap32 PenSketch(const TBitmap32& source, int pressure) {
+Bitmap32 PenSketch(const Bitmap32& source, int pressure) {
   const int w = source.Width(), h = source.Height();
   if (w < 3 || h < 3) {
     // No interior pixel: the border rules alone, the plain way.
-    TBitmap32 drawing = source;
-    picsobel(drawing);
-    two_Value1Click(drawing, pressure);
+    Bitmap32 drawing = source;
+    InvertedSobelEdges(drawing);
+    ThresholdToInk(drawing, pressure);
     return drawing;
   }
-  TBitmap32 drawing = ScratchPicture(w, h);
+  Bitmap32 drawing = ScratchPicture(w, h);
   ParallelRows(0, h, static_cast<std::size_t>(w) * 12, [&](int y0, int y1) {
     std::vector<std::uint8_t> cells(static_cast<std::size_t>(w));
     for (int y = y0; y < y1; ++y) {
@@ -50,12 +50,11 @@ TBitmap32 PenSketch(const TBitmap32& source, int pressure) {
 
 const EffectSpec& PenSketchEffect() {
   static const EffectSpec entry{
-      .toolNumber = 2,
       .menu = EffectMenu::Mono,
       .menuPosition = 2,
       .menuEntry = "Pen sketch",
-      .menuHandler = "Pensketch1Click",
-      .windowClass = "TPen_Sketch",
+      .menuObjectName = "Pensketch1",
+      .windowObjectName = "TPen_Sketch",
       .caption = "Pen_Sketch",
       .statusText = "Pen Sketch",
       .cliName = "pen-sketch",
@@ -77,6 +76,10 @@ const EffectSpec& PenSketchEffect() {
                .initialNumber = "128",
                .help = "gray edge level at or below which a pixel is inked"},
           },
+      .reference = {.hash = 0xedfda84988e366d5,
+                    .topLeft = 0xffffff,
+                    .centre = 0xffffff,
+                    .bottomRight = 0xffffff},
       .routine =
           [](const EffectInput& in) {
             return PenSketch(in.source, in.params.GetInt("pen-pressure"));
@@ -85,9 +88,9 @@ const EffectSpec& PenSketchEffect() {
   return entry;
 }
 
-TBitmap32 PenSketchReference(const TBitmap32& source, int pressure) {
-  TBitmap32 drawing = source;
-  picsobel(drawing);
+Bitmap32 PenSketchReference(const Bitmap32& source, int pressure) {
+  Bitmap32 drawing = source;
+  InvertedSobelEdges(drawing);
   for (int y = 0; y < drawing.Height(); ++y)
     for (int x = 0; x < drawing.Width(); ++x) {
       Pixel& p = drawing.At(x, y);

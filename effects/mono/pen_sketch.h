@@ -8,14 +8,14 @@ namespace quillane {
 
 // Every pixel whose gray value (GrayValue) is above level becomes paper, every other pixel
 // ink; alpha 255 either way. A gray value equal to level is ink.
-void two_Value1Click(TBitmap32& bitmap, int level);
+void ThresholdToInk(Bitmap32& bitmap, int level);
 
-// The edge map of a copy of source (picsobel), thresholded at pressure (0..255); made row by
-// row from the gray values of the edge map, without the edge map as a picture.
-TBitmap32 PenSketch(const TBitmap32& source, int pressure);
+// The edge map of a copy of source (InvertedSobelEdges), thresholded at pressure (0..255); made row
+// by row from the gray values of the edge map, without the edge map as a picture.
+Bitmap32 PenSketch(const Bitmap32& source, int pressure);
 
 // The pen sketch the plain way, pixel by pixel through GrayValue; the oracle that PenSketch's
 // row-wise gray levels must equal.
-TBitmap32 PenSketchReference(const TBitmap32& source, int pressure);
+Bitmap32 PenSketchReference(const Bitmap32& source, int pressure);
 
 }  // namespace quillane

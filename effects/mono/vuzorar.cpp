@@ -75,7 +75,7 @@ Dilate ChooseDilate() {
 // so each pass keeps its last three rows, and the edge map's gray values, the thresholded rows
 // and every pass stay in cache; the source is read and the drawing written once, whatever the
 // scope. A band writes rows y0 to y1 - 1 and thresholds the scope rows beyond them itself.
-void HatchBand(const TBitmap32& source, TBitmap32& drawing, int y0, int y1, int pressure, int scope,
+void HatchBand(const Bitmap32& source, Bitmap32& drawing, int y0, int y1, int pressure, int scope,
                const Offsets& n, Dilate dilate) {
   const int w = drawing.Width(), h = drawing.Height();
   const auto lo = [&](int k) { return std::max(0, y0 - (scope - k)); };
@@ -109,11 +109,11 @@ void HatchBand(const TBitmap32& source, TBitmap32& drawing, int y0, int y1, int 
 
 }  // namespace
 
-void BitmapDilate(TBitmap32& bitmap, HatchDirection direction) {
+void BitmapDilate(Bitmap32& bitmap, HatchDirection direction) {
   const Offsets n = NeighboursOf(direction);
   const int w = bitmap.Width(), h = bitmap.Height();
   if (h - 2 < 1) return;
-  const TBitmap32 snapshot = bitmap;
+  const Bitmap32 snapshot = bitmap;
   for (int y = 1; y <= h - 2; ++y)
     for (int x = 1; x <= w - 2; ++x) {
       Pixel& p = bitmap.At(x, y);
@@ -124,11 +124,11 @@ void BitmapDilate(TBitmap32& bitmap, HatchDirection direction) {
     }
 }
 
-TBitmap32 Vuzorar(const TBitmap32& source, int pressure, int scope, HatchDirection direction) {
+Bitmap32 Vuzorar(const Bitmap32& source, int pressure, int scope, HatchDirection direction) {
   const Offsets n = NeighboursOf(direction);
   const int w = source.Width(), h = source.Height();
   if (h < 3 || w < 3 || scope < 1) return PenSketch(source, pressure);
-  TBitmap32 drawing = ScratchPicture(w, h);
+  Bitmap32 drawing = ScratchPicture(w, h);
   const Dilate dilate = ChooseDilate();
   ParallelRows(
       0, h, static_cast<std::size_t>(w) * static_cast<std::size_t>(12 + scope),
@@ -138,12 +138,11 @@ TBitmap32 Vuzorar(const TBitmap32& source, int pressure, int scope, HatchDirecti
 
 const EffectSpec& VuzorarEffect() {
   static const EffectSpec entry{
-      .toolNumber = 3,
       .menu = EffectMenu::Mono,
       .menuPosition = 3,
       .menuEntry = "Vuzorar",
-      .menuHandler = "Vuzorar1Click",
-      .windowClass = "TVuzorar",
+      .menuObjectName = "Vuzorar1",
+      .windowObjectName = "TVuzorar",
       .caption = "Vuzorar",
       .statusText = "Vuzorar",
       .cliName = "vuzorar",
@@ -188,6 +187,10 @@ const EffectSpec& VuzorarEffect() {
                .help = "the direction of the hatching strokes",
                .resetOnShow = true},
           },
+      .reference = {.hash = 0x5b8ebaf6b6b5a3a4,
+                    .topLeft = 0xffffff,
+                    .centre = 0xffffff,
+                    .bottomRight = 0xffffff},
       .routine =
           [](const EffectInput& in) {
             return Vuzorar(in.source, in.params.GetInt("vuzorar-pressure"),
@@ -198,9 +201,9 @@ const EffectSpec& VuzorarEffect() {
   return entry;
 }
 
-TBitmap32 VuzorarReference(const TBitmap32& source, int pressure, int scope,
-                           HatchDirection direction) {
-  TBitmap32 drawing = PenSketchReference(source, pressure);
+Bitmap32 VuzorarReference(const Bitmap32& source, int pressure, int scope,
+                          HatchDirection direction) {
+  Bitmap32 drawing = PenSketchReference(source, pressure);
   for (int i = 0; i < scope; ++i) BitmapDilate(drawing, direction);
   return drawing;
 }

@@ -18,15 +18,15 @@ enum class HatchDirection {
 // when either of its two neighbours in direction was ink before the pass. Border rows and
 // columns never change; pictures under 3 rows or columns are left as they are.
 // std::invalid_argument for a direction outside 1..4.
-void BitmapDilate(TBitmap32& bitmap, HatchDirection direction);
+void BitmapDilate(Bitmap32& bitmap, HatchDirection direction);
 
 // The pen sketch of source at pressure (0..255), then scope (1..10) dilation passes in
 // direction. Identical to thresholding the edge map and calling BitmapDilate scope times.
-TBitmap32 Vuzorar(const TBitmap32& source, int pressure, int scope, HatchDirection direction);
+Bitmap32 Vuzorar(const Bitmap32& source, int pressure, int scope, HatchDirection direction);
 
 // Those steps themselves: PenSketchReference, then BitmapDilate scope times. The oracle that
 // the fused, banded Vuzorar must equal.
-TBitmap32 VuzorarReference(const TBitmap32& source, int pressure, int scope,
-                           HatchDirection direction);
+Bitmap32 VuzorarReference(const Bitmap32& source, int pressure, int scope,
+                          HatchDirection direction);
 
 }  // namespace quillane

@@ -4,18 +4,17 @@
 
 namespace quillane {
 
-TBitmap32 doabstract(const TBitmap32& source, const Kernel& k) {
+Bitmap32 Abstract(const Bitmap32& source, const Kernel& k) {
   return KernelGradientFilter(source, k, Gradient::LeftMinusRight);
 }
 
 const EffectSpec& AbstractEffect() {
   static const EffectSpec entry{
-      .toolNumber = 7,
       .menu = EffectMenu::Color,
       .menuPosition = 4,
       .menuEntry = "Abstract",
-      .menuHandler = "Abstract1Click",
-      .windowClass = "TFormOfFringe2",
+      .menuObjectName = "Abstract1",
+      .windowObjectName = "TFormOfFringe2",
       .caption = "Setup for Abstract",
       .statusText = "Abstract art",
       .cliName = "abstract",
@@ -31,9 +30,13 @@ const EffectSpec& AbstractEffect() {
           {
               KernelParam({-1, -1, -1, 0, 0, 0, -1, -1, -1}),
           },
+      .reference = {.hash = 0x420f922fe65bc838,
+                    .topLeft = 0xfefcff,
+                    .centre = 0xf5f5fc,
+                    .bottomRight = 0xffffff},
       .routine =
           [](const EffectInput& in) {
-            return doabstract(in.source, KernelFrom(in.params.GetList("kernel")));
+            return Abstract(in.source, KernelFrom(in.params.GetList("kernel")));
           },
   };
   return entry;

@@ -9,6 +9,6 @@ namespace quillane {
 // KernelGradientFilter of source with k and the left-minus-right gradient. With the default
 // kernel (all weights 0 or -1) the kernel never responds, and the drawing shows where the
 // picture darkens from left to right. Alpha is 255 everywhere.
-TBitmap32 doabstract(const TBitmap32& source, const Kernel& k);
+Bitmap32 Abstract(const Bitmap32& source, const Kernel& k);
 
 }  // namespace quillane

@@ -43,15 +43,14 @@ inline std::uint32_t Scaled(std::uint32_t seed, std::uint32_t range) {
 }
 
 // A row's output: pixels 1 .. width-1 of row y from the draws that follow seed.
-using BrumeRow = void (*)(const TBitmap32& source, int scope, int y, std::uint32_t seed,
-                          Pixel* row);
+using BrumeRow = void (*)(const Bitmap32& source, int scope, int y, std::uint32_t seed, Pixel* row);
 
 // Lanes of the generator run side by side, each kLanes steps ahead of the last, so that the
 // next value never waits on the one before.
 constexpr int kLanes = 8;
 
 // Pixel x of row y from its two draws.
-inline void Pick(const TBitmap32& source, int scope, int y, int x, std::uint32_t rowSeed,
+inline void Pick(const Bitmap32& source, int scope, int y, int x, std::uint32_t rowSeed,
                  std::uint32_t columnSeed, Pixel* row) {
   const int w = source.Width();
   const auto range = static_cast<std::uint32_t>(scope + 3);
@@ -63,7 +62,7 @@ inline void Pick(const TBitmap32& source, int scope, int y, int x, std::uint32_t
   row[x] = Pixel{p.b, p.g, p.r, 255};
 }
 
-void PlainBrumeRow(const TBitmap32& source, int scope, int y, std::uint32_t seed, Pixel* row) {
+void PlainBrumeRow(const Bitmap32& source, int scope, int y, std::uint32_t seed, Pixel* row) {
   const int w = source.Width();
   constexpr Affine lanesAhead = Steps(kLanes);
   std::array<std::uint32_t, kLanes> lane;
@@ -95,9 +94,9 @@ void PlainBrumeRow(const TBitmap32& source, int scope, int y, std::uint32_t seed
 // every lane moves 16 steps on after the round. The picked pixels are fetched one by one by
 // their index in the picture (which 32 bits hold for any picture the program accepts): the
 // gather instruction was three times slower here.
-[[gnu::target("avx2")]] void Avx2BrumeRow(const TBitmap32& source, int scope, int y,
+[[gnu::target("avx2")]] void Avx2BrumeRow(const Bitmap32& source, int scope, int y,
                                           std::uint32_t seed, Pixel* row) {
-  static_assert(TBitmap32::kMaxPixels <= std::int64_t{1} << 31);
+  static_assert(Bitmap32::kMaxPixels <= std::int64_t{1} << 31);
   const int w = source.Width();
   const int h = source.Height();
   alignas(32) std::uint32_t rowSeeds[8], columnSeeds[8];
@@ -162,13 +161,13 @@ std::uint32_t RandomJump(std::uint32_t seed, std::uint64_t steps) {
   return Steps(steps)(seed);
 }
 
-TBitmap32 Brume(const TBitmap32& source, int scope, std::uint32_t& seed) {
-  TBitmap32 out = TBitmap32::ForOverwrite(source.Width(), source.Height());
+Bitmap32 Brume(const Bitmap32& source, int scope, std::uint32_t& seed) {
+  Bitmap32 out = Bitmap32::ForOverwrite(source.Width(), source.Height());
   BrumeInto(source, scope, seed, out);
   return out;
 }
 
-void BrumeInto(const TBitmap32& source, int scope, std::uint32_t& seed, TBitmap32& out) {
+void BrumeInto(const Bitmap32& source, int scope, std::uint32_t& seed, Bitmap32& out) {
   const int w = source.Width();
   const int h = source.Height();
   if (w == 0) return;
@@ -193,9 +192,9 @@ void BrumeInto(const TBitmap32& source, int scope, std::uint32_t& seed, TBitmap3
   seed = RandomJump(start, perRow * static_cast<std::uint64_t>(h - 1));
 }
 
-TBitmap32 BrumeReference(const TBitmap32& source, int scope, std::uint32_t& seed) {
-  TBitmap32 a = source;
-  const TBitmap32 s = source;
+Bitmap32 BrumeReference(const Bitmap32& source, int scope, std::uint32_t& seed) {
+  Bitmap32 a = source;
+  const Bitmap32 s = source;
   const int w = source.Width();
   const int h = source.Height();
   const auto range = static_cast<std::uint32_t>(scope + 3);
@@ -219,12 +218,11 @@ TBitmap32 BrumeReference(const TBitmap32& source, int scope, std::uint32_t& seed
 
 const EffectSpec& BrumeEffect() {
   static const EffectSpec entry{
-      .toolNumber = 10,
       .menu = EffectMenu::Color,
       .menuPosition = 6,
       .menuEntry = "Brume",
-      .menuHandler = "Brume1Click",
-      .windowClass = "TBrume",
+      .menuObjectName = "Brume1",
+      .windowObjectName = "TBrume",
       .caption = "Brume",
       .statusText = "Brume",
       .cliName = "brume",
@@ -248,6 +246,10 @@ const EffectSpec& BrumeEffect() {
                .initialNumber = "3",
                .help = "how far colours travel: up to N pixels down and right, 2 up and left"},
           },
+      .reference = {.hash = 0x7a58c4f68df92c52,
+                    .topLeft = 0x88522e,
+                    .centre = 0x969388,
+                    .bottomRight = 0x1c4930},
       .routine =
           [](const EffectInput& in) {
             // Without the document's generator (a caller that keeps none) a run starts afresh.

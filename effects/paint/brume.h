@@ -23,12 +23,12 @@ std::uint32_t RandomJump(std::uint32_t seed, std::uint64_t steps);
 // pixel (x, y) takes blue, green and red of source pixel (rx, ry) and alpha 255. Row 0 and
 // column 0 keep the source. seed is continued by exactly 2 (W-1) (H-1) steps, so the result
 // also depends on every run before; rows run on several threads with the same bytes.
-TBitmap32 Brume(const TBitmap32& source, int scope, std::uint32_t& seed);
+Bitmap32 Brume(const Bitmap32& source, int scope, std::uint32_t& seed);
 
 // The same into out, which must already have source's size.
-void BrumeInto(const TBitmap32& source, int scope, std::uint32_t& seed, TBitmap32& out);
+void BrumeInto(const Bitmap32& source, int scope, std::uint32_t& seed, Bitmap32& out);
 
 // The same one pixel and one draw after another: the reference for Brume.
-TBitmap32 BrumeReference(const TBitmap32& source, int scope, std::uint32_t& seed);
+Bitmap32 BrumeReference(const Bitmap32& source, int scope, std::uint32_t& seed);
 
 }  // namespace quillane

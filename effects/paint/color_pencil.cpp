@@ -25,13 +25,13 @@ int EdgeTone(int gray, int pressure) {
 
 }  // namespace
 
-TBitmap32 colorsketch(const TBitmap32& source, int pressure) {
-  TBitmap32 out = ScratchPicture(source.Width(), source.Height());
+Bitmap32 ColorPencil(const Bitmap32& source, int pressure) {
+  Bitmap32 out = ScratchPicture(source.Width(), source.Height());
   ColorSketchInto(source, pressure, out);
   return out;
 }
 
-void ColorSketchInto(const TBitmap32& source, int pressure, TBitmap32& out) {
+void ColorSketchInto(const Bitmap32& source, int pressure, Bitmap32& out) {
   const int w = source.Width(), h = source.Height();
   if (source.Empty()) return;
   // The new lightness depends on the edge gray and L alone: one table for the picture, its
@@ -52,8 +52,8 @@ void ColorSketchInto(const TBitmap32& source, int pressure, TBitmap32& out) {
 
   if (w < 3 || h < 3) {
     // No interior pixel: the edge map's border rules alone, from a whole edge map.
-    TBitmap32 edges = source;
-    picsobel(edges);
+    Bitmap32 edges = source;
+    InvertedSobelEdges(edges);
     std::vector<std::uint8_t> gray(static_cast<std::size_t>(w));
     for (int y = 0; y < h; ++y) {
       GrayLevels(edges.ScanLine(y), gray.data(), w);
@@ -73,10 +73,10 @@ void ColorSketchInto(const TBitmap32& source, int pressure, TBitmap32& out) {
   });
 }
 
-TBitmap32 ColorSketchReference(const TBitmap32& source, int pressure) {
-  TBitmap32 edges = source;
-  picsobel(edges);
-  TBitmap32 out = source;
+Bitmap32 ColorSketchReference(const Bitmap32& source, int pressure) {
+  Bitmap32 edges = source;
+  InvertedSobelEdges(edges);
+  Bitmap32 out = source;
   for (int y = 0; y < out.Height(); ++y) {
     for (int x = 0; x < out.Width(); ++x) {
       const Pixel ep = edges.At(x, y);
@@ -93,12 +93,11 @@ TBitmap32 ColorSketchReference(const TBitmap32& source, int pressure) {
 
 const EffectSpec& ColorPencilEffect() {
   static const EffectSpec entry{
-      .toolNumber = 5,
       .menu = EffectMenu::Color,
       .menuPosition = 1,
       .menuEntry = "Color Pencil",
-      .menuHandler = "Colorsketch1Click",
-      .windowClass = "TColor_Sketch",
+      .menuObjectName = "Colorsketch1",
+      .windowObjectName = "TColor_Sketch",
       .caption = "Color_Pencil",
       .statusText = "Color Sketch",
       .cliName = "color-pencil",
@@ -119,9 +118,13 @@ const EffectSpec& ColorPencilEffect() {
                .numberFor = [](int p) { return Round(static_cast<Extended>(p) * 100 / 89); },
                .help = "contrast position of the edge tone: 0 white, 45 as drawn, 89 hardest"},
           },
+      .reference = {.hash = 0x47ffeeb9b5b445d0,
+                    .topLeft = 0xfefcfb,
+                    .centre = 0xf5f5f4,
+                    .bottomRight = 0xffffff},
       .routine =
           [](const EffectInput& in) {
-            return colorsketch(in.source, in.params.GetInt("pressure"));
+            return ColorPencil(in.source, in.params.GetInt("pressure"));
           },
   };
   return entry;

@@ -7,21 +7,21 @@
 namespace quillane {
 
 // For every pixel, borders included:
-//   g  = gray value of the pixel in the edge map (picsobel) of source;
+//   g  = gray value of the pixel in the edge map (InvertedSobelEdges) of source;
 //   Le = Round(100 g / 255), the HSL lightness of (g, g, g);
 //   e  = the lightness contrast curve of Le at position pressure (0..89);
 //   (H, S, L) = RGB to HSL of the source pixel;
 //   L' = Round(e / 100 * (100 - L)) + L, in extended precision, halves to even;
 //   the pixel is HSL to RGB of (H, S, L'), alpha 255.
 // Pressure 45 uses the edge map as it is; 0 gives white everywhere.
-TBitmap32 colorsketch(const TBitmap32& source, int pressure);
+Bitmap32 ColorPencil(const Bitmap32& source, int pressure);
 
 // The same into out, which must already have source's size (a caller that runs the effect
 // again and again reuses one picture).
-void ColorSketchInto(const TBitmap32& source, int pressure, TBitmap32& out);
+void ColorSketchInto(const Bitmap32& source, int pressure, Bitmap32& out);
 
 // The same, step by step as written above with no tables, no shortcuts and one thread: the
 // reference the fast version is checked against.
-TBitmap32 ColorSketchReference(const TBitmap32& source, int pressure);
+Bitmap32 ColorSketchReference(const Bitmap32& source, int pressure);
 
 }  // namespace quillane

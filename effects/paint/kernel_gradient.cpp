@@ -15,7 +15,7 @@ Kernel GradientKernel(Gradient gradient) {
   return {-1, 0, 1, -2, 0, 2, -1, 0, 1};
 }
 
-std::int64_t WeightedSum(const TBitmap32& picture, const Kernel& k, int x, int y,
+std::int64_t WeightedSum(const Bitmap32& picture, const Kernel& k, int x, int y,
                          std::uint8_t Pixel::*c) {
   std::int64_t s = 0;
   for (int t = 0; t < 9; ++t)
@@ -35,9 +35,9 @@ void CopyColour(Pixel& to, const Pixel& from) {
 
 }  // namespace
 
-TBitmap32 KernelGradientReference(const TBitmap32& picture, const Kernel& k, Gradient gradient) {
+Bitmap32 KernelGradientReference(const Bitmap32& picture, const Kernel& k, Gradient gradient) {
   const Kernel g = GradientKernel(gradient);
-  TBitmap32 a = picture;
+  Bitmap32 a = picture;
   const int w = picture.Width();
   const int h = picture.Height();
   for (int y = 1; y < h - 1; ++y)
@@ -60,14 +60,14 @@ TBitmap32 KernelGradientReference(const TBitmap32& picture, const Kernel& k, Gra
   return a;
 }
 
-TBitmap32 KernelGradientFilter(const TBitmap32& picture, const Kernel& k, Gradient gradient) {
-  TBitmap32 out = ScratchPicture(picture.Width(), picture.Height());
+Bitmap32 KernelGradientFilter(const Bitmap32& picture, const Kernel& k, Gradient gradient) {
+  Bitmap32 out = ScratchPicture(picture.Width(), picture.Height());
   KernelGradientFilterInto(picture, k, gradient, out);
   return out;
 }
 
-void KernelGradientFilterInto(const TBitmap32& picture, const Kernel& k, Gradient gradient,
-                              TBitmap32& out) {
+void KernelGradientFilterInto(const Bitmap32& picture, const Kernel& k, Gradient gradient,
+                              Bitmap32& out) {
   const int w = picture.Width();
   const int h = picture.Height();
   const auto pass = KernelRowPass::Make(

@@ -24,13 +24,13 @@ enum class Gradient {
 // Sums are formed in 64 bits, so no weights a cell holds overflow. A picture too small for a
 // neighbour on one side repeats what it has there: 1 pixel high or wide is the inverted input
 // along that side; 2 gives both lines the inverted second line.
-TBitmap32 KernelGradientFilter(const TBitmap32& picture, const Kernel& k, Gradient gradient);
+Bitmap32 KernelGradientFilter(const Bitmap32& picture, const Kernel& k, Gradient gradient);
 
 // The same into out, which must already have picture's size.
-void KernelGradientFilterInto(const TBitmap32& picture, const Kernel& k, Gradient gradient,
-                              TBitmap32& out);
+void KernelGradientFilterInto(const Bitmap32& picture, const Kernel& k, Gradient gradient,
+                              Bitmap32& out);
 
 // The same step by step, pixel by pixel in 64-bit sums: the reference for the two above.
-TBitmap32 KernelGradientReference(const TBitmap32& picture, const Kernel& k, Gradient gradient);
+Bitmap32 KernelGradientReference(const Bitmap32& picture, const Kernel& k, Gradient gradient);
 
 }  // namespace quillane

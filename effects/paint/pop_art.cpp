@@ -4,18 +4,17 @@
 
 namespace quillane {
 
-TBitmap32 popart(const TBitmap32& source, const Kernel& k) {
+Bitmap32 PopArt(const Bitmap32& source, const Kernel& k) {
   return KernelGradientFilter(source, k, Gradient::RightMinusLeftSobel);
 }
 
 const EffectSpec& PopArtEffect() {
   static const EffectSpec entry{
-      .toolNumber = 8,
       .menu = EffectMenu::Color,
       .menuPosition = 3,
       .menuEntry = "Pop art",
-      .menuHandler = "Popart1Click",
-      .windowClass = "TFormOfFringe3",
+      .menuObjectName = "Popart1",
+      .windowObjectName = "TFormOfFringe3",
       .caption = "Setup for Pop art",
       .statusText = "Pop art",
       .cliName = "pop-art",
@@ -31,9 +30,13 @@ const EffectSpec& PopArtEffect() {
           {
               KernelParam({-1, -2, -1, 0, 0, 0, 1, 2, 1}),
           },
+      .reference = {.hash = 0x0ac48edf0124145b,
+                    .topLeft = 0xf7f5f4,
+                    .centre = 0xffffff,
+                    .bottomRight = 0xe5a6af},
       .routine =
           [](const EffectInput& in) {
-            return popart(in.source, KernelFrom(in.params.GetList("kernel")));
+            return PopArt(in.source, KernelFrom(in.params.GetList("kernel")));
           },
   };
   return entry;

@@ -8,6 +8,6 @@ namespace quillane {
 // KernelGradientFilter of source with k and the right-minus-left Sobel gradient. With the
 // default kernel (bottom row minus top row, weights 1, 2, 1) each channel shows the larger of
 // its downward and rightward brightening, inverted. Alpha is 255 everywhere.
-TBitmap32 popart(const TBitmap32& source, const Kernel& k);
+Bitmap32 PopArt(const Bitmap32& source, const Kernel& k);
 
 }  // namespace quillane

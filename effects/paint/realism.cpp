@@ -17,8 +17,8 @@ std::uint8_t ClampWide(std::int64_t v) {
 
 }  // namespace
 
-TBitmap32 ConvolveReference(const TBitmap32& picture, const Kernel& k, std::uint16_t divisor) {
-  TBitmap32 out = picture;
+Bitmap32 ConvolveReference(const Bitmap32& picture, const Kernel& k, std::uint16_t divisor) {
+  Bitmap32 out = picture;
   const std::int64_t d = divisor == 0 ? 1 : divisor;
   for (int y = 1; y < picture.Height() - 1; ++y) {
     for (int x = 1; x < picture.Width() - 1; ++x) {
@@ -34,14 +34,13 @@ TBitmap32 ConvolveReference(const TBitmap32& picture, const Kernel& k, std::uint
   return out;
 }
 
-TBitmap32 Convolve(const TBitmap32& picture, const Kernel& k, std::uint16_t divisor) {
-  TBitmap32 out = ScratchPicture(picture.Width(), picture.Height());
+Bitmap32 Convolve(const Bitmap32& picture, const Kernel& k, std::uint16_t divisor) {
+  Bitmap32 out = ScratchPicture(picture.Width(), picture.Height());
   ConvolveInto(picture, k, divisor, out);
   return out;
 }
 
-void ConvolveInto(const TBitmap32& picture, const Kernel& k, std::uint16_t divisor,
-                  TBitmap32& out) {
+void ConvolveInto(const Bitmap32& picture, const Kernel& k, std::uint16_t divisor, Bitmap32& out) {
   const int w = picture.Width();
   const int h = picture.Height();
   // Kernels too heavy for 32-bit sums, and divisors other than 1, are rare: they take the
@@ -73,18 +72,17 @@ void ConvolveInto(const TBitmap32& picture, const Kernel& k, std::uint16_t divis
   });
 }
 
-TBitmap32 realism(const TBitmap32& source, const Kernel& k) {
+Bitmap32 realism(const Bitmap32& source, const Kernel& k) {
   return Convolve(source, k, 1);
 }
 
 const EffectSpec& RealismEffect() {
   static const EffectSpec entry{
-      .toolNumber = 6,
       .menu = EffectMenu::Color,
       .menuPosition = 2,
       .menuEntry = "Realism",
-      .menuHandler = "Realism1Click",
-      .windowClass = "TFormOfFringe1",
+      .menuObjectName = "Realism1",
+      .windowObjectName = "TFormOfFringe1",
       .caption = "Setup for Realism",
       .statusText = "Realism",
       .cliName = "realism",
@@ -100,6 +98,10 @@ const EffectSpec& RealismEffect() {
           {
               KernelParam({1, 2, 1, 0, 0, 0, -1, -1, -1}),
           },
+      .reference = {.hash = 0xf59929b4aacceff2,
+                    .topLeft = 0x88522e,
+                    .centre = 0xaaa294,
+                    .bottomRight = 0x1c4930},
       .routine =
           [](const EffectInput& in) {
             return realism(in.source, KernelFrom(in.params.GetList("kernel")));

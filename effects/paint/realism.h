@@ -16,15 +16,15 @@ namespace quillane {
 // can hold overflow: a sum beyond 32 bits clamps like any other. A divisor of 0 is taken as 1.
 // The one-pixel frame keeps the input's colours and alpha; a picture under 3 pixels wide or
 // high comes back unchanged.
-TBitmap32 Convolve(const TBitmap32& picture, const Kernel& k, std::uint16_t divisor);
+Bitmap32 Convolve(const Bitmap32& picture, const Kernel& k, std::uint16_t divisor);
 
 // The same into out, which must already have picture's size.
-void ConvolveInto(const TBitmap32& picture, const Kernel& k, std::uint16_t divisor, TBitmap32& out);
+void ConvolveInto(const Bitmap32& picture, const Kernel& k, std::uint16_t divisor, Bitmap32& out);
 
 // The same pixel by pixel in 64-bit sums on one thread: the reference for Convolve.
-TBitmap32 ConvolveReference(const TBitmap32& picture, const Kernel& k, std::uint16_t divisor);
+Bitmap32 ConvolveReference(const Bitmap32& picture, const Kernel& k, std::uint16_t divisor);
 
 // Realism: Convolve of the source picture with divisor 1.
-TBitmap32 realism(const TBitmap32& source, const Kernel& k);
+Bitmap32 realism(const Bitmap32& source, const Kernel& k);
 
 }  // namespace quillane

@@ -187,7 +187,7 @@ RowKernels ChooseKernels() {
 }
 
 // Runs kernel on every interior row of in into out.
-void InteriorPass(const TBitmap32& in, TBitmap32& out, std::size_t workPerPixel, RowKernel kernel) {
+void InteriorPass(const Bitmap32& in, Bitmap32& out, std::size_t workPerPixel, RowKernel kernel) {
   const int w = in.Width();
   const int h = in.Height();
   if (w < 3 || h < 3) return;
@@ -211,8 +211,8 @@ constexpr int kTile = 4096;
 // the rows of the pass before them are, so that every row is read back from the cache. A pass
 // with more passes after it covers that many more rows and columns on each side, so the tile
 // needs nothing from its neighbours. The rings hold columns lo..hi-1, the widest any pass reads.
-void PassesOnTile(const RowKernels& kernels, const TBitmap32& source, int passes, int y0, int y1,
-                  int c0, int c1, Pixel* rings, TBitmap32& out) {
+void PassesOnTile(const RowKernels& kernels, const Bitmap32& source, int passes, int y0, int y1,
+                  int c0, int c1, Pixel* rings, Bitmap32& out) {
   const int w = source.Width();
   const int h = source.Height();
   const int lo = std::max(0, c0 - passes);
@@ -248,14 +248,14 @@ void PassesOnTile(const RowKernels& kernels, const TBitmap32& source, int passes
     }
 }
 
-TBitmap32 CopyOf(const TBitmap32& b) {
+Bitmap32 CopyOf(const Bitmap32& b) {
   return b;
 }
 
 // The passes as first written: whole copies, the channels of every pixel one by one.
-void sharpen(TBitmap32& p) {
-  TBitmap32 a = CopyOf(p);
-  const TBitmap32 b = CopyOf(a);
+void sharpen(Bitmap32& p) {
+  Bitmap32 a = CopyOf(p);
+  const Bitmap32 b = CopyOf(a);
   for (int y = 1; y < p.Height() - 1; ++y)
     for (int x = 1; x < p.Width() - 1; ++x)
       for (Byte Pixel::*c : {&Pixel::r, &Pixel::g, &Pixel::b}) {
@@ -266,9 +266,9 @@ void sharpen(TBitmap32& p) {
   p = a;
 }
 
-void soften(TBitmap32& p) {
-  TBitmap32 a = CopyOf(p);
-  const TBitmap32 b = CopyOf(p);
+void soften(Bitmap32& p) {
+  Bitmap32 a = CopyOf(p);
+  const Bitmap32 b = CopyOf(p);
   int work[3][9];
   for (int y = 1; y < p.Height() - 1; ++y)
     for (int x = 1; x < p.Width() - 1; ++x) {
@@ -291,21 +291,21 @@ void SelectionSort(int* a, int last) {
       if (a[j] < a[i]) std::swap(a[i], a[j]);
 }
 
-void SharpenPass(const TBitmap32& in, TBitmap32& out) {
+void SharpenPass(const Bitmap32& in, Bitmap32& out) {
   InteriorPass(in, out, 6, ChooseKernels().sharpen);
 }
 
-void MedianPass(const TBitmap32& in, TBitmap32& out) {
+void MedianPass(const Bitmap32& in, Bitmap32& out) {
   InteriorPass(in, out, 8, ChooseKernels().median);
 }
 
-TBitmap32 watercolor(const TBitmap32& source, int cycles) {
-  TBitmap32 picture = TBitmap32::ForOverwrite(source.Width(), source.Height());
+Bitmap32 WaterColor(const Bitmap32& source, int cycles) {
+  Bitmap32 picture = Bitmap32::ForOverwrite(source.Width(), source.Height());
   WaterColorInto(source, cycles, picture);
   return picture;
 }
 
-void WaterColorInto(const TBitmap32& source, int cycles, TBitmap32& out) {
+void WaterColorInto(const Bitmap32& source, int cycles, Bitmap32& out) {
   const int w = source.Width();
   const int h = source.Height();
   const std::size_t bytes = source.PixelCount() * sizeof(Pixel);
@@ -341,8 +341,8 @@ void WaterColorInto(const TBitmap32& source, int cycles, TBitmap32& out) {
                });
 }
 
-TBitmap32 WaterColorReference(const TBitmap32& source, int cycles) {
-  TBitmap32 p = source;
+Bitmap32 WaterColorReference(const Bitmap32& source, int cycles) {
+  Bitmap32 p = source;
   for (int i = 0; i < cycles; ++i) {
     sharpen(p);
     soften(p);
@@ -353,12 +353,11 @@ TBitmap32 WaterColorReference(const TBitmap32& source, int cycles) {
 
 const EffectSpec& WaterColorEffect() {
   static const EffectSpec entry{
-      .toolNumber = 9,
       .menu = EffectMenu::Color,
       .menuPosition = 5,
       .menuEntry = "Water color",
-      .menuHandler = "Watercolor1Click",
-      .windowClass = "TWater_Color",
+      .menuObjectName = "Watercolor1",
+      .windowObjectName = "TWater_Color",
       .caption = "Water_Color",
       .statusText = "Water color",
       .cliName = "water-color",
@@ -382,8 +381,12 @@ const EffectSpec& WaterColorEffect() {
                .initialNumber = "3",
                .help = "cycles of sharpening and two median passes"},
           },
+      .reference = {.hash = 0xe2b296672cd83970,
+                    .topLeft = 0x88522e,
+                    .centre = 0x928c87,
+                    .bottomRight = 0x1c4930},
       .routine =
-          [](const EffectInput& in) { return watercolor(in.source, in.params.GetInt("scope")); },
+          [](const EffectInput& in) { return WaterColor(in.source, in.params.GetInt("scope")); },
   };
   return entry;
 }

@@ -144,8 +144,8 @@ ReliefRow ChooseReliefRow(int lift) {
 
 }  // namespace
 
-TBitmap32 EmbossReference(const TBitmap32& source, int lighting, int depth) {
-  TBitmap32 out = source;
+Bitmap32 EmbossReference(const Bitmap32& source, int lighting, int depth) {
+  Bitmap32 out = source;
   for (int y = 0; y < source.Height() - depth; ++y)
     for (int x = 0; x < source.Width() - depth; ++x) {
       const Pixel p = source.At(x, y);
@@ -159,14 +159,14 @@ TBitmap32 EmbossReference(const TBitmap32& source, int lighting, int depth) {
   return out;
 }
 
-TBitmap32 emboss(const TBitmap32& source, int lighting, int depth) {
+Bitmap32 emboss(const Bitmap32& source, int lighting, int depth) {
   const int width = source.Width();
   const int height = source.Height();
   const int w = width - depth;
   const int h = height - depth;
   if (depth < 1 || w <= 0 || h <= 0) return source;
   const ReliefRow relief = ChooseReliefRow(lighting + 50);
-  TBitmap32 out = ScratchPicture(width, height);
+  Bitmap32 out = ScratchPicture(width, height);
   // Every Q is read from the untouched source, so rows can be done in any order; the result is
   // the one a top-to-bottom pass in place gives. Unvisited pixels keep the source's.
   ParallelRowRuns(0, height, static_cast<std::size_t>(width) * 2, [&](int y0, int y1) {
@@ -187,12 +187,11 @@ TBitmap32 emboss(const TBitmap32& source, int lighting, int depth) {
 
 const EffectSpec& EmbossEffect() {
   static const EffectSpec entry{
-      .toolNumber = 15,
       .menu = EffectMenu::Veins,
       .menuPosition = 1,
       .menuEntry = "Emboss",
-      .menuHandler = "Emboss1Click",
-      .windowClass = "TEmboss",
+      .menuObjectName = "Emboss1",
+      .windowObjectName = "TEmboss",
       .caption = "Emboss",
       .statusText = "Emboss",
       .cliName = "emboss",
@@ -225,6 +224,10 @@ const EffectSpec& EmbossEffect() {
                .initialNumber = "3",
                .help = "distance to the neighbour compared, down and to the right"},
           },
+      .reference = {.hash = 0x9b93a73ce25c71c1,
+                    .topLeft = 0x959595,
+                    .centre = 0x9e9e9e,
+                    .bottomRight = 0x1c4930},
       .routine =
           [](const EffectInput& in) {
             return emboss(in.source, in.params.GetInt("lighting"), in.params.GetInt("depth"));

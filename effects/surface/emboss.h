@@ -10,9 +10,9 @@ namespace quillane {
 // extended precision, halves to even) of v = min(255, |P - Q + lighting + 50|) per channel,
 // alpha 255. The rightmost depth columns and bottom depth rows keep the source pixels, colour
 // and alpha. lighting 0..200, depth 1..5 (any depth >= 1 works).
-TBitmap32 emboss(const TBitmap32& source, int lighting, int depth);
+Bitmap32 emboss(const Bitmap32& source, int lighting, int depth);
 
 // The same pixel by pixel on one thread, straight from the formula: the reference for emboss.
-TBitmap32 EmbossReference(const TBitmap32& source, int lighting, int depth);
+Bitmap32 EmbossReference(const Bitmap32& source, int lighting, int depth);
 
 }  // namespace quillane

@@ -21,7 +21,7 @@ inline ParamSpec ForCurrentParam(std::string help) {
 }
 
 // The picture the effect starts from, as the check box says.
-inline const TBitmap32& ForCurrentBase(const EffectInput& in) {
+inline const Bitmap32& ForCurrentBase(const EffectInput& in) {
   return in.params.GetInt("for-current") != 0 ? in.working : in.source;
 }
 

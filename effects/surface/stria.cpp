@@ -56,10 +56,10 @@ Pixel StripeColour(std::uint32_t colour, int transparency) {
 
 }  // namespace
 
-TBitmap32 StriaReference(const TBitmap32& base, int layerWidth, int layerHeight,
-                         StriaDirection direction, int thickness, int space, int transparency,
-                         std::uint32_t colour) {
-  TBitmap32 out = base;
+Bitmap32 StriaReference(const Bitmap32& base, int layerWidth, int layerHeight,
+                        StriaDirection direction, int thickness, int space, int transparency,
+                        std::uint32_t colour) {
+  Bitmap32 out = base;
   const int w = std::min(base.Width(), std::max(0, layerWidth));
   const int h = std::min(base.Height(), std::max(0, layerHeight));
   if (w == 0 || h == 0) return out;
@@ -90,8 +90,8 @@ TBitmap32 StriaReference(const TBitmap32& base, int layerWidth, int layerHeight,
 // One pass from base into the result: each row of the layer through StripeRow with the mask of
 // its stripe columns (none on a gap row, or when the colour is fully transparent), the rest of
 // the row and the rows below the layer copied.
-TBitmap32 stria(const TBitmap32& base, int layerWidth, int layerHeight, StriaDirection direction,
-                int thickness, int space, int transparency, std::uint32_t colour) {
+Bitmap32 stria(const Bitmap32& base, int layerWidth, int layerHeight, StriaDirection direction,
+               int thickness, int space, int transparency, std::uint32_t colour) {
   const int w = std::min(base.Width(), std::max(0, layerWidth));
   const int h = std::min(base.Height(), std::max(0, layerHeight));
   if (w == 0 || h == 0) return base;
@@ -116,12 +116,11 @@ TBitmap32 stria(const TBitmap32& base, int layerWidth, int layerHeight, StriaDir
 
 const EffectSpec& StriaEffect() {
   static const EffectSpec entry{
-      .toolNumber = 17,
       .menu = EffectMenu::Veins,
       .menuPosition = 3,
       .menuEntry = "Stria",
-      .menuHandler = "Verticalstria1Click",
-      .windowClass = "TStria",
+      .menuObjectName = "Verticalstria1",
+      .windowObjectName = "TStria",
       .caption = "Stria",
       .statusText = "Added stria",
       .cliName = "stria",
@@ -174,9 +173,13 @@ const EffectSpec& StriaEffect() {
               ForCurrentParam(
                   "1: stripe the picture as shown when the window opened; 0: the source"),
           },
+      .reference = {.hash = 0x63d58d2b0864063c,
+                    .topLeft = 0x442917,
+                    .centre = 0x97968c,
+                    .bottomRight = 0x1c4930},
       .routine =
           [](const EffectInput& in) {
-            const TBitmap32& base = ForCurrentBase(in);
+            const Bitmap32& base = ForCurrentBase(in);
             return stria(base, in.source.Width(), in.source.Height(),
                          static_cast<StriaDirection>(in.params.GetInt("direction")),
                          in.params.GetInt("thickness"), in.params.GetInt("space"),

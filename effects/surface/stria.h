@@ -16,13 +16,13 @@ enum class StriaDirection { Vertical = 1, Horizontal = 2 };
 // stripe gives ((255 - a) base + a colour) div 255 per channel; a gap leaves it; over alpha 0
 // a stripe is copied as it is and a gap becomes (255, 255, 255, 0). Only the area both share
 // is touched. thickness 1..100, space 1..255, transparency 0..255.
-TBitmap32 stria(const TBitmap32& base, int layerWidth, int layerHeight, StriaDirection direction,
-                int thickness, int space, int transparency, std::uint32_t colour);
+Bitmap32 stria(const Bitmap32& base, int layerWidth, int layerHeight, StriaDirection direction,
+               int thickness, int space, int transparency, std::uint32_t colour);
 
 // The same made the plain way, in place on a copy through tables of the colour: what stria must
 // equal.
-TBitmap32 StriaReference(const TBitmap32& base, int layerWidth, int layerHeight,
-                         StriaDirection direction, int thickness, int space, int transparency,
-                         std::uint32_t colour);
+Bitmap32 StriaReference(const Bitmap32& base, int layerWidth, int layerHeight,
+                        StriaDirection direction, int thickness, int space, int transparency,
+                        std::uint32_t colour);
 
 }  // namespace quillane

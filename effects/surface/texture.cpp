@@ -32,9 +32,9 @@ std::vector<ParamOption> TileOptions() {
 
 }  // namespace
 
-TBitmap32 texture(const TBitmap32& base, const TBitmap32& tile, int pressure) {
+Bitmap32 texture(const Bitmap32& base, const Bitmap32& tile, int pressure) {
   const int w = base.Width(), h = base.Height();
-  if (w == 0 || h == 0) return TBitmap32(w, h);
+  if (w == 0 || h == 0) return Bitmap32(w, h);
   const int tw = std::max(1, tile.Width()), th = std::max(1, tile.Height());
   const bool plain = tile.Width() == 0 || tile.Height() == 0;
   // One row of shifts per tile row, already repeated across the picture's width.
@@ -58,8 +58,8 @@ TBitmap32 texture(const TBitmap32& base, const TBitmap32& tile, int pressure) {
   });
 }
 
-TBitmap32 TextureReference(const TBitmap32& base, const TBitmap32& tile, int pressure) {
-  TBitmap32 out(base.Width(), base.Height());
+Bitmap32 TextureReference(const Bitmap32& base, const Bitmap32& tile, int pressure) {
+  Bitmap32 out(base.Width(), base.Height());
   const bool plain = tile.Width() == 0 || tile.Height() == 0;
   for (int y = 0; y < base.Height(); ++y)
     for (int x = 0; x < base.Width(); ++x) {
@@ -77,12 +77,11 @@ TBitmap32 TextureReference(const TBitmap32& base, const TBitmap32& tile, int pre
 
 const EffectSpec& TextureEffect() {
   static const EffectSpec entry{
-      .toolNumber = 14,
       .menu = EffectMenu::Veins,
       .menuPosition = 2,
       .menuEntry = "Texture",
-      .menuHandler = "exture1Click",
-      .windowClass = "TTexture",
+      .menuObjectName = "exture1",
+      .windowObjectName = "TTexture",
       .caption = "Texture",
       .statusText = "Made texture",
       .cliName = "texture",
@@ -111,9 +110,13 @@ const EffectSpec& TextureEffect() {
               ForCurrentParam(
                   "1: texture the picture as shown when the window opened; 0: the source"),
           },
+      .reference = {.hash = 0xdeb5264a77da691f,
+                    .topLeft = 0xba7140,
+                    .centre = 0xc5c4bf,
+                    .bottomRight = 0x3c9f69},
       .routine =
           [](const EffectInput& in) {
-            const TBitmap32& base = ForCurrentBase(in);
+            const Bitmap32& base = ForCurrentBase(in);
             return texture(base, TextureTile(in.params.GetInt("texture")),
                            in.params.GetInt("pressure"));
           },

@@ -9,9 +9,9 @@ namespace quillane {
 // Round((Lt - 70) pressure / 50) (halves to even) and limited to 0..100, where Lt is the
 // lightness of the tile pixel at (x mod tile width, y mod tile height), then back through HSL
 // to RGB with alpha 255. pressure 0..100. An empty tile leaves the lightness as it is.
-TBitmap32 texture(const TBitmap32& base, const TBitmap32& tile, int pressure);
+Bitmap32 texture(const Bitmap32& base, const Bitmap32& tile, int pressure);
 
 // The same, pixel by pixel through the reference conversions: the oracle for texture.
-TBitmap32 TextureReference(const TBitmap32& base, const TBitmap32& tile, int pressure);
+Bitmap32 TextureReference(const Bitmap32& base, const Bitmap32& tile, int pressure);
 
 }  // namespace quillane

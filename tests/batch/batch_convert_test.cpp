@@ -40,8 +40,8 @@ class BatchFolder : public ::testing::Test {
 };
 
 // A small opaque picture, different for each seed.
-TBitmap32 Picture(int width, int height, int seed) {
-  TBitmap32 p = RandomPicture(width, height, static_cast<unsigned>(seed));
+Bitmap32 Picture(int width, int height, int seed) {
+  Bitmap32 p = RandomPicture(width, height, static_cast<unsigned>(seed));
   SetAlphaChannel(p, 255);
   return p;
 }
@@ -69,7 +69,7 @@ EffectParams PencilLighting(int lighting) {
 // What the loop must write for the picture in file: the pencil sketch of it, as our own JPEG.
 std::string ExpectedJpeg(const std::string& file, const EffectParams& params,
                          const std::string& scratch) {
-  TBitmap32 picture = *LoadPictureFile(file);
+  Bitmap32 picture = *LoadPictureFile(file);
   SetAlphaChannel(picture, 255);
   EffectParams settings = Pencil().Defaults();
   settings.Merge(params);
@@ -141,10 +141,10 @@ TEST_F(BatchFolder, ConvertsEveryPictureIntoAJpegNamedAfterItsInput) {
   EXPECT_EQ(recorder.steps, steps);
 
   // The document holds the last picture: its result as working, the input as source and opened.
-  TBitmap32 last = Picture(19, 11, 2);
+  Bitmap32 last = Picture(19, 11, 2);
   EXPECT_EQ(document.Source(), last);
   EXPECT_EQ(document.Opened(), last);
-  EXPECT_EQ(document.Working(), peccilsketch(last, PencilToneMode::Lighting, 45, 150));
+  EXPECT_EQ(document.Working(), PencilSketch(last, PencilToneMode::Lighting, 45, 150));
 }
 
 // The refusals of a missing input folder or an empty list are shown by the batch window's test.
@@ -161,7 +161,7 @@ TEST_F(BatchFolder, UnloadableEntriesAreSkippedWithoutAnOutputFile) {
   PictureDocument document;
   Recorder recorder;
   BatchObserver observer = recorder.Observer();
-  std::vector<TBitmap32> sources;
+  std::vector<Bitmap32> sources;
   observer.afterEffect = [&](const BatchProgress&, const PictureDocument& d) {
     sources.push_back(d.Source());
   };
@@ -238,8 +238,8 @@ TEST_F(BatchFolder, HistoryGrowsPerPictureOnlyForEffectsThatRecordBatchSteps) {
   EXPECT_EQ(loud.UndoCount(), 2);
   EXPECT_EQ(loud.Slot(loud.CurrentSlot()), loud.Working());
   ASSERT_TRUE(loud.Undo());
-  TBitmap32 first = Picture(10, 7, 7);
-  EXPECT_EQ(loud.Working(), peccilsketch(first, PencilToneMode::Contrast, 45, 128));
+  Bitmap32 first = Picture(10, 7, 7);
+  EXPECT_EQ(loud.Working(), PencilSketch(first, PencilToneMode::Contrast, 45, 128));
 }
 
 // A failed write, an effect error and an output folder in the way of a file stop the loop: the

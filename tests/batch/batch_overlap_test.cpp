@@ -27,7 +27,7 @@ std::string Hash(const std::string& bytes) {
   return std::to_string(hash);
 }
 
-std::string Hex(const TBitmap32& picture) {
+std::string Hex(const Bitmap32& picture) {
   const auto* bytes = reinterpret_cast<const char*>(picture.Data());
   return std::to_string(picture.Width()) + "x" + std::to_string(picture.Height()) + ":" +
          Hash(std::string(bytes, bytes + picture.PixelCount() * 4));

@@ -22,25 +22,25 @@ namespace {
 namespace fs = std::filesystem;
 
 // Alpha varies; the document makes it 255.
-TBitmap32 Picture(int width, int height) {
+Bitmap32 Picture(int width, int height) {
   return RandomPicture(width, height, 7);
 }
 
-TBitmap32 FromPng(const std::string& path) {
-  return LoadPng(path).value_or(TBitmap32());
+Bitmap32 FromPng(const std::string& path) {
+  return LoadPng(path).value_or(Bitmap32());
 }
 
-TBitmap32 Pencil(TBitmap32 picture, PencilToneMode mode, int contrast, int lighting) {
+Bitmap32 Pencil(Bitmap32 picture, PencilToneMode mode, int contrast, int lighting) {
   SetAlphaChannel(picture, 255);
-  return peccilsketch(picture, mode, contrast, lighting);
+  return PencilSketch(picture, mode, contrast, lighting);
 }
 
-using Expected = std::function<TBitmap32(const TBitmap32&)>;
+using Expected = std::function<Bitmap32(const Bitmap32&)>;
 
 // The effect's table routine with these parameters set over its defaults.
 Expected Routine(const char* effect, std::vector<std::pair<const char*, EffectParams::Values>> set,
                  std::uint32_t seed = 0) {
-  return [=](const TBitmap32& input) {
+  return [=](const Bitmap32& input) {
     const EffectSpec& spec = *FindEffectByCliName(effect);
     EffectParams params = spec.Defaults();
     for (const auto& [name, value] : set) params.SetList(name, value);
@@ -52,7 +52,7 @@ Expected Routine(const char* effect, std::vector<std::pair<const char*, EffectPa
 // A JPEG output is the same file our own encoder makes of the result.
 TEST_F(CliRun, ApplyWritesAJpegAsOurOwnEncoderDoes) {
   SaveBitmap24(Picture(31, 22), Path("in.bmp"));
-  const TBitmap32 loaded = *LoadPictureFile(Path("in.bmp"));
+  const Bitmap32 loaded = *LoadPictureFile(Path("in.bmp"));
   ASSERT_EQ(Run("apply pencil-sketch " + Q("in.bmp") + " -o " + Q("out.jpeg")), 0) << err_;
   SaveJpeg(Pencil(loaded, PencilToneMode::Contrast, 45, 128), Path("expected.jpg"), 90);
   EXPECT_EQ(ReadText(Path("out.jpeg")), ReadText(Path("expected.jpg")));
@@ -61,7 +61,7 @@ TEST_F(CliRun, ApplyWritesAJpegAsOurOwnEncoderDoes) {
 // Parameters given on the command line reach the effect: the same bytes as its routine here.
 TEST_F(CliRun, ParametersReachTheEffectsRoutine) {
   SaveBitmap24(Picture(23, 17), Path("in.bmp"));
-  const TBitmap32 loaded = *LoadPictureFile(Path("in.bmp"));
+  const Bitmap32 loaded = *LoadPictureFile(Path("in.bmp"));
   // The parsing is cli_options_test's and the windows check most routines' readings of their
   // values; these are the values only the command line reaches.
   const std::pair<std::string, Expected> cases[] = {
@@ -69,27 +69,27 @@ TEST_F(CliRun, ParametersReachTheEffectsRoutine) {
        Routine("pop-art", {{"kernel", {-2147483648ll, 0, 0, 0, 0, 0, 0, 0, 2147483647}}})},
       {"brume --seed 4000000000", Routine("brume", {}, 4000000000u)},
       // Against the functions themselves, so the table's reading of the values counts too.
-      {"pen-sketch --pen-pressure 200", [](const TBitmap32& p) { return PenSketch(p, 200); }},
+      {"pen-sketch --pen-pressure 200", [](const Bitmap32& p) { return PenSketch(p, 200); }},
       {"vuzorar --vuzorar-pressure 220 --scope 2 --direction falling",
-       [](const TBitmap32& p) { return Vuzorar(p, 220, 2, HatchDirection::Falling); }},
+       [](const Bitmap32& p) { return Vuzorar(p, 220, 2, HatchDirection::Falling); }},
       // The windows of these two apply their own preview.
       {"color-filter --filter cyan",
-       [](const TBitmap32& p) { return filter(p, ColorFilterKind::Cyan); }},
+       [](const Bitmap32& p) { return ColorFilter(p, ColorFilterKind::Cyan); }},
       {"color-variety --more red,cyan,cyan",
-       [](const TBitmap32& p) {
+       [](const Bitmap32& p) {
          return VarietyClicks(p, {1, 5, 5});
        }},
   };
   for (const auto& [arguments, expected] : cases) {
     ASSERT_EQ(Run("apply " + arguments + " " + Q("in.bmp") + " -o " + Q("out.bmp")), 0) << err_;
-    TBitmap32 written = *LoadPictureFile(Path("out.bmp"));
+    Bitmap32 written = *LoadPictureFile(Path("out.bmp"));
     SetAlphaChannel(written, 255);
     EXPECT_EQ(written, expected(loaded)) << arguments;
   }
 }
 
 TEST_F(CliRun, ApplyReadsPngStandardInputAndTheBuiltInPicture) {
-  const TBitmap32 input = Picture(17, 13);
+  const Bitmap32 input = Picture(17, 13);
   SavePng(input, Path("in.png"));
   ASSERT_EQ(Run("apply pencil-sketch " + Q("in.png") + " -o " + Q("out.png")), 0) << err_;
   EXPECT_EQ(FromPng(Path("out.png")), Pencil(input, PencilToneMode::Contrast, 45, 128));

@@ -8,7 +8,7 @@ namespace {
 using Bitmap32Writer = TempFolder;
 
 TEST_F(Bitmap32Writer, WritesEveryByteOfEachPixelBottomRowFirst) {
-  TBitmap32 picture(3, 2);
+  Bitmap32 picture(3, 2);
   picture.At(0, 0) = Pixel{1, 2, 3, 4};
   picture.At(2, 0) = Pixel{5, 6, 7, 8};
   picture.At(1, 1) = Pixel{9, 10, 11, 255};
@@ -21,7 +21,7 @@ TEST_F(Bitmap32Writer, WritesEveryByteOfEachPixelBottomRowFirst) {
   EXPECT_TRUE(SameColours(*LoadPictureFile(Path("w.bmp")), picture));
 
   // Nothing to write is refused, and the file already there stays as it was.
-  EXPECT_THROW(SaveBitmap32(TBitmap32(), Path("w.bmp")), PictureFileError);
+  EXPECT_THROW(SaveBitmap32(Bitmap32(), Path("w.bmp")), PictureFileError);
   EXPECT_EQ(ReadBytes(Path("w.bmp")), expected);
 }
 

@@ -85,7 +85,7 @@ int RgbQuadrant(int x, int y, int c, int w, int h) {
 }
 
 // Checks the middle of each quadrant, away from the blurred edges.
-void ExpectQuadrants(const TBitmap32& picture, int tolerance) {
+void ExpectQuadrants(const Bitmap32& picture, int tolerance) {
   const int w = picture.Width(), h = picture.Height();
   for (const auto& [x, y] :
        {std::pair{w / 4, h / 4}, {3 * w / 4, h / 4}, {w / 4, 3 * h / 4}, {3 * w / 4, 3 * h / 4}}) {
@@ -105,7 +105,7 @@ TEST(JpegDecoder, ReadsBaselineAndProgressiveFiles) {
   const JpegOptions kinds[] = {
       {}, {.progressive = true}, {.progressive = true, .lumaH = 1, .lumaV = 2, .restartRows = 2}};
   for (const JpegOptions& options : kinds) {
-    const TBitmap32 picture = DecodeJpeg(WriteJpeg(w, h, options, rgb));
+    const Bitmap32 picture = DecodeJpeg(WriteJpeg(w, h, options, rgb));
     ASSERT_EQ(picture.Width(), w);
     ASSERT_EQ(picture.Height(), h);
     ExpectQuadrants(picture, 6);
@@ -113,7 +113,7 @@ TEST(JpegDecoder, ReadsBaselineAndProgressiveFiles) {
 }
 
 TEST(JpegDecoder, GrayscaleGivesEqualChannels) {
-  const TBitmap32 picture =
+  const Bitmap32 picture =
       DecodeJpeg(WriteJpeg(64, 8, {.input = JCS_GRAYSCALE, .stored = JCS_GRAYSCALE},
                            [](int x, int, int) { return x * 4; }));
   for (int x = 0; x < 64; ++x) {
@@ -217,7 +217,7 @@ TEST(JpegDecoder, PictureBeyondTheAvailableMemorySaysWhatItNeeds) {
 }
 
 TEST(JpegEncoder, WritesBaselineColourQuality90With420Sampling) {
-  const TBitmap32 picture = PatternPicture(96, 64);
+  const Bitmap32 picture = PatternPicture(96, 64);
   const std::vector<std::uint8_t> file = codecs::EncodeJpeg(picture, 90);
   jpeg_decompress_struct cinfo{};
   jpeg_error_mgr err{};

@@ -65,7 +65,7 @@ TEST(WindowsMetafile, PlaysShapesAndLinesOnWhiteWhateverTheLargestRecordField) {
       if (claimed != 1)
         for (int i = 0; i < 4; ++i)
           file[22 + 12 + i] = static_cast<std::uint8_t>(claimed >> (8 * i));
-      const TBitmap32 p = DecodeMetafile(file);
+      const Bitmap32 p = DecodeMetafile(file);
       SCOPED_TRACE(::testing::Message() << k << " " << claimed);
       ASSERT_EQ(p.Width(), 40);
       ASSERT_EQ(p.Height(), 30);
@@ -79,8 +79,7 @@ TEST(WindowsMetafile, PlaysShapesAndLinesOnWhiteWhateverTheLargestRecordField) {
 
 // A metafile that only draws picture as one 24-bit bitmap at its own size, the window in units
 // of 1/unitsPerInch inch (1440: twips), with or without the placeable header.
-std::vector<std::uint8_t> WmfWithBitmap(const TBitmap32& picture, int unitsPerInch,
-                                        bool placeable) {
+std::vector<std::uint8_t> WmfWithBitmap(const Bitmap32& picture, int unitsPerInch, bool placeable) {
   const int w = picture.Width() * unitsPerInch / 96, h = picture.Height() * unitsPerInch / 96;
   codecs::MemorySink dib;
   codecs::WriteDib24(picture, dib);
@@ -96,10 +95,10 @@ std::vector<std::uint8_t> WmfWithBitmap(const TBitmap32& picture, int unitsPerIn
 
 // Such a file loaded as a blown-up top-left corner (placeable) or at 68 x 68 (not placeable).
 TEST(WindowsMetafile, BitmapDrawnAtItsOwnSizeGivesExactlyItsPixels) {
-  const TBitmap32 picture = PatternPicture(237, 158);
+  const Bitmap32 picture = PatternPicture(237, 158);
   for (const int unitsPerInch : {96, 1440}) {
     for (const bool placeable : {true, false}) {
-      const TBitmap32 p = DecodeMetafile(WmfWithBitmap(picture, unitsPerInch, placeable));
+      const Bitmap32 p = DecodeMetafile(WmfWithBitmap(picture, unitsPerInch, placeable));
       ASSERT_EQ(p.Width(), 237) << unitsPerInch << placeable;
       ASSERT_EQ(p.Height(), 158) << unitsPerInch << placeable;
       EXPECT_TRUE(SameColours(p, picture)) << unitsPerInch << placeable;
@@ -193,7 +192,7 @@ std::vector<std::uint8_t> BitBlt(int x, int y) {
   return w.bytes;
 }
 
-void ExpectBlocks(const TBitmap32& p, int x0, int y0, int block) {
+void ExpectBlocks(const Bitmap32& p, int x0, int y0, int block) {
   EXPECT_EQ(p.At(x0, y0), kRed);
   EXPECT_EQ(p.At(x0 + block - 1, y0 + block - 1), kRed);
   EXPECT_EQ(p.At(x0 + block, y0), kGreen);
@@ -203,7 +202,7 @@ void ExpectBlocks(const TBitmap32& p, int x0, int y0, int block) {
 
 TEST(EnhancedMetafile, PlaysBitmapRecordsWithTheirPlacement) {
   // Stretched to fill a 4 x 4 frame: each source pixel becomes a 2 x 2 block.
-  const TBitmap32 stretched = DecodeMetafile(Emf(4, 4, StretchDiBits(0, 0, 4, 4)));
+  const Bitmap32 stretched = DecodeMetafile(Emf(4, 4, StretchDiBits(0, 0, 4, 4)));
   ASSERT_EQ(stretched.Width(), 4);
   ASSERT_EQ(stretched.Height(), 4);
   ExpectBlocks(stretched, 0, 0, 2);
@@ -216,7 +215,7 @@ TEST(EnhancedMetafile, PlaysBitmapRecordsWithTheirPlacement) {
   ExpectBlocks(DecodeMetafile(Emf(4, 4, transformed.bytes)), 0, 0, 2);
 
   // A blit at (3, 1) on a 6 x 4 frame; the rest stays white.
-  const TBitmap32 blit = DecodeMetafile(Emf(6, 4, BitBlt(3, 1)));
+  const Bitmap32 blit = DecodeMetafile(Emf(6, 4, BitBlt(3, 1)));
   ASSERT_EQ(blit.Width(), 6);
   ExpectBlocks(blit, 3, 1, 1);
   EXPECT_EQ(blit.At(0, 0), kWhite);
@@ -255,7 +254,7 @@ std::vector<std::uint8_t> EmfWithPolygon() {
 }
 
 TEST(EnhancedMetafile, DrawsVectorContentOnWhite) {
-  const TBitmap32 p = DecodeMetafile(EmfWithPolygon());
+  const Bitmap32 p = DecodeMetafile(EmfWithPolygon());
   ASSERT_EQ(p.Width(), 40);
   ASSERT_EQ(p.Height(), 30);
   // Inside, away from the antialiased edges, and well outside.
@@ -272,7 +271,7 @@ TEST(EnhancedMetafile, DrawsVectorContentOnWhite) {
   both.U32(39).U32(24).U32(1).U32(0).U32(0x000000FF).U32(0);
   both.U32(37).U32(12).U32(1).U32(37).U32(12).U32(0x80000008);
   both.U32(43).U32(24).I32(10).I32(5).I32(30).I32(25);  // Rectangle
-  const TBitmap32 mixed = DecodeMetafile(Emf(40, 30, both.bytes));
+  const Bitmap32 mixed = DecodeMetafile(Emf(40, 30, both.bytes));
   EXPECT_EQ(mixed.At(1, 1), kRed);
   EXPECT_EQ(mixed.At(6, 1), kGreen);
   EXPECT_EQ(mixed.At(1, 6), kBlue);
@@ -294,7 +293,7 @@ TEST(EnhancedMetafile, DrawsText) {
   w.I32(0).I32(0).I32(0).I32(0).U32(0);
   for (char c : std::string("Hello")) w.U16(static_cast<unsigned char>(c));
   w.U16(0);
-  const TBitmap32 p = DecodeMetafile(Emf(200, 60, w.bytes));
+  const Bitmap32 p = DecodeMetafile(Emf(200, 60, w.bytes));
   int dark = 0;
   for (int y = 0; y < p.Height(); ++y) {
     for (int x = 0; x < p.Width(); ++x) dark += p.At(x, y).g < 128;

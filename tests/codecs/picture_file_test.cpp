@@ -17,7 +17,7 @@ namespace {
 using PictureFiles = TempFolder;
 
 TEST_F(PictureFiles, ChoosesTheDecoderByTheLastFourCharacters) {
-  const TBitmap32 picture = PatternPicture(20, 10);
+  const Bitmap32 picture = PatternPicture(20, 10);
   SaveJpeg(picture, Path("photo.jpeg"));
   for (const char* copy : {"photo.JPEG", "photo.Jpg", "photo.jpe"})
     std::filesystem::copy_file(Path("photo.jpeg"), Path(copy));
@@ -73,20 +73,20 @@ TEST_F(PictureFiles, UnreadableIconIsReportedThroughTheNoticeAndGivesEmpty) {
 // Every writer, under the name it is tested with; JPEG's loss is bounded on smooth pictures.
 struct Writer {
   const char* name;
-  void (*save)(const TBitmap32&, const std::string&);
+  void (*save)(const Bitmap32&, const std::string&);
   int tolerance;
 };
 const Writer kWriters[] = {
-    {"out.bmp", [](const TBitmap32& p, const std::string& f) { SaveBitmap24(p, f); }, 0},
-    {"out.jpg", [](const TBitmap32& p, const std::string& f) { SaveJpeg(p, f); }, 8},
-    {"out.wmf", [](const TBitmap32& p, const std::string& f) { SaveMetafile(p, f); }, 0},
-    {"out.EMF", [](const TBitmap32& p, const std::string& f) { SaveMetafile(p, f); }, 0},
-    {"out.png", [](const TBitmap32& p, const std::string& f) { SavePng(p, f); }, 0}};
+    {"out.bmp", [](const Bitmap32& p, const std::string& f) { SaveBitmap24(p, f); }, 0},
+    {"out.jpg", [](const Bitmap32& p, const std::string& f) { SaveJpeg(p, f); }, 8},
+    {"out.wmf", [](const Bitmap32& p, const std::string& f) { SaveMetafile(p, f); }, 0},
+    {"out.EMF", [](const Bitmap32& p, const std::string& f) { SaveMetafile(p, f); }, 0},
+    {"out.png", [](const Bitmap32& p, const std::string& f) { SavePng(p, f); }, 0}};
 
 // Only PNG keeps alpha; the others come back opaque.
 TEST_F(PictureFiles, EachWriterRoundTripsAtEverySize) {
   for (const auto& [w, h] : {std::pair{1, 1}, {3, 2}, {101, 57}, {640, 3}}) {
-    TBitmap32 picture(w, h);
+    Bitmap32 picture(w, h);
     for (int y = 0; y < h; ++y)
       for (int x = 0; x < w; ++x)
         picture.At(x, y) = Pixel{
@@ -128,8 +128,8 @@ TEST_F(PictureFiles, SaveIntoAMissingFolderFailsClearly) {
   EXPECT_TRUE(Entries().empty());
 }
 
-// Saving replaced the file by a new one at mode 0644, a link by a file, overwrote a read-only
-// file, and a save cut short by a crash left its ".name.tmp" behind.
+// Saving replaced the file by a new one at the umask's mode, a link by a file, overwrote a
+// read-only file, and a save cut short by a crash left its ".name.tmp" behind.
 TEST_F(PictureFiles, SaveKeepsModeLinksAndReadOnlyFilesAndLeavesNoTemporaryFile) {
   WriteBytes(Path("private.jpg"), {1});
   ::chmod(Path("private.jpg").c_str(), 0640);
@@ -137,6 +137,19 @@ TEST_F(PictureFiles, SaveKeepsModeLinksAndReadOnlyFilesAndLeavesNoTemporaryFile)
   struct stat info {};
   ASSERT_EQ(::stat(Path("private.jpg").c_str(), &info), 0);
   EXPECT_EQ(info.st_mode & 07777, 0640u);
+
+  // A restrictive umask shapes new files only: a replaced file keeps its own bits.
+  WriteBytes(Path("shared.jpg"), {1});
+  ::chmod(Path("shared.jpg").c_str(), 0664);
+  const mode_t umaskBefore = ::umask(027);
+  SaveJpeg(PatternPicture(8, 8), Path("shared.jpg"));
+  SaveJpeg(PatternPicture(8, 8), Path("new.jpg"));
+  ::umask(umaskBefore);
+  for (const auto& [name, mode] : {std::pair{"shared.jpg", 0664u}, std::pair{"new.jpg", 0640u}}) {
+    ASSERT_EQ(::stat(Path(name).c_str(), &info), 0);
+    EXPECT_EQ(info.st_mode & 07777, mode) << name;
+    std::filesystem::remove(Path(name));
+  }
 
   std::filesystem::create_symlink("private.jpg", Path("link.jpg"));
   SaveJpeg(PatternPicture(5, 5), Path("link.jpg"));
@@ -166,8 +179,8 @@ TEST_F(PictureFiles, SaveKeepsModeLinksAndReadOnlyFilesAndLeavesNoTemporaryFile)
 
 TEST_F(PictureFiles, EmptyPictureIsNotSaved) {
   WriteBytes(Path("keep.bmp"), {1, 2, 3});
-  EXPECT_THROW(SaveBitmap24(TBitmap32(), Path("keep.bmp")), PictureFileError);
-  EXPECT_THROW(SaveJpeg(TBitmap32(), Path("keep.bmp")), PictureFileError);
+  EXPECT_THROW(SaveBitmap24(Bitmap32(), Path("keep.bmp")), PictureFileError);
+  EXPECT_THROW(SaveJpeg(Bitmap32(), Path("keep.bmp")), PictureFileError);
   EXPECT_EQ(ReadBytes(Path("keep.bmp")), (std::vector<std::uint8_t>{1, 2, 3}));
 }
 
@@ -175,7 +188,7 @@ TEST_F(PictureFiles, EmptyPictureIsNotSaved) {
 // keep its bytes and no temporary file may be left behind.
 TEST_F(PictureFiles, FailedWriteLeavesTheOldFileUntouched) {
   const std::vector<std::uint8_t> old = {'o', 'l', 'd', ' ', 'f', 'i', 'l', 'e'};
-  const TBitmap32 picture = PatternPicture(300, 300);
+  const Bitmap32 picture = PatternPicture(300, 300);
 
   for (const Writer& writer : kWriters) {
     const std::string path = Path(writer.name);

@@ -10,7 +10,7 @@ namespace {
 using codecs::DecodeWithQt;
 using codecs::QtFormat;
 
-TBitmap32 Bmp(const std::vector<std::uint8_t>& file) {
+Bitmap32 Bmp(const std::vector<std::uint8_t>& file) {
   return DecodeWithQt(file, QtFormat::kBitmap);
 }
 
@@ -32,7 +32,7 @@ TEST(BitmapDecoder, ConvertsPalettedCompressedAndDeepPicturesAndBothRowOrders) {
       {"RLE8", BmpFile(BmpInfoHeader(40, 3, 2, 8, 1, rle8.size(), 4), kPalette, rle8)}};
   for (const auto& [what, file] : cases) {
     SCOPED_TRACE(what);
-    const TBitmap32 p = Bmp(file);
+    const Bitmap32 p = Bmp(file);
     ASSERT_EQ(p.Width(), 3);
     ASSERT_EQ(p.Height(), 2);
     const Pixel want[2][3] = {{kRed, kGreen, kBlue}, {kBlack, kRed, kBlack}};
@@ -44,7 +44,7 @@ TEST(BitmapDecoder, ConvertsPalettedCompressedAndDeepPicturesAndBothRowOrders) {
 // Unlike an icon's, a bitmap's alpha is kept as stored, not painted over white.
 TEST(BitmapDecoder, KeepsTheAlphaOfAVersion5Header) {
   const std::vector<std::uint8_t> bits = {0, 0, 255, 255, 0, 255, 0, 128, 255, 0, 0, 0};
-  const TBitmap32 p = Bmp(BmpFile(
+  const Bitmap32 p = Bmp(BmpFile(
       BmpInfoHeader(124, 3, 1, 32, 3, 12, 0, {0xFF0000, 0xFF00, 0xFF, 0xFF000000}), {}, bits));
   ASSERT_EQ(p.Width(), 3);
   EXPECT_EQ(p.At(0, 0), kRed);
@@ -122,7 +122,7 @@ std::vector<std::uint8_t> IcoFile(const std::vector<IconImage>& images) {
 TEST(IconDecoder, TakesTheLargestDeepestEntryAndPaintsTransparencyWhite) {
   const std::vector<std::uint8_t> file =
       IcoFile({{16, 32, kBlue}, {32, 8, kGreen}, {32, 32, kRed}, {24, 32, kBlue}});
-  const TBitmap32 icon = DecodeWithQt(file, QtFormat::kIcon);
+  const Bitmap32 icon = DecodeWithQt(file, QtFormat::kIcon);
   ASSERT_EQ(icon.Width(), 32);
   ASSERT_EQ(icon.Height(), 32);
   EXPECT_EQ(icon.At(5, 5), kRed);
@@ -131,7 +131,7 @@ TEST(IconDecoder, TakesTheLargestDeepestEntryAndPaintsTransparencyWhite) {
   EXPECT_EQ(icon.At(0, 0), (Pixel{255, 255, 255, 0}));
   EXPECT_EQ(icon.At(1, 0), (Pixel{127, 127, 255, 128}));
   // Of two equally large entries the deeper one wins, wherever it is listed.
-  const TBitmap32 deeper =
+  const Bitmap32 deeper =
       DecodeWithQt(IcoFile({{32, 32, kBlue}, {32, 8, kGreen}}), QtFormat::kIcon);
   EXPECT_EQ(deeper.At(5, 5), kBlue);
 }
@@ -154,7 +154,7 @@ const std::vector<std::uint8_t> kGifPalette = {255, 0, 0, 0, 255, 0, 0, 0, 255, 
 TEST(GifDecoder, TransparentPixelsAndUncoveredScreenBecomeWhite) {
   // A 4 x 3 screen, cut to the frame's right and bottom edges; a 2 x 2 frame at (1, 1) whose
   // index 3 is transparent.
-  const TBitmap32 p =
+  const Bitmap32 p =
       DecodeWithQt(GifFile(4, 3, 1, 1, 2, 2, kGifPalette, {0, 3, 1, 2}, 3), QtFormat::kGif);
   ASSERT_EQ(p.Width(), 3);
   ASSERT_EQ(p.Height(), 3);
@@ -171,7 +171,7 @@ TEST(GifDecoder, TransparentPixelsAndUncoveredScreenBecomeWhite) {
 TEST(GifDecoder, FiftyMegapixelPictureOpensAndALargerScreenIsNotAllocated) {
   // Screen width and height, and the 1 x 1 frame's place, which is the picture's corner.
   for (const auto& [sw, sh, x, y] : {std::array{8200, 6200, 8199, 6199}, {16000, 16000, 0, 0}}) {
-    const TBitmap32 p =
+    const Bitmap32 p =
         DecodeWithQt(GifFile(sw, sh, x, y, 1, 1, kGifPalette, {1}, -1), QtFormat::kGif);
     EXPECT_EQ(p.Width(), x + 1);
     EXPECT_EQ(p.Height(), y + 1);

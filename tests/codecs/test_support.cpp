@@ -51,8 +51,8 @@ std::vector<std::uint8_t> ReadBytes(const std::string& path) {
   return std::vector<std::uint8_t>(std::istreambuf_iterator<char>(in), {});
 }
 
-TBitmap32 PatternPicture(int width, int height, std::uint8_t alpha) {
-  TBitmap32 picture(width, height);
+Bitmap32 PatternPicture(int width, int height, std::uint8_t alpha) {
+  Bitmap32 picture(width, height);
   std::uint32_t noise = 12345;
   for (int y = 0; y < height; ++y) {
     Pixel* row = picture.ScanLine(y);
@@ -68,7 +68,7 @@ TBitmap32 PatternPicture(int width, int height, std::uint8_t alpha) {
   return picture;
 }
 
-int MaxColourDifference(const TBitmap32& a, const TBitmap32& b) {
+int MaxColourDifference(const Bitmap32& a, const Bitmap32& b) {
   int worst = 0;
   for (int y = 0; y < a.Height(); ++y) {
     for (int x = 0; x < a.Width(); ++x) {
@@ -79,7 +79,7 @@ int MaxColourDifference(const TBitmap32& a, const TBitmap32& b) {
   return worst;
 }
 
-bool SameColours(const TBitmap32& a, const TBitmap32& b) {
+bool SameColours(const Bitmap32& a, const Bitmap32& b) {
   return a.Width() == b.Width() && a.Height() == b.Height() && MaxColourDifference(a, b) == 0;
 }
 

@@ -84,10 +84,10 @@ constexpr Pixel kBlack{0, 0, 0, 255};
 
 // A picture with every pixel different: gradients plus a little deterministic noise, alpha
 // 255 unless given.
-TBitmap32 PatternPicture(int width, int height, std::uint8_t alpha = 255);
+Bitmap32 PatternPicture(int width, int height, std::uint8_t alpha = 255);
 // Largest per-channel difference of the colour bytes; the sizes must match.
-int MaxColourDifference(const TBitmap32& a, const TBitmap32& b);
-bool SameColours(const TBitmap32& a, const TBitmap32& b);
+int MaxColourDifference(const Bitmap32& a, const Bitmap32& b);
+bool SameColours(const Bitmap32& a, const Bitmap32& b);
 
 // A BMP file around a given info header, palette or masks, and pixel bytes.
 std::vector<std::uint8_t> BmpFile(const std::vector<std::uint8_t>& infoHeader,

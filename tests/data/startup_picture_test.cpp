@@ -12,7 +12,7 @@ namespace quillane {
 namespace {
 
 TEST(StartupPicture, IsAnOpaqueDetailedPictureOfTheFixedSize) {
-  const TBitmap32 picture = StartupPicture();
+  const Bitmap32 picture = StartupPicture();
   ASSERT_EQ(picture.Width(), 521);
   ASSERT_EQ(picture.Height(), 346);
   std::set<std::uint32_t> colours;
@@ -48,12 +48,12 @@ std::vector<std::uint8_t> SmallBitmap(int width, int height, bool topDown) {
 }
 
 TEST(DecodeBitmap24, ReadsBottomUpAndTopDownRowsWithPadding) {
-  const TBitmap32 bottomUp = DecodeBitmap24(SmallBitmap(3, 2, false));
+  const Bitmap32 bottomUp = DecodeBitmap24(SmallBitmap(3, 2, false));
   ASSERT_EQ(bottomUp.Width(), 3);
   ASSERT_EQ(bottomUp.Height(), 2);
   EXPECT_EQ(bottomUp.At(2, 0), (Pixel{2, 1, 200, 255}));  // the last file row is the top
   EXPECT_EQ(bottomUp.At(1, 1), (Pixel{1, 0, 200, 255}));
-  const TBitmap32 topDown = DecodeBitmap24(SmallBitmap(3, 2, true));
+  const Bitmap32 topDown = DecodeBitmap24(SmallBitmap(3, 2, true));
   EXPECT_EQ(topDown.At(2, 0), (Pixel{2, 0, 200, 255}));
   EXPECT_EQ(topDown.At(1, 1), (Pixel{1, 1, 200, 255}));
 }

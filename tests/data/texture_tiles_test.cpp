@@ -25,7 +25,7 @@ constexpr Expected kLightness[kTextureTiles] = {
 TEST(TextureTiles, AreGrayWithTheirLightnessAndRepeatWithoutSeams) {
   for (int n = 1; n <= kTextureTiles; ++n) {
     SCOPED_TRACE(n);
-    const TBitmap32 tile = TextureTile(n);
+    const Bitmap32 tile = TextureTile(n);
     ASSERT_EQ(tile.Width(), 58);
     ASSERT_EQ(tile.Height(), 58);
     int lo = 100, hi = 0;

@@ -5,15 +5,15 @@
 namespace quillane {
 namespace {
 
-TBitmap32 Flat(int w, int h, std::uint8_t v) {
-  return TBitmap32(w, h, Pixel{v, v, v, 255});
+Bitmap32 Flat(int w, int h, std::uint8_t v) {
+  return Bitmap32(w, h, Pixel{v, v, v, 255});
 }
 
 // One picture, held once: a 24-megapixel picture was held four times over once opened.
 TEST(PictureDocument, StartsWithOnePictureEverywhereHeldOnce) {
-  PictureDocument doc(TBitmap32(3, 2, Pixel{1, 2, 3, 0}));
-  EXPECT_EQ(doc.Working(), TBitmap32(3, 2, Pixel{1, 2, 3, 255}));
-  for (const TBitmap32* p : {&doc.Source(), &doc.Opened(), &doc.Slot(1)})
+  PictureDocument doc(Bitmap32(3, 2, Pixel{1, 2, 3, 0}));
+  EXPECT_EQ(doc.Working(), Bitmap32(3, 2, Pixel{1, 2, 3, 255}));
+  for (const Bitmap32* p : {&doc.Source(), &doc.Opened(), &doc.Slot(1)})
     EXPECT_EQ(p->Data(), doc.Working().Data());
   EXPECT_FALSE(doc.CanUndo());
   EXPECT_FALSE(doc.CanRedo());
@@ -73,8 +73,8 @@ TEST(PictureDocument, LoadReplacesPicturesButKeepsHistory) {
   PictureDocument doc(Flat(2, 2, 0));
   doc.SetWorking(Flat(2, 2, 1));
   doc.Backup();
-  doc.Load(TBitmap32(5, 1, Pixel{1, 1, 1, 0}));
-  EXPECT_EQ(doc.Opened(), TBitmap32(5, 1, Pixel{1, 1, 1, 255}));
+  doc.Load(Bitmap32(5, 1, Pixel{1, 1, 1, 0}));
+  EXPECT_EQ(doc.Opened(), Bitmap32(5, 1, Pixel{1, 1, 1, 255}));
   EXPECT_EQ(doc.UndoCount(), 1);
 }
 

@@ -14,20 +14,20 @@ TEST(PackedPicture, GivesBackEveryByte) {
   // Awkward sizes, and one tall enough to be packed in several bands on several threads.
   const struct { int w, h; } sizes[] = {{0, 0}, {1, 1}, {1, 9}, {9, 1}, {7, 5}, {300, 2000}};
   for (const auto& size : sizes) {
-    const TBitmap32 picture = RandomPicture(size.w, size.h, 7);
+    const Bitmap32 picture = RandomPicture(size.w, size.h, 7);
     const PackedPicture packed = PackedPicture::Pack(picture);
     EXPECT_EQ(packed.Unpack(), picture) << size.w << "x" << size.h;
-    TBitmap32 reused = RandomPicture(size.w, size.h, 8);  // same size: its storage is overwritten
+    Bitmap32 reused = RandomPicture(size.w, size.h, 8);  // same size: its storage is overwritten
     packed.UnpackInto(reused);
     EXPECT_EQ(reused, picture) << size.w << "x" << size.h;
   }
-  const TBitmap32 flat(1000, 1000, Pixel{255, 255, 255, 255});
+  const Bitmap32 flat(1000, 1000, Pixel{255, 255, 255, 255});
   EXPECT_LT(PackedPicture::Pack(flat).Bytes(), flat.PixelCount() * 4 / 100);
 }
 
 // Each step has its own size, so undo moves between storage of different sizes as well.
 TEST(PictureDocument, UndoAndRedoAfterPackingGiveBackTheExactStates) {
-  std::vector<TBitmap32> states{RandomPicture(40, 30, 0)};
+  std::vector<Bitmap32> states{RandomPicture(40, 30, 0)};
   PictureDocument doc(states[0]);
   for (std::uint32_t i = 1; i <= 24; ++i) {
     states.push_back(RandomPicture(40 + static_cast<int>(i % 3), 30, i));
@@ -57,7 +57,7 @@ TEST(PictureDocument, UndoAndRedoAfterPackingGiveBackTheExactStates) {
 }
 
 TEST(PictureDocument, ANewStepAfterUndoDiscardsRedoAndLetsUnreachableStatesGo) {
-  const auto flat = [](std::uint8_t v) { return TBitmap32(2, 2, Pixel{v, v, v, 255}); };
+  const auto flat = [](std::uint8_t v) { return Bitmap32(2, 2, Pixel{v, v, v, 255}); };
   PictureDocument doc(flat(1));
   for (std::uint8_t v = 2; v <= 4; ++v) {
     doc.SetWorking(flat(v));

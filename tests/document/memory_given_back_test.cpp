@@ -24,7 +24,7 @@ TEST(MemoryGivenBack, OpeningASmallPictureAfterABigOne) {
 #endif
   SetUpPictureMemory();
   constexpr std::int64_t kBig = 6000 * 4000 * 4;  // a 24-megapixel picture
-  const auto big = [](std::uint8_t v) { return TBitmap32(6000, 4000, Pixel{v, v, v, 255}); };
+  const auto big = [](std::uint8_t v) { return Bitmap32(6000, 4000, Pixel{v, v, v, 255}); };
   const std::int64_t before = ResidentBytes();
   {
     PictureDocument document(big(1));
@@ -40,7 +40,7 @@ TEST(MemoryGivenBack, OpeningASmallPictureAfterABigOne) {
     EXPECT_GE(KeptPictureBytes(), static_cast<std::size_t>(kBig));
     EXPECT_GE(ResidentBytes() - before, 2 * kBig);
 
-    document.Load(TBitmap32(451, 300, Pixel{7, 8, 9, 255}));
+    document.Load(Bitmap32(451, 300, Pixel{7, 8, 9, 255}));
     document.ResetHistory();
     PictureDocument::WaitForHistoryPacking();
     EXPECT_EQ(KeptPictureBytes(), 0u);

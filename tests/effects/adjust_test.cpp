@@ -44,8 +44,8 @@ Pixel Changed(Pixel p, char zone) {
 }
 
 TEST(ColorPanel, Panel2x2WritesQuartersFromTheHalfSizeCopy) {
-  const TBitmap32 in = RandomPicture(4, 4, 5);
-  const TBitmap32 out = ColorPanel(in, PanelLayout::Panel2x2);
+  const Bitmap32 in = RandomPicture(4, 4, 5);
+  const Bitmap32 out = ColorPanel(in, PanelLayout::Panel2x2);
   for (int y = 0; y < 4; ++y)
     for (int x = 0; x < 4; ++x) {
       if (x % 2 == 1 && y % 2 == 1) continue;
@@ -61,7 +61,7 @@ TEST(ColorPanel, Panel2x2WritesQuartersFromTheHalfSizeCopy) {
 }
 
 TEST(ColorPanel, Panel3x3TilesAThirdSizeCopyWithAlphaZero) {
-  const TBitmap32 out = ColorPanel(RandomPicture(301, 200, 2), PanelLayout::Panel3x3);
+  const Bitmap32 out = ColorPanel(RandomPicture(301, 200, 2), PanelLayout::Panel3x3);
   ASSERT_EQ(out.Width(), 300);
   ASSERT_EQ(out.Height(), 198);
   for (int y = 0; y < 198; ++y)
@@ -69,7 +69,7 @@ TEST(ColorPanel, Panel3x3TilesAThirdSizeCopyWithAlphaZero) {
   for (auto [w, h] : {std::pair{2, 9}, {9, 2}, {0, 0}})
     EXPECT_TRUE(ColorPanel(RandomPicture(w, h, 1), PanelLayout::Panel3x3).Empty());
   // One source pixel per tile: every tile's own tint.
-  const TBitmap32 tiles = ColorPanel(TBitmap32(3, 3, Rgb3(100, 30, 200)), PanelLayout::Panel3x3);
+  const Bitmap32 tiles = ColorPanel(Bitmap32(3, 3, Rgb3(100, 30, 200)), PanelLayout::Panel3x3);
   const Pixel expected[9] = {Rgb3(255, 30, 200), Rgb3(0, 150, 80),   Rgb3(100, 30, 255),
                              Rgb3(20, 90, 255),  Rgb3(220, 90, 200), Rgb3(255, 30, 255),
                              Rgb3(180, 0, 255),  Rgb3(0, 110, 255),  Rgb3(180, 110, 0)};
@@ -115,8 +115,8 @@ TEST(ColorPanel, ZoneLayoutsMatchTheirBordersOnOddAndEvenSizes) {
   for (PanelLayout layout : {PanelLayout::Pane2x2, PanelLayout::Pane3x3, PanelLayout::Catercorner4,
                              PanelLayout::Catercorner16})
     for (auto [w, h] : kSizes) {
-      const TBitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w * h));
-      TBitmap32 expected = in;
+      const Bitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w * h));
+      Bitmap32 expected = in;
       for (int y = 1; y < h; ++y)
         for (int x = 1; x < w; ++x)
           expected.At(x, y) = Changed(in.At(x, y), PlainZone(layout, x, y, w, h));
@@ -124,7 +124,7 @@ TEST(ColorPanel, ZoneLayoutsMatchTheirBordersOnOddAndEvenSizes) {
           << static_cast<int>(layout) << " " << w << "x" << h;
     }
   // Pane 3 x 3 at width 300: column 100 is in the left zone, column 200 in the middle one.
-  const TBitmap32 pane = ColorPanel(TBitmap32(300, 2, Rgb3(10, 10, 10)), PanelLayout::Pane3x3);
+  const Bitmap32 pane = ColorPanel(Bitmap32(300, 2, Rgb3(10, 10, 10)), PanelLayout::Pane3x3);
   EXPECT_EQ(pane.At(100, 1), Rgb3(110, 255, 10));
   EXPECT_EQ(pane.At(200, 1), Rgb3(10, 60, 255));
   EXPECT_EQ(pane.At(201, 1), Rgb3(10, 255, 10));
@@ -145,27 +145,25 @@ TEST(ColorFilter, GrayThenTheFilterChannelsAtFull) {
   for (const Case& c : cases) {
     Pixel in = c.in;
     in.a = 0;
-    EXPECT_EQ(filter(TBitmap32(1, 1, in), c.kind).At(0, 0), c.out) << static_cast<int>(c.kind);
+    EXPECT_EQ(ColorFilter(Bitmap32(1, 1, in), c.kind).At(0, 0), c.out) << static_cast<int>(c.kind);
   }
-  EXPECT_TRUE(filter(TBitmap32(), ColorFilterKind::Red).Empty());
+  EXPECT_TRUE(ColorFilter(Bitmap32(), ColorFilterKind::Red).Empty());
 }
 
 TEST(ColorVariety, ClicksAccumulateUpToFull) {
-  const TBitmap32 one(1, 1, Rgb3(100, 150, 250));
+  const Bitmap32 one(1, 1, Rgb3(100, 150, 250));
   EXPECT_EQ(variety(one, 4).At(0, 0), Rgb3(110, 160, 250));
   EXPECT_EQ(variety(variety(one, 4), 4).At(0, 0), Rgb3(120, 170, 250));
   EXPECT_EQ(VarietyClicks(one, {1, 5}).At(0, 0), Rgb3(110, 160, 255));
-  EXPECT_EQ(
-      VarietyClicks(TBitmap32(1, 1, Rgb3(5, 0, 0)), std::vector<std::int64_t>(25, 1)).At(0, 0),
-      Rgb3(255, 0, 0));
-  EXPECT_EQ(
-      VarietyClicks(TBitmap32(1, 1, Rgb3(4, 0, 0)), std::vector<std::int64_t>(25, 1)).At(0, 0),
-      Rgb3(254, 0, 0));
+  EXPECT_EQ(VarietyClicks(Bitmap32(1, 1, Rgb3(5, 0, 0)), std::vector<std::int64_t>(25, 1)).At(0, 0),
+            Rgb3(255, 0, 0));
+  EXPECT_EQ(VarietyClicks(Bitmap32(1, 1, Rgb3(4, 0, 0)), std::vector<std::int64_t>(25, 1)).At(0, 0),
+            Rgb3(254, 0, 0));
   // All at once is click after click, on every size.
   for (auto [w, h] : {std::pair{13, 7}, {1, 1}, {0, 0}}) {
-    const TBitmap32 in = RandomPicture(w, h, 4);
+    const Bitmap32 in = RandomPicture(w, h, 4);
     const std::vector<std::int64_t> clicks = {3, 6, 6, 2, 4, 5, 1, 6};
-    TBitmap32 stepwise = in;
+    Bitmap32 stepwise = in;
     for (std::int64_t c : clicks) stepwise = variety(stepwise, static_cast<int>(c));
     EXPECT_EQ(VarietyClicks(in, clicks), stepwise) << w << "x" << h;
   }

@@ -6,8 +6,8 @@ namespace quillane {
 namespace {
 
 // Every pixel a colour of its own, so a copied pixel tells where it came from; alpha 7.
-TBitmap32 Numbered(int w, int h) {
-  TBitmap32 b(w, h);
+Bitmap32 Numbered(int w, int h) {
+  Bitmap32 b(w, h);
   for (int y = 0; y < h; ++y)
     for (int x = 0; x < w; ++x)
       b.At(x, y) = Pixel{static_cast<std::uint8_t>(x), static_cast<std::uint8_t>(x >> 8),
@@ -20,8 +20,8 @@ TEST(Brume, TheFirstDrawsAfterStartPickTheKnownPixelsAndTheNextRunGoesOn) {
   for (std::uint32_t expected : {0u, 0u, 5u, 1u, 1u, 4u}) EXPECT_EQ(RandomDraw(seed, 6), expected);
 
   seed = 0;
-  const TBitmap32 source = Numbered(5, 4);
-  const TBitmap32 out = Brume(source, 3, seed);
+  const Bitmap32 source = Numbered(5, 4);
+  const Bitmap32 out = Brume(source, 3, seed);
   const auto opaque = [](Pixel p) { return Pixel{p.b, p.g, p.r, 255}; };
   EXPECT_EQ(out.At(1, 1), opaque(source.At(0, 0)));
   EXPECT_EQ(out.At(2, 1), opaque(source.At(0, 3)));

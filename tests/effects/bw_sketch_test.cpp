@@ -8,8 +8,8 @@
 namespace quillane {
 namespace {
 
-TBitmap32 Scene() {
-  TBitmap32 b(9, 7);
+Bitmap32 Scene() {
+  Bitmap32 b(9, 7);
   for (int y = 0; y < 7; ++y)
     for (int x = 0; x < 9; ++x)
       b.At(x, y) = Pixel{static_cast<std::uint8_t>(x * 30), static_cast<std::uint8_t>(y * 40),
@@ -18,11 +18,11 @@ TBitmap32 Scene() {
 }
 
 TEST(PencilSketch, LightingAtNeutralIsTheGrayEdgeMap) {
-  TBitmap32 edges = Scene();
-  picsobel(edges);
+  Bitmap32 edges = Scene();
+  InvertedSobelEdges(edges);
   ConvertToGray(edges);
-  EXPECT_EQ(peccilsketch(Scene(), PencilToneMode::Lighting, 3, 128), edges);
-  EXPECT_TRUE(peccilsketch(TBitmap32(), PencilToneMode::Contrast, 45, 128).Empty());
+  EXPECT_EQ(PencilSketch(Scene(), PencilToneMode::Lighting, 3, 128), edges);
+  EXPECT_TRUE(PencilSketch(Bitmap32(), PencilToneMode::Contrast, 45, 128).Empty());
 }
 
 }  // namespace

@@ -13,8 +13,8 @@ namespace quillane {
 namespace {
 
 // Random colours; alpha 0 or 255 in most pixels, so that stria meets every case.
-TBitmap32 Picture(int w, int h, unsigned seed) {
-  TBitmap32 b = RandomPicture(w, h, seed);
+Bitmap32 Picture(int w, int h, unsigned seed) {
+  Bitmap32 b = RandomPicture(w, h, seed);
   std::mt19937 rng(seed);
   for (int y = 0; y < h; ++y)
     for (int x = 0; x < w; ++x) {
@@ -29,10 +29,10 @@ TEST(ColourFastPath, FilterAndPanelEqualThePlainOnes) {
   ForEachSplit([&] {
     unsigned seed = 0;
     for (const auto& [w, h] : kAwkwardSizes) {
-      const TBitmap32 in = Picture(w, h, ++seed);
+      const Bitmap32 in = Picture(w, h, ++seed);
       for (int k = 1; k <= 6; ++k) {
         SCOPED_TRACE(::testing::Message() << w << "x" << h << " kind or layout " << k);
-        ASSERT_EQ(filter(in, ColorFilterKind(k)), FilterReference(in, ColorFilterKind(k)));
+        ASSERT_EQ(ColorFilter(in, ColorFilterKind(k)), FilterReference(in, ColorFilterKind(k)));
         ASSERT_EQ(ColorPanel(in, PanelLayout(k)), ColorPanelReference(in, PanelLayout(k)));
       }
     }
@@ -54,7 +54,7 @@ TEST(ColourFastPath, StriaEqualsThePlainOne) {
   ForEachSplit([&] {
     unsigned seed = 200;
     for (const auto& [w, h] : kAwkwardSizes) {
-      const TBitmap32 in = Picture(w, h, ++seed);
+      const Bitmap32 in = Picture(w, h, ++seed);
       for (const Case& c : cases)
         ASSERT_EQ(stria(in, w - c.layerShrink, h - c.layerShrink, c.direction, c.thickness, c.space,
                         c.transparency, c.colour),

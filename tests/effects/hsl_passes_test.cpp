@@ -14,18 +14,18 @@
 namespace quillane {
 namespace {
 
-TBitmap32 Picture(int w, int h, unsigned seed) {
+Bitmap32 Picture(int w, int h, unsigned seed) {
   return seed % 2 == 0 ? SoftPicture(w, h, seed) : RandomPicture(w, h, seed, true);
 }
 
 TEST(HslPasses, ColourPencilEqualsThePlainSteps) {
   unsigned seed = 0;
   for (const auto& [w, h] : kAwkwardSizes) {
-    const TBitmap32 source = Picture(w, h, ++seed);
+    const Bitmap32 source = Picture(w, h, ++seed);
     for (int pressure : {0, 45, 70}) {
-      const TBitmap32 expected = ColorSketchReference(source, pressure);
+      const Bitmap32 expected = ColorSketchReference(source, pressure);
       ForEachSplit([&] {
-        ASSERT_EQ(colorsketch(source, pressure), expected) << w << "x" << h << " p=" << pressure;
+        ASSERT_EQ(ColorPencil(source, pressure), expected) << w << "x" << h << " p=" << pressure;
       });
     }
   }
@@ -35,9 +35,9 @@ TEST(HslPasses, TextureEqualsThePlainConversions) {
   unsigned seed = 100;
   for (const auto& [w, h] : kAwkwardSizes)
     for (int pressure : {0, 37, 100}) {
-      const TBitmap32 base = Picture(w + 60, h, ++seed);
-      const TBitmap32& tile = TextureTile(static_cast<int>(seed % 15) + 1);
-      const TBitmap32 expected = TextureReference(base, tile, pressure);
+      const Bitmap32 base = Picture(w + 60, h, ++seed);
+      const Bitmap32& tile = TextureTile(static_cast<int>(seed % 15) + 1);
+      const Bitmap32 expected = TextureReference(base, tile, pressure);
       ForEachSplit([&] {
         ASSERT_EQ(texture(base, tile, pressure), expected) << w << "x" << h << " p=" << pressure;
       });
@@ -45,13 +45,13 @@ TEST(HslPasses, TextureEqualsThePlainConversions) {
 }
 
 TEST(HslPasses, HslAdjustEqualsThePlainConversions) {
-  EXPECT_TRUE(HslAdjust(TBitmap32(), 0, 200, 0).Empty());
+  EXPECT_TRUE(HslAdjust(Bitmap32(), 0, 200, 0).Empty());
   unsigned seed = 200;
   for (const auto& [w, h] : kAwkwardSizes) {
-    const TBitmap32 in = Picture(w, h, ++seed);
+    const Bitmap32 in = Picture(w, h, ++seed);
     for (const auto [hue, s, l] :
          {std::array{180, 100, 100}, {17, 163, 41}, {360, 0, 200}, {0, 200, 0}, {359, 37, 160}}) {
-      TBitmap32 expected(w, h);
+      Bitmap32 expected(w, h);
       for (int y = 0; y < h; ++y)
         for (int x = 0; x < w; ++x) {
           const Pixel p = in.At(x, y);

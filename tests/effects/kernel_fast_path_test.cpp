@@ -16,8 +16,8 @@ namespace quillane {
 namespace {
 
 // Black and white in stripes and checks: the largest sums of either sign.
-TBitmap32 Extremes(int w, int h) {
-  TBitmap32 b(w, h);
+Bitmap32 Extremes(int w, int h) {
+  Bitmap32 b(w, h);
   for (int y = 0; y < h; ++y)
     for (int x = 0; x < w; ++x) {
       const auto v = static_cast<std::uint8_t>((x + y) % 2 * 255);
@@ -44,12 +44,12 @@ TEST(KernelFastPath, EqualsTheReferencesAtAwkwardSizes) {
   ForEachSplit([&] {
     unsigned seed = 0;
     for (const auto& [w, h] : kAwkwardSizes)
-      for (const TBitmap32& in : {RandomPicture(w, h, ++seed), Extremes(w, h)})
+      for (const Bitmap32& in : {RandomPicture(w, h, ++seed), Extremes(w, h)})
         for (const Kernel& k : kernels) {
           SCOPED_TRACE(::testing::Message() << w << "x" << h << " k0 " << k[0]);
           ASSERT_EQ(realism(in, k), ConvolveReference(in, k, 1));
-          ASSERT_EQ(doabstract(in, k), KernelGradientReference(in, k, Gradient::LeftMinusRight));
-          ASSERT_EQ(popart(in, k), KernelGradientReference(in, k, Gradient::RightMinusLeftSobel));
+          ASSERT_EQ(Abstract(in, k), KernelGradientReference(in, k, Gradient::LeftMinusRight));
+          ASSERT_EQ(PopArt(in, k), KernelGradientReference(in, k, Gradient::RightMinusLeftSobel));
         }
   });
 }
@@ -60,7 +60,7 @@ TEST(EmbossFastPath, EqualsTheReferenceAtAwkwardSizes) {
       for (int depth : {1, 2, 5})
         // The window's lightings, and beyond them those the byte arithmetic cannot take.
         for (int lighting : {0, 100, 200, 205, -51, 206}) {
-          const TBitmap32 in = RandomPicture(w + depth, h + depth, static_cast<unsigned>(w + h));
+          const Bitmap32 in = RandomPicture(w + depth, h + depth, static_cast<unsigned>(w + h));
           ASSERT_EQ(emboss(in, lighting, depth), EmbossReference(in, lighting, depth))
               << w << "x" << h << " depth " << depth << " " << lighting;
         }
@@ -71,7 +71,7 @@ TEST(EmbossFastPath, EqualsTheReferenceAtAwkwardSizes) {
 // value of every colour, exact halves included: the same as the plain variant's formula. Even rows
 // are P, odd rows Q: output row 2j, pixel x, is the relief of P(x, 2j) against Q(x + 1, 2j + 1).
 TEST(EmbossFastPath, EveryReliefByteAndEveryGrayValueAsThePlainVariant) {
-  TBitmap32 in(257, 512);
+  Bitmap32 in(257, 512);
   const auto fill = [&in](const auto& p, const auto& q) {
     for (int j = 0; j < 256; ++j)
       for (int x = 0; x < 256; ++x) {
@@ -80,7 +80,7 @@ TEST(EmbossFastPath, EveryReliefByteAndEveryGrayValueAsThePlainVariant) {
       }
   };
   const auto same = [&in](int lighting) {
-    const TBitmap32 fast = emboss(in, lighting, 1);
+    const Bitmap32 fast = emboss(in, lighting, 1);
     const FastPathVariant plain(VectorWidth::Plain);
     return fast == emboss(in, lighting, 1);
   };

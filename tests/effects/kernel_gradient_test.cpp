@@ -11,14 +11,14 @@ namespace {
 
 const Kernel kPopArt{-1, -2, -1, 0, 0, 0, 1, 2, 1};
 TEST(KernelGradient, SmallPicturesRepeatTheirInnerLineInverted) {
-  TBitmap32 twoHigh(4, 2, Pixel{1, 2, 3, 0});
+  Bitmap32 twoHigh(4, 2, Pixel{1, 2, 3, 0});
   for (int x = 0; x < 4; ++x) twoHigh.At(x, 1) = Pixel{10, 20, 30, 40};
-  EXPECT_EQ(popart(twoHigh, kPopArt), TBitmap32(4, 2, Pixel{245, 235, 225, 255}));
-  TBitmap32 twoWide(2, 3, Pixel{1, 2, 3, 0});
+  EXPECT_EQ(PopArt(twoHigh, kPopArt), Bitmap32(4, 2, Pixel{245, 235, 225, 255}));
+  Bitmap32 twoWide(2, 3, Pixel{1, 2, 3, 0});
   twoWide.At(1, 1) = Pixel{10, 20, 30, 40};
-  EXPECT_EQ(popart(twoWide, kPopArt), TBitmap32(2, 3, Pixel{245, 235, 225, 255}));
-  EXPECT_EQ(popart(TBitmap32(5, 1, Pixel{1, 2, 3, 4}), kPopArt),
-            TBitmap32(5, 1, Pixel{254, 253, 252, 255}));
+  EXPECT_EQ(PopArt(twoWide, kPopArt), Bitmap32(2, 3, Pixel{245, 235, 225, 255}));
+  EXPECT_EQ(PopArt(Bitmap32(5, 1, Pixel{1, 2, 3, 4}), kPopArt),
+            Bitmap32(5, 1, Pixel{254, 253, 252, 255}));
 }
 
 // Kernels too heavy for 32-bit sums take the plain loop, whose sums clamp: any channel that is
@@ -29,8 +29,8 @@ TEST(KernelGradient, SumsBeyondThirtyTwoBitsClamp) {
   for (Gradient g : {Gradient::LeftMinusRight, Gradient::RightMinusLeftSobel})
     ASSERT_EQ(KernelGradientFilter(RandomPicture(29, 13, 5), opposite, g),
               KernelGradientReference(RandomPicture(29, 13, 5), opposite, g));
-  EXPECT_EQ(popart(TBitmap32(3, 3, Pixel{0, 1, 2, 255}), Kernel{kMax, kMax, kMax}),
-            TBitmap32(3, 3, Pixel{255, 0, 0, 255}));
+  EXPECT_EQ(PopArt(Bitmap32(3, 3, Pixel{0, 1, 2, 255}), Kernel{kMax, kMax, kMax}),
+            Bitmap32(3, 3, Pixel{255, 0, 0, 255}));
 }
 
 }  // namespace

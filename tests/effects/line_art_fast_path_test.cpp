@@ -17,9 +17,9 @@ namespace {
 
 // Blotches of a few flat colours with a little grain: edge maps with strokes, flat paper and
 // mid-range values, and photographs with dark areas to outline.
-TBitmap32 Blotches(int w, int h, unsigned seed) {
+Bitmap32 Blotches(int w, int h, unsigned seed) {
   std::mt19937 rng(seed);
-  TBitmap32 b(w, h);
+  Bitmap32 b(w, h);
   for (int y = 0; y < h; ++y)
     for (int x = 0; x < w; ++x) {
       const int patch = (x / 5 + y / 4 + static_cast<int>(seed)) % 3;
@@ -32,9 +32,9 @@ TBitmap32 Blotches(int w, int h, unsigned seed) {
 }
 
 // Thresholds at a gray value the picture has, so that the "equal is ink" rule is met.
-int EdgeGrayAtCentre(const TBitmap32& in) {
-  TBitmap32 edges = in;
-  picsobel(edges);
+int EdgeGrayAtCentre(const Bitmap32& in) {
+  Bitmap32 edges = in;
+  InvertedSobelEdges(edges);
   const Pixel p = edges.At(in.Width() / 2, in.Height() / 2);
   return GrayValue(p.r, p.g, p.b);
 }
@@ -43,7 +43,7 @@ TEST(LineArtFastPath, EqualsThePlainStepsAtAwkwardSizes) {
   ForEachSplit([] {
     unsigned seed = 0;
     for (const auto& [w, h] : kAwkwardSizes)
-      for (const TBitmap32& in : {Blotches(w, h, ++seed), RandomPicture(w, h, ++seed, true)}) {
+      for (const Bitmap32& in : {Blotches(w, h, ++seed), RandomPicture(w, h, ++seed, true)}) {
         SCOPED_TRACE(::testing::Message() << w << "x" << h << " seed " << seed);
         const int pressure = EdgeGrayAtCentre(in);
         ASSERT_EQ(PenSketch(in, pressure), PenSketchReference(in, pressure));
@@ -57,15 +57,15 @@ TEST(LineArtFastPath, EqualsThePlainStepsAtAwkwardSizes) {
         const Pixel centre = in.At(w / 2, h / 2);
         const int threshold = InkGrayValue(centre.r, centre.g, centre.b);
         for (bool colour : {false, true})
-          ASSERT_EQ(Pen_and_Ink(in, threshold, colour), PenAndInkReference(in, threshold, colour))
+          ASSERT_EQ(PenAndInk(in, threshold, colour), PenAndInkReference(in, threshold, colour))
               << "colour " << colour;
       }
   });
-  const TBitmap32 none;
+  const Bitmap32 none;
   EXPECT_EQ(PenSketch(none, 9), PenSketchReference(none, 9));
   EXPECT_EQ(Vuzorar(none, 9, 3, HatchDirection(2)),
             VuzorarReference(none, 9, 3, HatchDirection(2)));
-  EXPECT_EQ(Pen_and_Ink(none, 9, true), PenAndInkReference(none, 9, true));
+  EXPECT_EQ(PenAndInk(none, 9, true), PenAndInkReference(none, 9, true));
 }
 
 // The integer threshold can only differ from the extended gray next to an exact half, where

@@ -11,14 +11,14 @@ namespace quillane {
 namespace {
 
 TEST(PenSketch, AGrayValueEqualToThePressureIsInk) {
-  TBitmap32 levels(3, 1);
+  Bitmap32 levels(3, 1);
   for (std::uint8_t v : {99, 100, 101}) levels.At(v - 99, 0) = Pixel{v, v, v, 7};
-  two_Value1Click(levels, 100);
+  ThresholdToInk(levels, 100);
   EXPECT_EQ(levels.ScanLine(0)[1], kInk);
   EXPECT_EQ(levels.ScanLine(0)[2], kPaper);
-  const TBitmap32 flat(6, 5, Pixel{40, 90, 200, 255});
-  EXPECT_EQ(PenSketch(flat, 254), TBitmap32(6, 5, kPaper));
-  EXPECT_EQ(PenSketch(flat, 255), TBitmap32(6, 5, kInk));
+  const Bitmap32 flat(6, 5, Pixel{40, 90, 200, 255});
+  EXPECT_EQ(PenSketch(flat, 254), Bitmap32(6, 5, kPaper));
+  EXPECT_EQ(PenSketch(flat, 255), Bitmap32(6, 5, kInk));
 }
 
 TEST(Vuzorar, ADotBecomesAStrokeOfTwoSPlusOne) {
@@ -33,7 +33,7 @@ TEST(Vuzorar, ADotBecomesAStrokeOfTwoSPlusOne) {
        {{5, 1}, {5, 2}, {5, 3}, {5, 4}, {5, 5}, {5, 6}, {5, 7}, {5, 8}, {5, 9}}},
   };
   for (const auto& [direction, passes, expected] : cases) {
-    TBitmap32 b(11, 11, kPaper);
+    Bitmap32 b(11, 11, kPaper);
     b.At(5, 5) = kInk;
     for (int i = 0; i < passes; ++i) BitmapDilate(b, direction);
     Points ink;
@@ -53,18 +53,18 @@ TEST(PenAndInk, ItsOwnGrayWeightsReachNoFurtherThan254) {
 TEST(PenAndInk, InkAreasBecomeTheirRim) {
   // A disc of radius 6 keeps its leftmost pixel and loses the one inside it; a line two pixels
   // wide survives whole.
-  TBitmap32 disc(17, 17, kPaper), line(9, 8, kPaper);
+  Bitmap32 disc(17, 17, kPaper), line(9, 8, kPaper);
   for (int y = 0; y < 17; ++y)
     for (int x = 0; x < 17; ++x)
       if ((x - 8) * (x - 8) + (y - 8) * (y - 8) <= 36) disc.At(x, y) = kInk;
   for (int y = 0; y < 8; ++y) line.At(4, y) = line.At(5, y) = kInk;
-  const TBitmap32 rim = Pen_and_Ink(disc, 128, false);
+  const Bitmap32 rim = PenAndInk(disc, 128, false);
   EXPECT_EQ(rim.At(2, 8), kInk);
   EXPECT_EQ(rim.At(4, 8), kPaper);
-  EXPECT_EQ(Pen_and_Ink(line, 128, false), line);
+  EXPECT_EQ(PenAndInk(line, 128, false), line);
   // Everything inked at 254: a frame, in the source's colours with colour ink.
-  const TBitmap32 in = RandomPicture(7, 5, 5);
-  const TBitmap32 frame = Pen_and_Ink(in, 254, true);
+  const Bitmap32 in = RandomPicture(7, 5, 5);
+  const Bitmap32 frame = PenAndInk(in, 254, true);
   for (int y = 0; y < 5; ++y)
     for (int x = 0; x < 7; ++x) {
       const Pixel s = in.At(x, y), ink{s.b, s.g, s.r, 255};

@@ -25,10 +25,10 @@ TEST(PaintFastPaths, WaterColorGivesTheReferenceBytes) {
   for (const auto& [widest, split] : kPaths)
     for (auto [w, h] : kSizes) {
       const FastPathVariant variant(widest, split);
-      const TBitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w * 31 + h));
+      const Bitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w * 31 + h));
       for (int cycles : {1, 2, 5}) {
         if (w > 100 && cycles == 5) continue;
-        ASSERT_EQ(watercolor(in, cycles), WaterColorReference(in, cycles))
+        ASSERT_EQ(WaterColor(in, cycles), WaterColorReference(in, cycles))
             << w << "x" << h << " cycles " << cycles << " " << WidthName(widest);
       }
     }
@@ -40,9 +40,9 @@ TEST(PaintFastPaths, EachPassGivesItsFormulaAndLeavesTheFrame) {
     for (int w = 3; w < 44; w += 5) {
       const FastPathVariant variant(widest, split);
       // Random bytes, and the extremes that make the sharpening clamp both ways.
-      TBitmap32 in = RandomPicture(w, 4, static_cast<unsigned>(w));
+      Bitmap32 in = RandomPicture(w, 4, static_cast<unsigned>(w));
       for (int x = 0; x < w; x += 2) in.At(x, 1) = in.At(x, 2) = Pixel{0, 255, 0, 9};
-      TBitmap32 sharp(w, 4, untouched), median(w, 4, untouched);
+      Bitmap32 sharp(w, 4, untouched), median(w, 4, untouched);
       SharpenPass(in, sharp);
       MedianPass(in, median);
       for (int y = 0; y < 4; ++y)
@@ -72,7 +72,7 @@ TEST(PaintFastPaths, BrumeDrawsWhatThePlainLoopDraws) {
     for (auto [w, h] : kSizes)
       for (int scope : {1, 3, 10}) {
         const FastPathVariant variant(widest, split);
-        const TBitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w + h));
+        const Bitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w + h));
         std::uint32_t fast = 0xDEADBEEF, plain = 0xDEADBEEF;
         for (int run = 0; run < 2; ++run)  // the second run goes on from the first one's seed
           ASSERT_EQ(Brume(in, scope, fast), BrumeReference(in, scope, plain))

@@ -23,9 +23,9 @@ TEST(PencilFastPath, EqualsThePlainSketchAtAwkwardSizes) {
     unsigned seed = 0;
     for (const auto& [w, h] : kAwkwardSizes) {
       if (w < 3 || h < 3) continue;  // the next test takes those without an interior
-      for (const TBitmap32& in : {SoftPicture(w, h, ++seed), RandomPicture(w, h, ++seed)})
+      for (const Bitmap32& in : {SoftPicture(w, h, ++seed), RandomPicture(w, h, ++seed)})
         for (const Tone& t : kTones)
-          ASSERT_EQ(peccilsketch(in, t.mode, t.contrast, t.lighting),
+          ASSERT_EQ(PencilSketch(in, t.mode, t.contrast, t.lighting),
                     PencilSketchReference(in, t.mode, t.contrast, t.lighting))
               << w << "x" << h << " lighting " << t.lighting << " contrast " << t.contrast;
     }
@@ -35,12 +35,12 @@ TEST(PencilFastPath, EqualsThePlainSketchAtAwkwardSizes) {
 // Pictures without an interior pixel keep the results the passes gave them one by one.
 TEST(PencilFastPath, PicturesWithoutInteriorAsThePassesGaveThem) {
   for (const auto& [w, h] : {std::pair{1, 1}, {1, 6}, {6, 1}, {2, 5}, {5, 2}, {2, 2}}) {
-    const TBitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w * 10 + h));
-    TBitmap32 edges = in;
-    picsobel(edges);
-    EXPECT_EQ(peccilsketch(in, PencilToneMode::Lighting, 0, 150), PencilLightingPass(edges, 150));
+    const Bitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w * 10 + h));
+    Bitmap32 edges = in;
+    InvertedSobelEdges(edges);
+    EXPECT_EQ(PencilSketch(in, PencilToneMode::Lighting, 0, 150), PencilLightingPass(edges, 150));
     ConvertToGray(edges);
-    EXPECT_EQ(peccilsketch(in, PencilToneMode::Contrast, 30, 0), PencilContrastPass(edges, 30));
+    EXPECT_EQ(PencilSketch(in, PencilToneMode::Contrast, 30, 0), PencilContrastPass(edges, 30));
   }
 }
 

@@ -21,7 +21,7 @@ Pixel Gray(int v) {
 }
 
 // The relief formula exactly as stated, in place from the top row down.
-TBitmap32 PlainEmboss(TBitmap32 b, int lighting, int depth) {
+Bitmap32 PlainEmboss(Bitmap32 b, int lighting, int depth) {
   for (int y = 0; y <= b.Height() - depth - 1; ++y)
     for (int x = 0; x <= b.Width() - depth - 1; ++x) {
       const Pixel p = b.At(x, y), q = b.At(x + depth, y + depth);
@@ -41,18 +41,18 @@ TEST(Emboss, MatchesTheFormulaOnRandomPicturesOfEverySize) {
     for (int lighting : {0, 37, 100, 200})
       for (auto [w, h] :
            {std::pair{41, 13}, {depth, 7}, {7, depth}, {depth + 1, 2}, {1, 1}, {0, 0}}) {
-        const TBitmap32 in = RandomPicture(w, h, static_cast<unsigned>(depth * 1000 + lighting));
+        const Bitmap32 in = RandomPicture(w, h, static_cast<unsigned>(depth * 1000 + lighting));
         ASSERT_EQ(emboss(in, lighting, depth), PlainEmboss(in, lighting, depth))
             << depth << " " << lighting << " " << w << "x" << h;
       }
-  const TBitmap32 in = RandomPicture(6, 6, 1);
+  const Bitmap32 in = RandomPicture(6, 6, 1);
   EXPECT_EQ(emboss(in, 100, 3).At(5, 0), in.At(5, 0));
 }
 
 // The stripe layer built pixel by pixel and composited with DrawOver.
-TBitmap32 PlainStria(const TBitmap32& base, int w, int h, StriaDirection direction, int t, int g,
-                     int transparency, std::uint32_t colour) {
-  TBitmap32 layer(w, h);
+Bitmap32 PlainStria(const Bitmap32& base, int w, int h, StriaDirection direction, int t, int g,
+                    int transparency, std::uint32_t colour) {
+  Bitmap32 layer(w, h);
   for (int y = 0; y < h; ++y)
     for (int x = 0; x < w; ++x) {
       const int m = (direction == StriaDirection::Vertical ? x : y) % (t + g);
@@ -60,22 +60,22 @@ TBitmap32 PlainStria(const TBitmap32& base, int w, int h, StriaDirection directi
           m < t ? PixelFromColorRef(colour, static_cast<std::uint8_t>(255 - transparency))
                 : Pixel{255, 255, 255, 0};
     }
-  TBitmap32 out = base;
+  Bitmap32 out = base;
   layer.DrawOver(0, 0, out);
   return out;
 }
 
 TEST(Stria, StripesStartAtTheFirstColumnOrRow) {
-  const TBitmap32 white(7, 2, Gray(255));
-  const TBitmap32 dark = stria(white, 7, 2, StriaDirection::Vertical, 1, 2, 128, 0);
+  const Bitmap32 white(7, 2, Gray(255));
+  const Bitmap32 dark = stria(white, 7, 2, StriaDirection::Vertical, 1, 2, 128, 0);
   for (int x = 0; x < 7; ++x) EXPECT_EQ(dark.At(x, 1), Gray(x % 3 == 0 ? 128 : 255)) << x;
   // Thickness 100 and space 1 leave every 101st column.
-  const TBitmap32 wide =
-      stria(TBitmap32(203, 1, Gray(255)), 203, 1, StriaDirection::Vertical, 100, 1, 0, 0);
+  const Bitmap32 wide =
+      stria(Bitmap32(203, 1, Gray(255)), 203, 1, StriaDirection::Vertical, 100, 1, 0, 0);
   for (int x = 0; x < 203; ++x) EXPECT_EQ(wide.At(x, 0).r, x == 100 || x == 201 ? 255 : 0) << x;
   // A single row is a stripe row.
-  EXPECT_EQ(stria(TBitmap32(3, 1, Gray(255)), 3, 1, StriaDirection::Horizontal, 1, 2, 0, 0),
-            TBitmap32(3, 1, Gray(0)));
+  EXPECT_EQ(stria(Bitmap32(3, 1, Gray(255)), 3, 1, StriaDirection::Horizontal, 1, 2, 0, 0),
+            Bitmap32(3, 1, Gray(0)));
 }
 
 // Transparent base pixels take stripes unblended and gaps as transparent white; a base larger
@@ -89,7 +89,7 @@ TEST(Stria, MatchesTheCompositedLayerOnEveryAlphaAndSize) {
                                   {1, 6, 1, 6},
                                   {6, 2, 6, 2},
                                   {0, 0, 0, 0}}) {
-        TBitmap32 base = RandomPicture(w, h, static_cast<unsigned>(transparency * 7 + w));
+        Bitmap32 base = RandomPicture(w, h, static_cast<unsigned>(transparency * 7 + w));
         for (int y = 0; y < h; ++y)
           for (int x = 0; x < w; ++x) base.At(x, y).a = (x + y) % 3 == 0 ? base.At(x, y).a : 255;
         if (w > 0) base.At(0, 0).a = 0;
@@ -102,7 +102,7 @@ TEST(Stria, MatchesTheCompositedLayerOnEveryAlphaAndSize) {
 // One base pixel under one tile pixel of gray t.
 TEST(Texture, MovesTheLightnessByTheTileAndThePressure) {
   const auto under = [](Pixel base, int t, int pressure) {
-    return texture(TBitmap32(1, 1, base), TBitmap32(1, 1, Gray(t)), pressure).At(0, 0);
+    return texture(Bitmap32(1, 1, base), Bitmap32(1, 1, Gray(t)), pressure).At(0, 0);
   };
   const auto fromHsl = [](int l) {
     const Rgb c = HslToRgb(0, 0, l);
@@ -125,7 +125,7 @@ TEST(Texture, MatchesThePlainConversionsOnEverySize) {
   for (int n : {1, 5, 14})
     for (int pressure : {0, 25, 50, 100})
       for (auto [w, h] : {std::pair{130, 61}, {40, 3}, {1, 59}, {59, 1}, {1, 1}, {0, 0}}) {
-        const TBitmap32 base = RandomPicture(w, h, static_cast<unsigned>(n * 131 + pressure));
+        const Bitmap32 base = RandomPicture(w, h, static_cast<unsigned>(n * 131 + pressure));
         ASSERT_EQ(texture(base, TextureTile(n), pressure),
                   TextureReference(base, TextureTile(n), pressure))
             << n << " " << pressure << " " << w << "x" << h;

@@ -17,8 +17,8 @@ Pixel Rgb(int r, int g, int b, int a = 255) {
 }
 
 // Rows of '#' (black), 'T' (paper tint) and '.' (white) into a picture.
-TBitmap32 Drawing(std::initializer_list<const char*> rows) {
-  TBitmap32 picture(static_cast<int>(std::strlen(*rows.begin())), static_cast<int>(rows.size()));
+Bitmap32 Drawing(std::initializer_list<const char*> rows) {
+  Bitmap32 picture(static_cast<int>(std::strlen(*rows.begin())), static_cast<int>(rows.size()));
   int y = 0;
   for (const char* row : rows) {
     for (int x = 0; row[x] != 0; ++x)
@@ -28,14 +28,14 @@ TBitmap32 Drawing(std::initializer_list<const char*> rows) {
   return picture;
 }
 
-TBitmap32 Square(int size, int inset, int side) {
-  TBitmap32 picture(size, size, kWhite);
+Bitmap32 Square(int size, int inset, int side) {
+  Bitmap32 picture(size, size, kWhite);
   for (int y = inset; y < inset + side; ++y)
     for (int x = inset; x < inset + side; ++x) picture.At(x, y) = kBlack;
   return picture;
 }
 
-int CountBlack(const TBitmap32& picture) {
+int CountBlack(const Bitmap32& picture) {
   int n = 0;
   for (int y = 0; y < picture.Height(); ++y)
     for (int x = 0; x < picture.Width(); ++x) n += picture.At(x, y) == kBlack ? 1 : 0;
@@ -56,14 +56,14 @@ TEST(FreehandColor, BrushColourOfOnePixel) {
            Case{"blue over black", Rgb(0, 0, 255), kBlack, Rgb(0, 0, 250)},
        }) {
     SCOPED_TRACE(c.what);
-    EXPECT_EQ(drawcolor(c.pixel, RGBtoHSL(c.brush)), c.expected);
+    EXPECT_EQ(BrushColour(c.pixel, RGBtoHSL(c.brush)), c.expected);
   }
   EXPECT_EQ(RGBtoHSL(Rgb(255, 0, 0)), (FreehandHsl{0, 1, 0.5}));
   EXPECT_EQ(HSLtoRGB(0.49, 1, 0), Rgb(250, 0, 0));
 }
 
 TEST(FreehandBrush, NeverRecoloursPaperAndRecoloursAgainEachPass) {
-  TBitmap32 picture(5, 1, kWhite);
+  Bitmap32 picture(5, 1, kWhite);
   picture.At(1, 0) = Rgb(236, 233, 216, 0);
   picture.At(2, 0) = kBlack;
   picture.At(3, 0) = Rgb(200, 200, 200);
@@ -88,64 +88,69 @@ TEST(FreehandDisc, ExtentClippedAtTheEdges) {
                         Case{10, 10, 2, 2, {8, 8, 10, 10}}, Case{-2, 5, 2, 1, {0, 3, 1, 8}},
                         Case{4, 4, 100, 100, {0, 0, 10, 10}}, Case{5, 5, 0, 1, {5, 5, 6, 6}}}) {
     SCOPED_TRACE(testing::Message() << c.x << "," << c.y << " size " << c.size);
-    TBitmap32 picture(10, 10, kBlack);
+    Bitmap32 picture(10, 10, kBlack);
     EXPECT_EQ(RubDisc(picture, c.x, c.y, c.size), c.bounds);
     EXPECT_EQ(100 - CountBlack(picture), c.expectedWhite);
   }
 }
 
 TEST(FreehandPen, DashedAtWidthOneSolidAbove) {
-  TBitmap32 thin(40, 3, kWhite);
+  Bitmap32 thin(40, 3, kWhite);
   LinePen pen{kBlack, 1, 0};
   DrawLine(thin, pen, 0, 1, 39, 1);
   EXPECT_EQ(CountBlack(thin), 18 + 15) << "18 on, 6 off; the end point left out";
-  TBitmap32 wide(40, 7, kWhite);
+  Bitmap32 wide(40, 7, kWhite);
   LinePen wider{kBlack, 3, 0};
   DrawLine(wide, wider, 5, 3, 34, 3);
   for (int x = 5; x <= 34; ++x) EXPECT_EQ(wide.At(x, 2), kBlack) << x;
   EXPECT_EQ(wide.At(20, 0), kWhite);
   EXPECT_EQ(wide.At(20, 5), kWhite);
-  TBitmap32 beeline(10, 10, kWhite);
+  Bitmap32 beeline(10, 10, kWhite);
   LinePen one{kBlack, 1, 0};
   DrawLine(beeline, one, 1, 1, 6, 4, true);
   EXPECT_EQ(beeline.At(6, 4), kBlack) << "a beeline reaches its release point";
 }
 
 TEST(FreehandThin, OnePassPerPress) {
-  TBitmap32 square = Square(10, 2, 6);
+  Bitmap32 square = Square(10, 2, 6);
   Thin(square);
   EXPECT_EQ(square, Square(10, 3, 4)) << "the outer ring turns white";
   Thin(square);
   EXPECT_EQ(square, Square(10, 4, 2));
 
-  const TBitmap32 line = Drawing({"........", "..####..", "........"});
-  TBitmap32 thinned = line;
+  const Bitmap32 line = Drawing({"........", "..####..", "........"});
+  Bitmap32 thinned = line;
   Thin(thinned);
   EXPECT_EQ(thinned, line);
 
-  TBitmap32 inked = Drawing({".....", ".##T.", ".##T.", ".##T.", "....."});
+  // The block reaches the last interior row and column: they are thinned like the first.
+  Bitmap32 block = Drawing({"....", ".##.", ".##.", "...."});
+  Thin(block);
+  EXPECT_EQ(block, Drawing({"....", "....", "....", "...."}));
+
+  Bitmap32 inked = Drawing({".....", ".##T.", ".##T.", ".##T.", "....."});
   Thin(inked);
   EXPECT_EQ(inked.At(2, 2), Rgb(236, 233, 216, 0)) << "no pure white beside: the paper tint";
 }
 
 TEST(FreehandThick, SpreadsIntoPaperLastNeighbourWins) {
-  TBitmap32 line = Drawing({".....", ".....", ".###.", ".....", "....."});
+  Bitmap32 line = Drawing({".....", ".....", ".###.", ".....", "....."});
   Thick(line);
   EXPECT_EQ(line, Drawing({".....", ".###.", ".###.", ".###.", "....."}));
 
-  TBitmap32 order(3, 3, kWhite);
+  Bitmap32 order(3, 3, kWhite);
   order.At(0, 1) = Rgb(255, 0, 0);
   order.At(2, 1) = Rgb(0, 255, 0);
   order.At(1, 0) = Rgb(0, 0, 200);
   order.At(1, 2) = Rgb(0, 0, 255);
-  TBitmap32 result = order;
+  Bitmap32 result = order;
   Thick(result);
   EXPECT_EQ(result.At(1, 1), Rgb(0, 0, 255)) << "S wins over N, E and W";
   order.At(1, 2) = kWhite;
   Thick(result = order);
   EXPECT_EQ(result.At(1, 1), Rgb(0, 0, 200)) << "then N";
   // A white pixel takes the tint from S first, then the tint gives way to the ink at W.
-  TBitmap32 tinted(3, 3, kPaperTint);
+  Bitmap32 tinted(3, 3, kPaperTint);
   tinted.At(0, 1) = Rgb(9, 9, 9);
   tinted.At(1, 1) = kWhite;
   Thick(tinted);
@@ -153,10 +158,10 @@ TEST(FreehandThick, SpreadsIntoPaperLastNeighbourWins) {
 }
 
 TEST(FreehandStrokes, UndoGivesBackTheExactPictureStrokeByStroke) {
-  TBitmap32 picture(150, 90);
+  Bitmap32 picture(150, 90);
   for (int y = 0; y < 90; ++y)
     for (int x = 0; x < 150; ++x) picture.At(x, y) = Rgb(x, y, x ^ y, 200);
-  const TBitmap32 original = picture;
+  const Bitmap32 original = picture;
   StrokeHistory history;
   history.Begin(picture);
   for (int x = -10; x < 160; x += 7) {
@@ -164,7 +169,7 @@ TEST(FreehandStrokes, UndoGivesBackTheExactPictureStrokeByStroke) {
     RubDisc(picture, x, x / 2, 12);
   }
   history.End();
-  const TBitmap32 afterFirst = picture;
+  const Bitmap32 afterFirst = picture;
   history.Begin(picture);
   history.Keep(picture, {0, 0, 150, 90});
   Thin(picture);

@@ -8,12 +8,12 @@
 #include "effects/adjust/color_panel.h"
 #include "effects/adjust/color_variety.h"
 #include "effects/adjust/hsl_adjust.h"
-#include "effects/adjust/preview_window.h"
 #include "effects/surface/emboss.h"
-#include "effects/surface/snapshot_window.h"
 #include "effects/surface/stria.h"
 #include "effects/surface/texture.h"
 #include "tests/gui/window_helpers.h"
+#include "ui/effects/preview_window.h"
+#include "ui/effects/snapshot_window.h"
 #include "ui/picture_view.h"
 
 namespace quillane {
@@ -49,7 +49,7 @@ TEST_F(AdjustWindows, HslAdjustShowsSignedNumbersAndStartsNeutralOnEveryShowing)
 TEST_F(AdjustWindows, StriaTakesItsColourFromTheDialogAndStartsFromTheSnapshot) {
   Open(kEmboss);
   Press(kEmboss, "Button2");
-  const TBitmap32 embossed = Working();
+  const Bitmap32 embossed = Working();
   Open(kStria);
   Slide(kStria, "TrackBar1", 40);
   Slide(kStria, "TrackBar3", 2);
@@ -59,8 +59,8 @@ TEST_F(AdjustWindows, StriaTakesItsColourFromTheDialogAndStartsFromTheSnapshot) 
   EXPECT_EQ(platform_.colorRequests, std::vector<std::uint32_t>{0});
 
   // With "For current" both presses start from the picture as it was when the window opened.
-  const TBitmap32 expected = stria(embossed, Source().Width(), Source().Height(),
-                                   StriaDirection::Horizontal, 2, 2, 40, 0xFF);
+  const Bitmap32 expected = stria(embossed, Source().Width(), Source().Height(),
+                                  StriaDirection::Horizontal, 2, 2, 40, 0xFF);
   for (int press = 1; press <= 2; ++press) {
     Press(kStria, "Button1");
     EXPECT_EQ(Working(), expected);
@@ -119,7 +119,7 @@ TEST_F(AdjustWindows, AnEmptyWorkingPictureIsRefusedWhereNothingCanBeDone) {
   EXPECT_EQ(Main().StatusText(), "Color Panels");
 
   platform_.saveAnswers.push_back(FileChoice{Path("out.jpg"), 1});
-  Main().SpeedButton2Click();
+  Main().OnSave();
   EXPECT_FALSE(Exists("out.jpg"));
   ASSERT_EQ(platform_.errors.size(), 1u);
   EXPECT_TRUE(platform_.errors[0].contains("no picture to save"))
@@ -132,8 +132,8 @@ TEST_F(AdjustWindows, AnEmptyWorkingPictureIsRefusedWhereNothingCanBeDone) {
   Open(kEmboss);  // from the source, which is still there
   Press(kEmboss, "Button2");
   EXPECT_EQ(Working(), emboss(Source(), 100, 3));
-  Main().SpeedButton3Click();
-  Main().SpeedButton3Click();
+  Main().OnUndo();
+  Main().OnUndo();
   EXPECT_TRUE(Working().Empty());
   EXPECT_EQ(platform_.errors.size(), 1u);
 }
@@ -142,7 +142,7 @@ TEST_F(AdjustWindows, ColorFilterPreviewsEachSwatchAndOkAppliesThePreview) {
   auto& window = dynamic_cast<PreviewWindow&>(Tool(kFilter));
   Open(kFilter);
   Press(kFilter, "Panel6");
-  EXPECT_EQ(window.Preview(), filter(Source(), ColorFilterKind::Yellow));
+  EXPECT_EQ(window.Preview(), ColorFilter(Source(), ColorFilterKind::Yellow));
   EXPECT_EQ(Child<PictureView>(kFilter, "Image2")->Image(), OpaqueImage(window.Preview()));
   ClickOn(Child(kFilter, "Image1"));  // Reset
   EXPECT_EQ(window.Preview(), Source());
@@ -150,7 +150,7 @@ TEST_F(AdjustWindows, ColorFilterPreviewsEachSwatchAndOkAppliesThePreview) {
   Press(kFilter, "Panel4");  // replaces, does not add
   EXPECT_EQ(Working(), Source());
   Press(kFilter, "Button1");
-  EXPECT_EQ(Working(), filter(Source(), ColorFilterKind::Green));
+  EXPECT_EQ(Working(), ColorFilter(Source(), ColorFilterKind::Green));
   EXPECT_FALSE(Tool(kFilter).isVisible());
 }
 

@@ -9,10 +9,10 @@
 #include <filesystem>
 #include <stdexcept>
 
-#include "batch/batch_convert_ok.h"
 #include "codecs/picture_file.h"
 #include "effects/mono/bw_sketch.h"
 #include "tests/gui/window_helpers.h"
+#include "ui/batch_done_dialog.h"
 #include "ui/picture_view.h"
 
 namespace quillane {
@@ -34,7 +34,7 @@ class BatchWindow : public WindowTest {
   }
 
   QListWidget* ListView1() { return MainChild<QListWidget>("ListView1"); }
-  TBatchConvertOk& Completion() { return Main().BatchConvertOk(); }
+  BatchDoneDialog& Completion() { return Main().BatchDone(); }
 
   void BrowseInput(const QString& folder) {
     platform_.folderAnswers.push_back(folder);
@@ -84,7 +84,7 @@ TEST_F(BatchWindow, ConvertWritesOnePencilSketchPerPicture) {
   // The view shows the last picture's result; the document and the bytes are the batch loop's
   // own tests.
   EXPECT_EQ(Main().findChild<PictureView*>("Image1")->Image(),
-            OpaqueImage(peccilsketch(Input("b.bmp"), PencilToneMode::Contrast, 70, 128)));
+            OpaqueImage(PencilSketch(Input("b.bmp"), PencilToneMode::Contrast, 70, 128)));
   EXPECT_FALSE(Main().LineArt());
   EXPECT_TRUE(Child<QToolButton>(1, "Button2")->isEnabled());
   EXPECT_EQ(Main().OutputFolder(), Path("out/deeper/still"));
@@ -105,7 +105,7 @@ TEST_F(BatchWindow, ConvertWritesOnePencilSketchPerPicture) {
 
 // The loop's refusals and stops are its own tests; the window shows them and changes nothing.
 TEST_F(BatchWindow, RefusalsAndStopsAreShownAndChangeNothing) {
-  const TBitmap32 before = Main().Document().Working();
+  const Bitmap32 before = Main().Document().Working();
   Convert(Path("nowhere"), Path("out"));
   // Without a Browse the list is empty, whatever folder is typed.
   Convert(" " + Path("in") + " ", Path("out"));
@@ -149,7 +149,7 @@ TEST_F(BatchWindow, EachConvertedPictureGoesThroughTheWindowsOwnSteps) {
   recording.batchPushesHistory = true;
   recording.statusText = "Recorded";
   recording.routine = [](const EffectInput& in) {
-    return TBitmap32(in.source.Width(), 3, Pixel{0, 0, 0, 255});
+    return Bitmap32(in.source.Width(), 3, Pixel{0, 0, 0, 255});
   };
   ToolWindow window(recording, Main(), &Main());
   window.show();
@@ -161,7 +161,7 @@ TEST_F(BatchWindow, EachConvertedPictureGoesThroughTheWindowsOwnSteps) {
   Completion().close();
 
   // The picture the effect failed on stays loaded, and the view shows it.
-  recording.routine = [](const EffectInput&) -> TBitmap32 { throw std::runtime_error("no"); };
+  recording.routine = [](const EffectInput&) -> Bitmap32 { throw std::runtime_error("no"); };
   window.findChild<QToolButton*>("SpeedButton4")->click();
   EXPECT_EQ(platform_.errors.size(), 1u);
   EXPECT_EQ(Main().findChild<PictureView*>("Image1")->Image(), OpaqueImage(Input("a.jpg")));

@@ -16,8 +16,8 @@ namespace {
 
 using EffectWhileBusy = GuiTest;
 
-TBitmap32 Flat(std::uint8_t v) {
-  return TBitmap32(24, 16, Pixel{v, v, v, 255});
+Bitmap32 Flat(std::uint8_t v) {
+  return Bitmap32(24, 16, Pixel{v, v, v, 255});
 }
 
 TEST_F(EffectWhileBusy, ASecondApplyWhileOneRunsIsIgnored) {

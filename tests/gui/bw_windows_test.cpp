@@ -13,7 +13,7 @@ using BwWindows = WindowTest;
 // tests show them, and the settings that go back on every showing are the HSL window's. Here a
 // radio button, a slider and a check box reach the drawing.
 TEST_F(BwWindows, OkDrawsWithTheSettingsShown) {
-  const TBitmap32 source = Source();
+  const Bitmap32 source = Source();
   Open(3);
   Press(3, "RadioButton4");
   Slide(3, "TrackBar2", 5);
@@ -23,7 +23,7 @@ TEST_F(BwWindows, OkDrawsWithTheSettingsShown) {
   Open(4);
   Press(4, "CheckBox1");
   Press(4, "Button1");
-  EXPECT_EQ(Working(), Pen_and_Ink(source, 128, true));
+  EXPECT_EQ(Working(), PenAndInk(source, 128, true));
 }
 
 }  // namespace

@@ -11,8 +11,8 @@ class ColorWindows : public WindowTest {
  protected:
   // What the effect gives on picture with its defaults but one parameter; seed: the random
   // state it starts from, continued.
-  TBitmap32 Expected(const EffectSpec& spec, const TBitmap32& picture, const std::string& param,
-                     EffectParams::Values value, std::uint32_t& seed) {
+  Bitmap32 Expected(const EffectSpec& spec, const Bitmap32& picture, const std::string& param,
+                    EffectParams::Values value, std::uint32_t& seed) {
     EffectParams params = spec.Defaults();
     params.SetList(param, std::move(value));
     return spec.routine({picture, picture, params, &seed});
@@ -55,7 +55,7 @@ TEST_F(ColorWindows, KernelWindowsConvertTheCellsAsTypedAndRefuseWhatIsNoInteger
     EXPECT_EQ(Working(), Expected(spec, Source(), "kernel", typed, seed));
   }
   // A cell that is no 32-bit integer: the standard error, and nothing changes.
-  const TBitmap32 before = Working();
+  const Bitmap32 before = Working();
   const int steps = Steps();
   Main().SetStatusText("before");
   for (const char* bad : {"abc", "2147483648"}) {

@@ -12,9 +12,9 @@
 #include "app/qt_messages.h"
 #include "app/qt_platform.h"
 #include "app/settings.h"
-#include "batch/batch_convert_ok.h"
 #include "codecs/picture_file.h"
 #include "tests/gui/temp_folder.h"
+#include "ui/batch_done_dialog.h"
 
 namespace quillane {
 namespace {
@@ -36,7 +36,7 @@ class Desktop : public FileGuiTest {
     SaveBitmap24(TestPicture(width, 3), LocalPath(name));
     return Path(name);
   }
-  QMenu* RecentMenu(TMyPicture& window) {
+  QMenu* RecentMenu(MainWindow& window) {
     return window.menuBar()->findChild<QMenu*>("OpenRecent1");
   }
   static QStringList Entries(QMenu* menu) {
@@ -104,14 +104,14 @@ TEST_F(Desktop, OpenRecentListsTheLastTenPicturesNewestFirstAndDropsMissingOnes)
   EXPECT_EQ(Entries(RecentMenu(Main())), expected);
   // A window started later offers the same list.
   ScriptedPlatform otherPlatform;
-  TMyPicture other(otherPlatform, TestPicture());
+  MainWindow other(otherPlatform, TestPicture());
   EXPECT_EQ(Entries(RecentMenu(other)), expected);
 }
 
 TEST_F(Desktop, GoOutputFolderSaysSoWhenNoFileManagerStarts) {
   Main().SetOutputFolder(Path("out"));
   platform_.fileManagerStarts = false;
-  Main().BatchConvertOk().SpeedButton2Click();
+  Main().BatchDone().OnOpenOutputFolder();
   EXPECT_EQ(platform_.openedFolders, std::vector<QString>{Path("out")});
   ASSERT_EQ(platform_.messages.size(), 1u);
   EXPECT_TRUE(platform_.messages[0].text.startsWith("No file manager could be started to show " +

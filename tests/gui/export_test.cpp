@@ -87,7 +87,7 @@ QRect DarkBox(const QString& pdf, int dpi, const QString& folder) {
 TEST_F(Export, PrintPlacesTheDoubledPictureCentredOnOnePage) {
   if (QStandardPaths::findExecutable("pdftoppm").isEmpty())
     GTEST_SKIP() << "pdftoppm (poppler-utils) is needed to read the page back";
-  Main().SetWorkingPicture(TBitmap32(521, 346, Pixel{40, 40, 40, 255}), false);
+  Main().SetWorkingPicture(Bitmap32(521, 346, Pixel{40, 40, 40, 255}), false);
   // The 4960 x 7015 dot page of the example. The PDF writer keeps page sizes in whole points,
   // so it is 992 x 1403 points at 360 dots per inch rather than A4 at 600.
   auto pdfIn = [](QString path) {
@@ -112,7 +112,7 @@ TEST_F(Export, PrintPlacesTheDoubledPictureCentredOnOnePage) {
   Click("SpeedButton10");
   EXPECT_EQ(platform_.errors, std::vector<QString>{"The printer could not start the print job"});
   Click("SpeedButton10");
-  Main().SetWorkingPicture(TBitmap32(), false);
+  Main().SetWorkingPicture(Bitmap32(), false);
   Click("SpeedButton10");
   EXPECT_EQ(platform_.printDialogs, 3);
   EXPECT_EQ(platform_.messages, (std::vector<Message>{{"Sorry", "There is no picture to print"}}));
@@ -121,7 +121,7 @@ TEST_F(Export, PrintPlacesTheDoubledPictureCentredOnOnePage) {
 TEST_F(Export, ASecondWallpaperNamesANewFileSoTheDesktopReallyChanges) {
   qputenv("XDG_CURRENT_DESKTOP", "ubuntu:GNOME");
   StandIn("gsettings");
-  const TBitmap32 first(30, 20, Pixel{1, 2, 3, 255}), second(20, 30, Pixel{9, 8, 7, 255});
+  const Bitmap32 first(30, 20, Pixel{1, 2, 3, 255}), second(20, 30, Pixel{9, 8, 7, 255});
   Main().SetWorkingPicture(first, false);
   Click("SpeedButton9");
   Main().SetWorkingPicture(second, false);

@@ -7,10 +7,10 @@
 #include <QSlider>
 #include <QToolButton>
 
-#include "freehand/control_panel_window.h"
-#include "freehand/painting_window.h"
-#include "freehand/work_area_window.h"
 #include "tests/gui/gui_fixture.h"
+#include "ui/freehand/control_panel_window.h"
+#include "ui/freehand/painting_window.h"
+#include "ui/freehand/work_area_window.h"
 #include "ui/picture_view.h"
 
 namespace quillane {
@@ -25,7 +25,7 @@ class FreehandWindows : public GuiTest {
   // White paper with a black bar across rows 10..12 and a tinted pixel inside it.
   void SetUp() override {
     GuiTest::SetUp();
-    TBitmap32 drawing(40, 30, kWhite);
+    Bitmap32 drawing(40, 30, kWhite);
     for (int y = 10; y <= 12; ++y)
       for (int x = 0; x < 40; ++x) drawing.At(x, y) = kBlack;
     drawing.At(20, 11) = kPaperTint;
@@ -33,8 +33,8 @@ class FreehandWindows : public GuiTest {
   }
 
   FreehandPainting& Painting() { return *Main().findChild<FreehandPainting*>(); }
-  TFreehand& Area() { return Painting().WorkArea(); }
-  TFreehand_control& Panel() { return Painting().ControlPanel(); }
+  WorkAreaWindow& Area() { return Painting().WorkArea(); }
+  ControlPanelWindow& Panel() { return Painting().ControlPanel(); }
   template <typename T>
   T* Control(const char* name) {
     return Panel().findChild<T*>(name);
@@ -105,7 +105,7 @@ TEST_F(FreehandWindows, BrushRecoloursStrokesOnlyAndCtrlZTakesTheStrokeBack) {
   RedBrush(16);
   EXPECT_EQ(Control<QLabel>("Label1")->text(), "16") << "the brush button sets its size";
   Control<QSlider>("TrackBar1")->setValue(4);
-  const TBitmap32 before = Area().Picture();
+  const Bitmap32 before = Area().Picture();
   Stroke({{20, 11}, {24, 12}, {60, 50}});  // the last point lies outside the picture
   // Which pixels a disc recolours is the painting's own test.
   EXPECT_EQ(Area().Picture().At(28, 12), kRed);
@@ -120,7 +120,7 @@ TEST_F(FreehandWindows, BrushRecoloursStrokesOnlyAndCtrlZTakesTheStrokeBack) {
 TEST_F(FreehandWindows, BeelineDrawsOnlyOnReleaseAndPenFollowsTheMouse) {
   Painting().ColorUp();
   Press("SpeedButton1");
-  const TBitmap32 before = Area().Picture();
+  const Bitmap32 before = Area().Picture();
   Mouse(QEvent::MouseButtonPress, {2, 2}, Qt::LeftButton, Qt::LeftButton);
   Mouse(QEvent::MouseMove, {7, 2}, Qt::NoButton, Qt::LeftButton);
   EXPECT_EQ(Area().BandEnd(), QPoint(8, 2)) << "an odd distance goes one further";
@@ -135,7 +135,7 @@ TEST_F(FreehandWindows, BeelineDrawsOnlyOnReleaseAndPenFollowsTheMouse) {
 }
 
 TEST_F(FreehandWindows, PhotoFitsTheViewAndTheEyedropperPicksFromIt) {
-  TBitmap32 portrait(600, 800, kWhite);
+  Bitmap32 portrait(600, 800, kWhite);
   portrait.At(599, 799) = Pixel{1, 2, 3, 255};
   Main().ShowNewPicture(portrait, true);
   Painting().ColorUp();
@@ -148,13 +148,13 @@ TEST_F(FreehandWindows, PhotoFitsTheViewAndTheEyedropperPicksFromIt) {
   EXPECT_EQ(Painting().State().brushColor, (Pixel{1, 2, 3, 255}))
       << "the edge picks the last pixel";
   Press("Button2");
-  Main().ShowNewPicture(TBitmap32(800, 600, kWhite), true);
+  Main().ShowNewPicture(Bitmap32(800, 600, kWhite), true);
   Painting().ColorUp();
   EXPECT_EQ(Panel().Image2()->size(), QSize(217, 163));
 }
 
 TEST_F(FreehandWindows, NoPictureNoPainting) {
-  Main().SetWorkingPicture(TBitmap32(), false);
+  Main().SetWorkingPicture(Bitmap32(), false);
   Painting().ColorUp();
   EXPECT_FALSE(Area().isVisible());
   EXPECT_TRUE(Main().isEnabled());

@@ -61,8 +61,8 @@ inline void ClickOn(QWidget* control) {
 }
 
 // A small picture with a different colour in every pixel, so effects change it visibly.
-inline TBitmap32 TestPicture(int width = 24, int height = 16) {
-  TBitmap32 picture(width, height);
+inline Bitmap32 TestPicture(int width = 24, int height = 16) {
+  Bitmap32 picture(width, height);
   for (int y = 0; y < height; ++y)
     for (int x = 0; x < width; ++x)
       picture.At(x, y) = Pixel{static_cast<std::uint8_t>(x * 10), static_cast<std::uint8_t>(y * 15),
@@ -71,7 +71,7 @@ inline TBitmap32 TestPicture(int width = 24, int height = 16) {
 }
 
 // An effect that gives picture and leaves status in the status line.
-inline EffectSpec Giving(TBitmap32 picture, std::string status) {
+inline EffectSpec Giving(Bitmap32 picture, std::string status) {
   return EffectSpec{.statusText = std::move(status),
                     .routine = [picture](const EffectInput&) { return picture; }};
 }
@@ -80,14 +80,14 @@ class GuiTest : public ::testing::Test {
  protected:
   void SetUp() override {
     Application();
-    main_ = std::make_unique<TMyPicture>(platform_, TestPicture());
+    main_ = std::make_unique<MainWindow>(platform_, TestPicture());
     CreateToolWindows(*main_);
     main_->show();
   }
 
   void TearDown() override { main_.reset(); }
 
-  TMyPicture& Main() { return *main_; }
+  MainWindow& Main() { return *main_; }
 
   // A widget of the main window itself (not of a tool window) by object name.
   template <typename T>
@@ -105,7 +105,7 @@ class GuiTest : public ::testing::Test {
   }
 
   ScriptedPlatform platform_;
-  std::unique_ptr<TMyPicture> main_;
+  std::unique_ptr<MainWindow> main_;
 };
 
 }  // namespace quillane

@@ -13,7 +13,7 @@ class ImageSizeDialog : public GuiTest {
  protected:
   void SetUp() override {
     GuiTest::SetUp();
-    Main().ShowNewPicture(TBitmap32(521, 346, Pixel{7, 8, 9, 255}), true);
+    Main().ShowNewPicture(Bitmap32(521, 346, Pixel{7, 8, 9, 255}), true);
     MainChild<QToolButton>("SpeedButton4")->click();
   }
   QLineEdit* Field(const char* name) { return Main().ImageSize().findChild<QLineEdit*>(name); }
@@ -35,7 +35,7 @@ TEST_F(ImageSizeDialog, TypedWidthHoldsTheRatioAndEnterAppliesOnce) {
   EXPECT_EQ(Picture(), QSize(399, 266));  // 400 / 521 rounds downward
   EXPECT_EQ(Main().Document().Source().Width(), 399);
   EXPECT_FALSE(Main().ImageSize().isVisible());
-  Main().SpeedButton3Click();
+  Main().OnUndo();
   EXPECT_EQ(Picture(), QSize(521, 346));
 
   // Shown again, it starts from the picture; "-" and "+" step both fields.

@@ -11,11 +11,11 @@
 namespace quillane {
 namespace {
 
-TBitmap32 Flat(int w, int h, std::uint8_t v) {
-  return TBitmap32(w, h, Pixel{v, v, v, 255});
+Bitmap32 Flat(int w, int h, std::uint8_t v) {
+  return Bitmap32(w, h, Pixel{v, v, v, 255});
 }
 
-class MainWindow : public GuiTest {
+class MainWindowTest : public GuiTest {
  protected:
   PictureView* Image1() { return Main().findChild<PictureView*>("Image1"); }
   // Undo and Redo, each as toolbar button and menu entry, enabled as given.
@@ -25,7 +25,7 @@ class MainWindow : public GuiTest {
     EXPECT_EQ(MainChild<QToolButton>("SpeedButton18")->isEnabled(), canRedo);
     EXPECT_EQ(MenuAction("Redo1")->isEnabled(), canRedo);
   }
-  void Apply(const TBitmap32& result, const std::string& status) {
+  void Apply(const Bitmap32& result, const std::string& status) {
     ASSERT_TRUE(Main().ApplyEffect(Giving(result, status), {}, true));
   }
 };
@@ -33,9 +33,9 @@ class MainWindow : public GuiTest {
 TEST(MainWindowStartUp, ShowsTheBuiltInPicture) {
   Application();
   ScriptedPlatform platform;
-  TMyPicture main(platform);
+  MainWindow main(platform);
   main.show();
-  const TBitmap32 startup = StartupPicture();
+  const Bitmap32 startup = StartupPicture();
   EXPECT_EQ(main.Document().Opened(), startup);
   auto* image1 = main.findChild<PictureView*>("Image1");
   EXPECT_EQ(image1->size(), QSize(521, 346));
@@ -43,8 +43,8 @@ TEST(MainWindowStartUp, ShowsTheBuiltInPicture) {
   EXPECT_EQ(main.ActiveTool(), 0);
 }
 
-TEST_F(MainWindow, UndoAndRedoFollowTheHistoryWithTheFormerDisplaySize) {
-  const TBitmap32 start = Main().Document().Working();
+TEST_F(MainWindowTest, UndoAndRedoFollowTheHistoryWithTheFormerDisplaySize) {
+  const Bitmap32 start = Main().Document().Working();
   Apply(Flat(60, 30, 10), "First");
   Apply(Flat(24, 16, 20), "Second");
   ExpectUndoRedo(true, false);
@@ -67,36 +67,36 @@ TEST_F(MainWindow, UndoAndRedoFollowTheHistoryWithTheFormerDisplaySize) {
   ExpectUndoRedo(true, false);
 
   // Undo with nothing to undo changes nothing, not even the status line.
-  Main().SpeedButton3Click();
-  Main().SpeedButton3Click();
+  Main().OnUndo();
+  Main().OnUndo();
   Main().SetStatusText("kept");
-  Main().SpeedButton3Click();
+  Main().OnUndo();
   EXPECT_EQ(Main().Document().Working(), start);
   EXPECT_EQ(Main().StatusText(), "kept");
 }
 
-TEST_F(MainWindow, UndoSizesThePictureByTheZoomLabel) {
+TEST_F(MainWindowTest, UndoSizesThePictureByTheZoomLabel) {
   // The label shows the zoom rounded to one decimal in the user's locale; Undo and Redo read
   // it back from there, while Renew uses the zoom itself.
   const QLocale previous;
   QLocale::setDefault(QLocale(QLocale::German));
-  EXPECT_EQ(TMyPicture::ZoomLabelText(1455.19), "1455,2%");  // and no group separator
+  EXPECT_EQ(MainWindow::ZoomLabelText(1455.19), "1455,2%");  // and no group separator
   Apply(Flat(30, 20, 1), "Changed");
   MainChild<QLabel>("Label5")->setText("41,0%");
   EXPECT_EQ(Main().ZoomFromLabel(), 41.0);
-  Main().SpeedButton3Click();
+  Main().OnUndo();
   EXPECT_EQ(Image1()->size(), QSize(10, 7));  // Round(24 * 0.41), Round(16 * 0.41)
-  Main().SpeedButton18Click();
+  Main().OnRedo();
   EXPECT_EQ(Image1()->size(), QSize(12, 8));
-  Main().SpeedButton7Click();
+  Main().OnRenew();
   EXPECT_EQ(Image1()->size(), QSize(24, 16));
   QLocale::setDefault(previous);
 }
 
-TEST_F(MainWindow, ANewPictureAndRenewResetTheHistoryButNotTheStatusLine) {
+TEST_F(MainWindowTest, ANewPictureAndRenewResetTheHistoryButNotTheStatusLine) {
   Apply(Flat(24, 16, 5), "Changed");
-  Main().ShowNewPicture(TBitmap32(8, 6, Pixel{1, 2, 3, 0}), true);
-  const TBitmap32 opened(8, 6, Pixel{1, 2, 3, 255});
+  Main().ShowNewPicture(Bitmap32(8, 6, Pixel{1, 2, 3, 0}), true);
+  const Bitmap32 opened(8, 6, Pixel{1, 2, 3, 255});
   ExpectUndoRedo(false, false);  // opening a file keeps the status line: the files' test
 
   Apply(Flat(30, 10, 5), "Changed again");
@@ -108,14 +108,14 @@ TEST_F(MainWindow, ANewPictureAndRenewResetTheHistoryButNotTheStatusLine) {
   EXPECT_EQ(Main().StatusText(), "Changed again");
 }
 
-TEST_F(MainWindow, AFailingEffectChangesNothing) {
+TEST_F(MainWindowTest, AFailingEffectChangesNothing) {
   Apply(Flat(24, 16, 5), "Before");
-  const TBitmap32 working = Main().Document().Working();
+  const Bitmap32 working = Main().Document().Working();
   const int slot = Main().Document().CurrentSlot();
 
   EffectSpec failing = *FindEffect(1);
   failing.toolNumber = 2;
-  failing.routine = [](const EffectInput&) -> TBitmap32 {
+  failing.routine = [](const EffectInput&) -> Bitmap32 {
     throw std::runtime_error("Scan line index out of range");
   };
   ToolWindow window(failing, Main(), &Main());
@@ -130,7 +130,7 @@ TEST_F(MainWindow, AFailingEffectChangesNothing) {
   EXPECT_EQ(Image1()->Image(), OpaqueImage(working));
 }
 
-TEST_F(MainWindow, DisplayImageFitsThumbnailsIntoTheirSquare) {
+TEST_F(MainWindowTest, DisplayImageFitsThumbnailsIntoTheirSquare) {
   PictureView thumbnail;
   const std::vector<std::pair<QSize, QRect>> cases = {
       {QSize(300, 200), QRect(2, 19, 105, 72)},
@@ -139,12 +139,12 @@ TEST_F(MainWindow, DisplayImageFitsThumbnailsIntoTheirSquare) {
       {QSize(2, 1), QRect(2, 28, 105, 55)},
   };
   for (const auto& [size, expected] : cases) {
-    thumbnail.SetPicture(TBitmap32(size.width(), size.height(), Pixel{0, 0, 0, 255}));
+    thumbnail.SetPicture(Bitmap32(size.width(), size.height(), Pixel{0, 0, 0, 255}));
     Main().DisplayImage(thumbnail);
     EXPECT_EQ(thumbnail.geometry(), expected) << size.width() << "x" << size.height();
   }
   // An empty picture gets an empty control instead of a division by zero.
-  EXPECT_EQ(TMyPicture::DisplayImageGeometry(0, 0).size(), QSize(0, 0));
+  EXPECT_EQ(MainWindow::DisplayImageGeometry(0, 0).size(), QSize(0, 0));
 }
 
 }  // namespace

@@ -2,8 +2,8 @@
 #include <QPushButton>
 
 #include "effects/mono/bw_sketch.h"
-#include "effects/mono/bw_sketch_window.h"
 #include "tests/gui/window_helpers.h"
+#include "ui/effects/bw_sketch_window.h"
 
 namespace quillane {
 namespace {
@@ -14,9 +14,9 @@ class PencilWindow : public WindowTest {
     WindowTest::SetUp();
     Open(1);
   }
-  TBack_and_White_Sketch& Pencil() { return dynamic_cast<TBack_and_White_Sketch&>(Tool(1)); }
-  TBitmap32 Sketch(PencilToneMode mode, int contrast, int lighting) {
-    return peccilsketch(Source(), mode, contrast, lighting);
+  BwSketchWindow& Pencil() { return dynamic_cast<BwSketchWindow&>(Tool(1)); }
+  Bitmap32 Sketch(PencilToneMode mode, int contrast, int lighting) {
+    return PencilSketch(Source(), mode, contrast, lighting);
   }
 
   // Contrast chosen: Lighting's number in gray.

@@ -10,7 +10,7 @@
 namespace quillane {
 namespace {
 
-TBitmap32 Opaque(TBitmap32 picture) {
+Bitmap32 Opaque(Bitmap32 picture) {
   SetAlphaChannel(picture, 255);
   return picture;
 }
@@ -33,7 +33,7 @@ class PictureFiles : public FileGuiTest {
 
   // Everything the document holds, to compare before and after a refused command.
   struct DocumentState {
-    TBitmap32 working, source, opened;
+    Bitmap32 working, source, opened;
     int slot, undo, redo;
     QString status;
     bool operator==(const DocumentState&) const = default;
@@ -61,12 +61,12 @@ TEST_F(PictureFiles, OpenMakesTheFileTheNewPictureFromTheTopLeft) {
   ASSERT_EQ(Image1()->pos(), QPoint(-200, -150));
 
   // Its alpha bytes are lost in the 24-bit file; the picture comes back opaque.
-  const TBitmap32 picture = TestPicture(700, 500);
+  const Bitmap32 picture = TestPicture(700, 500);
   SaveBitmap24(picture, LocalPath("photo.bmp"));
   Open("photo.bmp");
 
   ExpectNoMessage();
-  const TBitmap32 expected = Opaque(picture);
+  const Bitmap32 expected = Opaque(picture);
   EXPECT_EQ(State(), (DocumentState{expected, expected, expected, 1, 0, 0, "Changed"}));
   EXPECT_EQ(Main().Document().Slot(1), expected);
   EXPECT_EQ(Image1()->pos(), QPoint(0, 0));
@@ -119,7 +119,7 @@ TEST_F(PictureFiles, RefusedFilesAreShownAndKeepTheDocument) {
 TEST_F(PictureFiles, SaveWritesTheChosenTypeUnderItsOwnExtension) {
   MenuAction("Pencilsketch1")->trigger();
   ToolChild<QPushButton>(1, "Button1")->click();
-  const TBitmap32& working = Main().Document().Working();
+  const Bitmap32& working = Main().Document().Working();
   const DocumentState before = State();
 
   // JPEG, quality 90, whatever extension the name had; an old file is replaced.
@@ -137,7 +137,7 @@ TEST_F(PictureFiles, SaveWritesTheChosenTypeUnderItsOwnExtension) {
 
   // A metafile holding the picture.
   Save("drawing", 3);
-  const std::optional<TBitmap32> metafile = LoadPictureFile(LocalPath("drawing.wmf"));
+  const std::optional<Bitmap32> metafile = LoadPictureFile(LocalPath("drawing.wmf"));
   ASSERT_TRUE(metafile.has_value());
   EXPECT_EQ(QSize(metafile->Width(), metafile->Height()), QSize(working.Width(), working.Height()));
 

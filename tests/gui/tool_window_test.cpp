@@ -10,12 +10,10 @@ namespace {
 using ToolWindows = GuiTest;
 
 QString EntryName(const EffectSpec& spec) {
-  QString name = QString::fromStdString(spec.menuHandler);
-  name.chop(5);  // "Click"
-  return name;
+  return QString::fromStdString(spec.menuObjectName);
 }
 
-int VisibleToolWindows(TMyPicture& main) {
+int VisibleToolWindows(MainWindow& main) {
   int visible = 0;
   for (const EffectSpec* spec : Effects())
     if (main.ToolWindowAt(spec->toolNumber)->isVisible()) ++visible;
@@ -25,11 +23,11 @@ int VisibleToolWindows(TMyPicture& main) {
 TEST_F(ToolWindows, EveryMenuEntryOpensItsOwnWindowAlone) {
   for (const EffectSpec* spec : Effects()) {
     QAction* entry = MenuAction(EntryName(*spec));
-    ASSERT_NE(entry, nullptr) << spec->menuHandler;
+    ASSERT_NE(entry, nullptr) << spec->menuObjectName;
     entry->trigger();
-    EXPECT_TRUE(Tool(spec->toolNumber).isVisible()) << spec->windowClass;
-    EXPECT_EQ(Main().ActiveTool(), spec->toolNumber) << spec->windowClass;
-    EXPECT_EQ(VisibleToolWindows(Main()), 1) << spec->windowClass;
+    EXPECT_TRUE(Tool(spec->toolNumber).isVisible()) << spec->windowObjectName;
+    EXPECT_EQ(Main().ActiveTool(), spec->toolNumber) << spec->windowObjectName;
+    EXPECT_EQ(VisibleToolWindows(Main()), 1) << spec->windowObjectName;
   }
 }
 
@@ -39,7 +37,7 @@ TEST_F(ToolWindows, TheCloseBoxClearsTheOpenWindow) {
   MenuAction("Emboss1")->trigger();
   Tool(15).close();
   EXPECT_EQ(Main().ActiveTool(), 0);
-  Main().closetool();
+  Main().CloseToolWindow();
   EXPECT_EQ(Main().ActiveTool(), 0);
 }
 

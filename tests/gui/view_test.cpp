@@ -37,16 +37,16 @@ TEST_F(View, ZoomStopsBeforeTheDisplayLeavesTheWidgetRange) {
   EXPECT_EQ(ZoomLabel(), "3.5%");
   EXPECT_EQ(Display(), QSize(1, 1));
   Main().ZoomToActualSize();
-  Main().ShowNewPicture(TBitmap32(1000000, 1), true);
+  Main().ShowNewPicture(Bitmap32(1000000, 1), true);
   Click("SpeedButton6", 15);  // 1.25^12 is the last step below the widget limit
   EXPECT_EQ(Display(), QSize(14551915, 15));
   // A wider picture opened at that zoom is held at the limit.
-  Main().ShowNewPicture(TBitmap32(2000000, 1), true);
+  Main().ShowNewPicture(Bitmap32(2000000, 1), true);
   EXPECT_EQ(Display(), QSize(QWIDGETSIZE_MAX, 15));
 }
 
 TEST_F(View, TheWheelZoomsOverThePictureOnlyAndCtrlWheelAnywhere) {
-  Main().ShowNewPicture(TBitmap32(2000, 1500), true);
+  Main().ShowNewPicture(Bitmap32(2000, 1500), true);
   const struct {
     const char* widget;
     int turn;  // positive: away from the user
@@ -91,7 +91,7 @@ TEST_F(View, RightDragPansAndOnlyAStillRightClickOpensTheContextMenu) {
   };
   auto* menu = Main().findChild<QMenu*>("PopupMenu1");
   for (const auto& c : cases) {
-    Main().ShowNewPicture(TBitmap32(c.picture.width(), c.picture.height()), true);
+    Main().ShowNewPicture(Bitmap32(c.picture.width(), c.picture.height()), true);
     Mouse(QEvent::MouseButtonPress, {100, 100}, c.button, c.button);
     Mouse(QEvent::MouseMove, c.to, Qt::NoButton, c.button);
     Mouse(QEvent::MouseButtonRelease, c.to, c.button, Qt::NoButton);
@@ -102,20 +102,20 @@ TEST_F(View, RightDragPansAndOnlyAStillRightClickOpensTheContextMenu) {
 }
 
 TEST_F(View, RotationTurnsBothPicturesAndResetsTheHistory) {
-  Main().ShowNewPicture(TBitmap32(640, 480, Pixel{9, 9, 9, 255}), true);
-  Main().SetWorkingPicture(TBitmap32(640, 480, Pixel{5, 5, 5, 255}), true);
+  Main().ShowNewPicture(Bitmap32(640, 480, Pixel{9, 9, 9, 255}), true);
+  Main().SetWorkingPicture(Bitmap32(640, 480, Pixel{5, 5, 5, 255}), true);
   Click("SpeedButton6");
   Bar(Qt::Horizontal)->setValue(50);
   Click("SpeedButton12");
-  EXPECT_EQ(Main().Document().Working(), TBitmap32(478, 640, Pixel{5, 5, 5, 255}));
-  EXPECT_EQ(Main().Document().Source(), TBitmap32(478, 640, Pixel{9, 9, 9, 255}));
+  EXPECT_EQ(Main().Document().Working(), Bitmap32(478, 640, Pixel{5, 5, 5, 255}));
+  EXPECT_EQ(Main().Document().Source(), Bitmap32(478, 640, Pixel{9, 9, 9, 255}));
   EXPECT_FALSE(MainChild<QToolButton>("SpeedButton3")->isEnabled());
   EXPECT_EQ(Display(), QSize(598, 800));
   EXPECT_EQ(Bar(Qt::Horizontal)->value(), 0);
   // Too thin to turn: said so, and nothing changes.
-  Main().ShowNewPicture(TBitmap32(2, 1, Pixel{1, 1, 1, 255}), true);
+  Main().ShowNewPicture(Bitmap32(2, 1, Pixel{1, 1, 1, 255}), true);
   Click("SpeedButton12");
-  EXPECT_EQ(Main().Document().Working(), TBitmap32(2, 1, Pixel{1, 1, 1, 255}));
+  EXPECT_EQ(Main().Document().Working(), Bitmap32(2, 1, Pixel{1, 1, 1, 255}));
   EXPECT_EQ(platform_.messages.size(), 1u);
 }
 

@@ -16,7 +16,7 @@ class WindowTest : public FileGuiTest {
  protected:
   // Opens tool n from its menu entry.
   const EffectSpec& Open(int n) {
-    MenuAction(QString::fromStdString(Tool(n).Spec().menuHandler).chopped(5))->trigger();
+    MenuAction(QString::fromStdString(Tool(n).Spec().menuObjectName))->trigger();
     EXPECT_TRUE(Tool(n).isVisible());
     return Tool(n).Spec();
   }
@@ -29,20 +29,20 @@ class WindowTest : public FileGuiTest {
   QString Text(int n, const char* label) { return Child<QLabel>(n, label)->text(); }
   void Slide(int n, const char* slider, int value) { Child<QSlider>(n, slider)->setValue(value); }
   void Press(int n, const char* button) { Child<QAbstractButton>(n, button)->click(); }
-  const TBitmap32& Working() { return Main().Document().Working(); }
-  const TBitmap32& Source() { return Main().Document().Source(); }
+  const Bitmap32& Working() { return Main().Document().Working(); }
+  const Bitmap32& Source() { return Main().Document().Source(); }
   int Steps() { return Main().Document().UndoCount(); }
 
   // Pictures saved as a.bmp, b.bmp ... in folder "in".
-  void MakeInput(std::initializer_list<TBitmap32> pictures) {
+  void MakeInput(std::initializer_list<Bitmap32> pictures) {
     std::filesystem::create_directories(LocalPath("in"));
     char name = 'a';
-    for (const TBitmap32& picture : pictures)
+    for (const Bitmap32& picture : pictures)
       SaveBitmap24(picture, LocalPath(QString("in/%1.bmp").arg(name++)));
   }
   // The picture in.name as the document holds it once loaded.
-  TBitmap32 Input(const QString& name) {
-    TBitmap32 picture = *LoadPictureFile(LocalPath("in/" + name));
+  Bitmap32 Input(const QString& name) {
+    Bitmap32 picture = *LoadPictureFile(LocalPath("in/" + name));
     SetAlphaChannel(picture, 255);
     return picture;
   }

@@ -11,48 +11,48 @@ namespace quillane {
 namespace {
 
 // A picture whose every pixel names its own position: B = x, G = y, R = 7, alpha 255.
-TBitmap32 Numbered(int w, int h, std::uint8_t alpha = 255) {
-  TBitmap32 b(w, h);
+Bitmap32 Numbered(int w, int h, std::uint8_t alpha = 255) {
+  Bitmap32 b(w, h);
   for (int y = 0; y < h; ++y)
     for (int x = 0; x < w; ++x)
       b.At(x, y) = Pixel{static_cast<std::uint8_t>(x), static_cast<std::uint8_t>(y), 7, alpha};
   return b;
 }
 
-TEST(TBitmap32, NewAndDegenerateSizesAreEmpty) {
-  const TBitmap32 fresh;
+TEST(Bitmap32, NewAndDegenerateSizesAreEmpty) {
+  const Bitmap32 fresh;
   EXPECT_EQ(fresh.Width(), 0);
   EXPECT_EQ(fresh.Height(), 0);
   EXPECT_TRUE(fresh.Empty());
   for (auto [w, h] : {std::pair{-3, 5}, {5, -1}, {0, 4}, {4, 0}, {INT_MIN, INT_MIN}}) {
-    const TBitmap32 b(w, h);
+    const Bitmap32 b(w, h);
     EXPECT_EQ(b.Width(), 0) << w << "x" << h;
     EXPECT_EQ(b.Height(), 0) << w << "x" << h;
     EXPECT_EQ(b.PixelCount(), 0u);
   }
-  EXPECT_THROW(TBitmap32(1 << 15, 1 << 14), std::length_error);
+  EXPECT_THROW(Bitmap32(1 << 15, 1 << 14), std::length_error);
 }
 
-TEST(TBitmap32, NewPixelsAreZeroAndResizeDiscardsContent) {
-  TBitmap32 b(3, 2, Pixel{1, 2, 3, 4});
+TEST(Bitmap32, NewPixelsAreZeroAndResizeDiscardsContent) {
+  Bitmap32 b(3, 2, Pixel{1, 2, 3, 4});
   EXPECT_EQ(b.At(2, 1), (Pixel{1, 2, 3, 4}));
   b.SetSize(4, 3);
-  EXPECT_EQ(b, TBitmap32(4, 3, Pixel{0, 0, 0, 0}));
+  EXPECT_EQ(b, Bitmap32(4, 3, Pixel{0, 0, 0, 0}));
   b.SetSize(-1, 3);
   EXPECT_TRUE(b.Empty());
   EXPECT_EQ(b.Height(), 0);
 }
 
-TEST(TBitmap32, RowAccessOutsideTheRowsThrows) {
-  TBitmap32 b(4, 3);
-  const TBitmap32& cb = b;
+TEST(Bitmap32, RowAccessOutsideTheRowsThrows) {
+  Bitmap32 b(4, 3);
+  const Bitmap32& cb = b;
   EXPECT_EQ(cb.ScanLine(2), b.ScanLine(0) + 8);
   for (int y : {-1, 3, INT_MIN, INT_MAX}) {
     EXPECT_THROW(b.ScanLine(y), ScanLineError) << y;
     EXPECT_THROW(cb.ScanLine(y), ScanLineError) << y;
   }
   try {
-    TBitmap32().ScanLine(0);
+    Bitmap32().ScanLine(0);
     FAIL() << "an empty bitmap has no rows";
   } catch (const ScanLineError& e) {
     EXPECT_STREQ(e.what(), "Scan line index out of range");
@@ -70,17 +70,17 @@ TEST(ColorRef, RedIsTheLowestByte) {
 }
 
 TEST(SetAlphaChannel, SetsAlphaOnlyAndEmptyIsANoOp) {
-  TBitmap32 b = Numbered(5, 3, 0);
+  Bitmap32 b = Numbered(5, 3, 0);
   SetAlphaChannel(b, 200);
   EXPECT_EQ(b, Numbered(5, 3, 200));
-  TBitmap32 empty;
+  Bitmap32 empty;
   SetAlphaChannel(empty, 255);
   EXPECT_TRUE(empty.Empty());
 }
 
 Pixel Over(Pixel overlay, Pixel target) {
-  TBitmap32 t(1, 1, target);
-  TBitmap32(1, 1, overlay).DrawOver(0, 0, t);
+  Bitmap32 t(1, 1, target);
+  Bitmap32(1, 1, overlay).DrawOver(0, 0, t);
   return t.At(0, 0);
 }
 
@@ -105,7 +105,7 @@ TEST(DrawOver, PixelRules) {
 // that exactly the overlapping target pixels took the overlay pixel that lands on them.
 void ExpectPlacement(int ow, int oh, int x, int y) {
   const Pixel ground{50, 50, 50, 255};
-  TBitmap32 target(6, 5, ground);
+  Bitmap32 target(6, 5, ground);
   Numbered(ow, oh).DrawOver(x, y, target);
   for (int ty = 0; ty < 5; ++ty)
     for (int tx = 0; tx < 6; ++tx) {
@@ -137,44 +137,68 @@ TEST(DrawOver, ClipsAtEverySide) {
                           {0, 0, 0, 0}};
   for (const auto& c : cases) ExpectPlacement(c[0], c[1], c[2], c[3]);
   // An empty target stays empty.
-  TBitmap32 target;
+  Bitmap32 target;
   Numbered(3, 3).DrawOver(0, 0, target);
   Numbered(3, 3).DrawOver(-1, -1, target);
   EXPECT_TRUE(target.Empty());
 }
 
-TEST(ZoomInandOut, SizesOfZeroOrBelowOrNotANumberGiveEmpty) {
+TEST(ResampleNearest, SizesOfZeroOrBelowOrNotANumberGiveEmpty) {
   const long double nan = std::numeric_limits<long double>::quiet_NaN();
   const long double inf = std::numeric_limits<long double>::infinity();
   const long double factors[][2] = {{0.0L, 1.0L},  {1.0L, 0.0L}, {-1.0L, 1.0L},
                                     {1.0L, -2.0L}, {nan, 1.0L},  {1.0L, nan},
                                     {inf, 1.0L},   {1.0L, -inf}, {0.1L, 1.0L}};
   for (auto [hf, wf] : factors) {
-    TBitmap32 b = Numbered(6, 4);
-    ZoomInandOut(b, hf, wf);
+    Bitmap32 b = Numbered(6, 4);
+    ResampleNearest(b, hf, wf);
     EXPECT_TRUE(b.Empty()) << hf << " " << wf;
     EXPECT_EQ(b.Height(), 0);
   }
-  TBitmap32 narrow = Numbered(1, 4);
-  ZoomInandOut(narrow, 1.0L, 0.9L);
+  Bitmap32 narrow = Numbered(1, 4);
+  ResampleNearest(narrow, 1.0L, 0.9L);
   EXPECT_TRUE(narrow.Empty());
-  TBitmap32 empty;
-  ZoomInandOut(empty, 2.0L, 2.0L);
+  Bitmap32 empty;
+  ResampleNearest(empty, 2.0L, 2.0L);
   EXPECT_TRUE(empty.Empty());
 }
 
-TEST(ZoomInandOut, ARequestBeyondTheSizeLimitLeavesThePicture) {
-  TBitmap32 b = Numbered(1000, 1000);
-  EXPECT_THROW(ZoomInandOut(b, 100.0L, 100.0L), std::length_error);
+TEST(ResampleNearest, ARequestBeyondTheSizeLimitLeavesThePicture) {
+  Bitmap32 b = Numbered(1000, 1000);
+  EXPECT_THROW(ResampleNearest(b, 100.0L, 100.0L), std::length_error);
   EXPECT_EQ(b, Numbered(1000, 1000));
+}
+
+// Worked by hand: target column x copies source column floor(x * W / W'), row y likewise.
+TEST(ResampleNearest, EachTargetPixelCopiesTheSourcePixelItsPositionFallsIn) {
+  // Two columns to five: the targets start 0, 0.4, 0.8, 1.2 and 1.6 source columns in.
+  Bitmap32 pair = Numbered(2, 1);
+  ResampleNearest(pair, 1.0L, 2.5L);
+  ASSERT_EQ(pair.Width(), 5);
+  for (int x = 0; x < 5; ++x) EXPECT_EQ(pair.At(x, 0).b, x < 3 ? 0 : 1) << x;
+
+  // The image size dialog's example: 521 by 346 to 400 wide with the aspect held is 399 by 266
+  // (the factors are double quotients, 400 / 521 rounded downward).
+  Bitmap32 photo = Numbered(521, 346);
+  ResampleNearest(photo, static_cast<long double>(266.0 / 346.0),
+                  static_cast<long double>(400.0 / 521.0));
+  ASSERT_EQ(photo.Width(), 399);
+  ASSERT_EQ(photo.Height(), 266);
+  const struct {
+    int x, y, sourceX, sourceY;
+  } worked[] = {{2, 2, 2, 2}, {3, 1, 3, 1}, {398, 265, 519, 344}, {200, 133, 261, 173}};
+  for (const auto& c : worked) {
+    EXPECT_EQ(photo.At(c.x, c.y).b, static_cast<std::uint8_t>(c.sourceX)) << c.x;
+    EXPECT_EQ(photo.At(c.x, c.y).g, static_cast<std::uint8_t>(c.sourceY)) << c.y;
+  }
 }
 
 // Every target pixel is a copy of one source pixel; the chosen source columns and rows never
 // go backwards, start at the first, reach the last, and skip no more than the ratio allows.
 void ExpectNearestPixelResample(long double hf, long double wf) {
   const int w = 101, h = 57;
-  TBitmap32 b = Numbered(w, h);
-  ZoomInandOut(b, hf, wf);
+  Bitmap32 b = Numbered(w, h);
+  ResampleNearest(b, hf, wf);
   const int nw = static_cast<int>(w * wf), nh = static_cast<int>(h * hf);
   ASSERT_EQ(b.Width(), nw);
   ASSERT_EQ(b.Height(), nh);
@@ -209,7 +233,7 @@ void ExpectNearestPixelResample(long double hf, long double wf) {
   EXPECT_TRUE(covers(rows, h, nh)) << "height factor " << hf;
 }
 
-TEST(ZoomInandOut, NearestPixelCoversTheSource) {
+TEST(ResampleNearest, NearestPixelCoversTheSource) {
   // Unit factors keep every pixel; new sizes are truncated; the last: two columns of 101.
   const long double factors[][2] = {{1.0L, 1.0L},   {2.0L, 2.0L},  {0.5L, 0.5L},
                                     {1.37L, 0.73L}, {0.3L, 2.49L}, {1.0L, 0.02L}};

@@ -17,17 +17,17 @@ Pixel Inverted(Pixel p) {
                static_cast<std::uint8_t>(255 - p.r), p.a};
 }
 
-TBitmap32 Sobel(TBitmap32 b) {
-  picsobel(b);
+Bitmap32 Sobel(Bitmap32 b) {
+  InvertedSobelEdges(b);
   return b;
 }
 
 // Colour channels only: the alpha of the edge map is not part of its result.
-TBitmap32 Opaque(TBitmap32 b) {
+Bitmap32 Opaque(Bitmap32 b) {
   SetAlphaChannel(b, 255);
   return b;
 }
-::testing::AssertionResult SameColours(const TBitmap32& actual, const TBitmap32& expected) {
+::testing::AssertionResult SameColours(const Bitmap32& actual, const Bitmap32& expected) {
   if (Opaque(actual) == Opaque(expected)) return ::testing::AssertionSuccess();
   return ::testing::AssertionFailure() << "colours differ";
 }
@@ -36,8 +36,8 @@ TBitmap32 Opaque(TBitmap32 b) {
 // H - 2. Two high: both rows are row 1.
 TEST(Picsobel, TwoHighOrTwoWideRepeatsTheSecondLineInverted) {
   for (auto [w, h] : {std::pair{6, 2}, {2, 5}, {2, 2}}) {
-    const TBitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w * h));
-    TBitmap32 expected(w, h);
+    const Bitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w * h));
+    Bitmap32 expected(w, h);
     for (int y = 0; y < h; ++y)
       for (int x = 0; x < w; ++x)
         expected.At(x, y) =
@@ -47,20 +47,20 @@ TEST(Picsobel, TwoHighOrTwoWideRepeatsTheSecondLineInverted) {
 }
 
 TEST(Picsobel, ThreeByThreeBordersRepeatTheOneInteriorPixel) {
-  TBitmap32 in(3, 3, Rgb(10, 20, 30));
+  Bitmap32 in(3, 3, Rgb(10, 20, 30));
   in.At(1, 1) = Rgb(50, 20, 0);
   in.At(0, 1) = Rgb(40, 30, 30);
   // Red: line kernel 6 * 50 - 6 * 10 = 240, gradient 40 - 10 = 30: 255 - 240 = 15.
   // Green: 120 - 120 = 0 and 30 - 20 = 10: 245. Blue: 0 - 180 < 0 and 30 - 30 = 0: 255.
-  EXPECT_TRUE(SameColours(Sobel(in), TBitmap32(3, 3, Rgb(15, 245, 255))));
+  EXPECT_TRUE(SameColours(Sobel(in), Bitmap32(3, 3, Rgb(15, 245, 255))));
 }
 
 // Too small for a neighbour on one side: what there is repeats, inverted. A single column
 // still has its top and bottom rows repeat rows 1 and H - 2; a single row has no rows to take.
 TEST(Picsobel, SingleLinesRepeatWhatThereIsAndEmptyStaysEmpty) {
   for (auto [w, h] : {std::pair{1, 1}, {1, 2}, {1, 3}, {1, 6}, {5, 1}, {2, 1}}) {
-    const TBitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w * 10 + h));
-    TBitmap32 expected = in;
+    const Bitmap32 in = RandomPicture(w, h, static_cast<unsigned>(w * 10 + h));
+    Bitmap32 expected = in;
     if (h >= 2) {
       expected.At(0, 0) = in.At(0, 1);
       expected.At(0, h - 1) = expected.At(0, h - 2);
@@ -69,7 +69,7 @@ TEST(Picsobel, SingleLinesRepeatWhatThereIsAndEmptyStaysEmpty) {
       for (int x = 0; x < w; ++x) expected.At(x, y) = Inverted(expected.At(x, y));
     EXPECT_TRUE(SameColours(Sobel(in), expected)) << w << "x" << h;
   }
-  EXPECT_TRUE(Sobel(TBitmap32()).Empty());
+  EXPECT_TRUE(Sobel(Bitmap32()).Empty());
 }
 
 // The library works row by row, in bands on several threads and on all channels at once; the
@@ -78,8 +78,8 @@ TEST(Picsobel, MatchesTheStepByStepReference) {
   unsigned seed = 10;
   for (auto [w, h] :
        {std::pair{3, 3}, {4, 3}, {3, 4}, {17, 5}, {31, 29}, {101, 57}, {257, 130}, {733, 511}}) {
-    const TBitmap32 in = RandomPicture(w, h, ++seed);
-    EXPECT_EQ(Sobel(in), PicsobelReference(in)) << w << "x" << h;
+    const Bitmap32 in = RandomPicture(w, h, ++seed);
+    EXPECT_EQ(Sobel(in), InvertedSobelEdgesReference(in)) << w << "x" << h;
   }
 }
 

@@ -25,9 +25,9 @@ inline constexpr std::pair<int, int> kAwkwardSizes[] = {
 // Soft gradients with a little grain: edge maps with the mid-range values (and the exact halves
 // of the gray value) that noise, whose edge map is all 0 and 255, lacks, and the colours near
 // gray where hue and saturation meet exact halves most.
-inline TBitmap32 SoftPicture(int w, int h, unsigned seed) {
+inline Bitmap32 SoftPicture(int w, int h, unsigned seed) {
   std::mt19937 rng(seed);
-  TBitmap32 b(w, h);
+  Bitmap32 b(w, h);
   for (int y = 0; y < h; ++y)
     for (int x = 0; x < w; ++x) {
       const auto channel = [&](int slope) {

@@ -14,9 +14,9 @@ namespace {
 
 // Mid-level noise: its edge bytes spread over the middle of the range, where exact halves are
 // common, unlike the 0 and 255 that strong noise gives.
-TBitmap32 QuietNoise(int w, int h) {
+Bitmap32 QuietNoise(int w, int h) {
   std::mt19937 rng(7);
-  TBitmap32 b(w, h);
+  Bitmap32 b(w, h);
   for (int y = 0; y < h; ++y)
     for (int x = 0; x < w; ++x) {
       const auto c = [&] { return static_cast<std::uint8_t>(118 + rng() % 21); };
@@ -27,8 +27,8 @@ TBitmap32 QuietNoise(int w, int h) {
 
 TEST(GrayEdgeHalves, RowsAndCellsSettleEveryHalfAsGrayValue) {
   const int w = 301, h = 9;  // groups of 64 and 32 and a rest in every row
-  const TBitmap32 source = QuietNoise(w, h);
-  const TBitmap32 edges = PicsobelReference(source);
+  const Bitmap32 source = QuietNoise(w, h);
+  const Bitmap32 edges = InvertedSobelEdgesReference(source);
   int up = 0, down = 0;
   for (int y = 0; y < h; ++y)
     for (int x = 0; x < w; ++x) {

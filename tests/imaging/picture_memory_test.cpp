@@ -14,11 +14,11 @@ TEST(PictureMemory, CopiesAndMovesBetweenSizes) {
   const std::pair<int, int> sizes[] = {{0, 0}, {1, 1}, {3, 2}, {512, 512}, {700, 400}};
   for (const auto& [fw, fh] : sizes)
     for (const auto& [tw, th] : sizes) {
-      const TBitmap32 from = RandomPicture(fw, fh, 1);
-      TBitmap32 to = RandomPicture(tw, th, 2);
+      const Bitmap32 from = RandomPicture(fw, fh, 1);
+      Bitmap32 to = RandomPicture(tw, th, 2);
       to = from;
       EXPECT_EQ(to, from) << fw << "x" << fh << " over " << tw << "x" << th;
-      TBitmap32 moved = std::move(to);
+      Bitmap32 moved = std::move(to);
       EXPECT_EQ(moved, from);
       EXPECT_TRUE(to.Empty());
       EXPECT_EQ(to.Height(), 0);
@@ -35,20 +35,20 @@ TEST(PictureMemory, FreedBlocksServeTheNextPictureOfTheirSize) {
   ReleasePictureMemory();
   const Pixel* first = nullptr;
   {
-    const TBitmap32 picture(2000, 1000, Pixel{1, 2, 3, 4});
+    const Bitmap32 picture(2000, 1000, Pixel{1, 2, 3, 4});
     first = picture.Data();
   }
   EXPECT_GE(KeptPictureBytes(), 2000u * 1000 * 4);
   {
-    const TBitmap32 again = TBitmap32::ForOverwrite(2000, 1000);
+    const Bitmap32 again = Bitmap32::ForOverwrite(2000, 1000);
     EXPECT_EQ(again.Data(), first);
     EXPECT_EQ(KeptPictureBytes(), 0u);
   }
   // A cleared picture is cleared even in a block that held another picture.
-  const TBitmap32 cleared(2000, 1000);
+  const Bitmap32 cleared(2000, 1000);
   EXPECT_EQ(cleared.Data(), first);
   EXPECT_EQ(cleared.At(1999, 999), Pixel{});
-  { const TBitmap32 other(1000, 1000); }
+  { const Bitmap32 other(1000, 1000); }
   ReleasePictureMemory(2000u * 1000 * 4);
   EXPECT_EQ(KeptPictureBytes(), 0u);
 }

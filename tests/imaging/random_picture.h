@@ -8,9 +8,9 @@
 namespace quillane {
 
 // Every byte random; when grayish, three pixels in four are gray with a random level.
-inline TBitmap32 RandomPicture(int w, int h, unsigned seed, bool grayish = false) {
+inline Bitmap32 RandomPicture(int w, int h, unsigned seed, bool grayish = false) {
   std::mt19937 rng(seed);
-  TBitmap32 b(w, h);
+  Bitmap32 b(w, h);
   for (int y = 0; y < h; ++y)
     for (int x = 0; x < w; ++x) {
       const std::uint32_t v = rng();

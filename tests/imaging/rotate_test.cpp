@@ -15,17 +15,17 @@ constexpr double kClockwise = -std::numbers::pi / 2;
 constexpr double kAnticlockwise = std::numbers::pi / 2;
 
 // The turn the slow way: both canvases built, every pixel through sine and cosine.
-std::optional<TBitmap32> ReferenceRotate(const TBitmap32& s, int cx, int cy, double theta) {
+std::optional<Bitmap32> ReferenceRotate(const Bitmap32& s, int cx, int cy, double theta) {
   const int w = s.Width(), h = s.Height();
   const Extended d = std::sqrt(static_cast<Extended>(h * h + w * w));
   const int padX = Round((d - w) / 2), padY = Round((d - h) / 2);
-  TBitmap32 a(w + 2 * padX, h + 2 * padY, kRotationFill);
+  Bitmap32 a(w + 2 * padX, h + 2 * padY, kRotationFill);
   for (int y = 0; y < h; ++y)
     for (int x = 0; x < w; ++x) a.At(x + padX, y + padY) = s.At(x, y);
   const int ax = cx + padX, ay = cy + padY;
   const Extended sn = std::sin(static_cast<Extended>(theta));
   const Extended c = std::cos(static_cast<Extended>(theta));
-  TBitmap32 b(a.Width(), a.Height(), kRotationFill);
+  Bitmap32 b(a.Width(), a.Height(), kRotationFill);
   int top = -1, left = -1;
   for (int y = 0; y < b.Height(); ++y)
     for (int x = 0; x < b.Width(); ++x) {
@@ -40,17 +40,17 @@ std::optional<TBitmap32> ReferenceRotate(const TBitmap32& s, int cx, int cy, dou
   top = std::max(top, 0);
   left = std::max(left, 0);
   if (b.Width() - 2 * left < 1 || b.Height() - 2 * top < 1) return std::nullopt;
-  TBitmap32 result(b.Width() - 2 * left, b.Height() - 2 * top);
+  Bitmap32 result(b.Width() - 2 * left, b.Height() - 2 * top);
   for (int y = 0; y < result.Height(); ++y)
     for (int x = 0; x < result.Width(); ++x) result.At(x, y) = b.At(left + x, top + y);
   return result;
 }
 
-std::optional<TBitmap32> Turn(const TBitmap32& s, QuarterTurn turn) {
+std::optional<Bitmap32> Turn(const Bitmap32& s, QuarterTurn turn) {
   return RotatePicture(s, RotationCentre(s.Width()), RotationCentre(s.Height()), turn);
 }
 
-std::pair<int, int> SizeOf(const TBitmap32& b) {
+std::pair<int, int> SizeOf(const Bitmap32& b) {
   return {b.Width(), b.Height()};
 }
 
@@ -68,7 +68,7 @@ TEST(RotatePicture, SizesOfQuarterTurns) {
       {101, 57, QuarterTurn::Anticlockwise, 57, 101},
   };
   for (const auto& c : cases) {
-    const std::optional<TBitmap32> r = Turn(RandomPicture(c.w, c.h, 1), c.turn);
+    const std::optional<Bitmap32> r = Turn(RandomPicture(c.w, c.h, 1), c.turn);
     ASSERT_TRUE(r) << c.w << "x" << c.h;
     EXPECT_EQ(SizeOf(*r), std::pair(c.expectW, c.expectH)) << c.w << "x" << c.h;
   }
@@ -76,7 +76,7 @@ TEST(RotatePicture, SizesOfQuarterTurns) {
 
 TEST(RotatePicture, MatchesTheCanvasReference) {
   // Random content, some of it in the fill colour: the trim depends on what the picture holds.
-  auto withFill = [](TBitmap32 b, int variant) {
+  auto withFill = [](Bitmap32 b, int variant) {
     for (int y = 0; y < b.Height(); ++y)
       for (int x = 0; x < b.Width(); ++x) {
         const bool fill = variant == 1   ? x < b.Width() / 2
@@ -93,8 +93,7 @@ TEST(RotatePicture, MatchesTheCanvasReference) {
     sizes.push_back(s);
   for (auto [w, h] : sizes)
     for (int variant = 0; variant <= 3; ++variant) {
-      const TBitmap32 s =
-          withFill(RandomPicture(w, h, static_cast<unsigned>(w * 100 + h)), variant);
+      const Bitmap32 s = withFill(RandomPicture(w, h, static_cast<unsigned>(w * 100 + h)), variant);
       for (auto [cx, cy] : {std::pair{RotationCentre(w), RotationCentre(h)}, {0, 0}, {w, h - 1}})
         for (QuarterTurn turn : {QuarterTurn::Clockwise, QuarterTurn::Anticlockwise}) {
           const double theta = turn == QuarterTurn::Clockwise ? kClockwise : kAnticlockwise;

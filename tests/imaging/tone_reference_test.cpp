@@ -12,21 +12,21 @@ namespace {
 
 // The extended-precision gray value the exhaustive check below compares with, pinned.
 TEST(ConvertToGray, WeightsAndAlpha) {
-  TBitmap32 b(2, 1);
+  Bitmap32 b(2, 1);
   b.At(0, 0) = Pixel{30, 20, 10, 0};  // R 10, G 20, B 30: Round(18.1)
   b.At(1, 0) = Pixel{0, 0, 5, 1};     // Round(1.5) = 2
   ConvertToGray(b);
   EXPECT_EQ(b.At(0, 0), (Pixel{18, 18, 18, 255}));
   EXPECT_EQ(b.At(1, 0), (Pixel{2, 2, 2, 255}));
-  TBitmap32 empty;
+  Bitmap32 empty;
   ConvertToGray(empty);
   EXPECT_TRUE(empty.Empty());
 }
 
 // One 256 by 256 picture per red level covers every colour there is. The exhaustive checks
 // are split by red level into shards, so that they can run side by side.
-TBitmap32 AllGreenBlue(int red) {
-  TBitmap32 b(256, 256);
+Bitmap32 AllGreenBlue(int red) {
+  Bitmap32 b(256, 256);
   for (int g = 0; g < 256; ++g)
     for (int bl = 0; bl < 256; ++bl)
       b.At(bl, g) = Pixel{static_cast<std::uint8_t>(bl), static_cast<std::uint8_t>(g),
@@ -44,11 +44,11 @@ INSTANTIATE_TEST_SUITE_P(RedLevels, EveryColour, ::testing::Range(0, 256, 32));
 
 TEST_P(EveryColour, GrayAndLightingMatchTheExtendedPrecisionGrayValue) {
   for (int r = FirstRed(); r < EndRed(); ++r) {
-    const TBitmap32 in = AllGreenBlue(r);
-    TBitmap32 gray = in;
+    const Bitmap32 in = AllGreenBlue(r);
+    Bitmap32 gray = in;
     ConvertToGray(gray);
-    const TBitmap32 dark = PencilLightingPass(in, 100);
-    const TBitmap32 light = PencilLightingPass(in, 129);
+    const Bitmap32 dark = PencilLightingPass(in, 100);
+    const Bitmap32 light = PencilLightingPass(in, 129);
     for (int g = 0; g < 256; ++g)
       for (int bl = 0; bl < 256; ++bl) {
         const int v = GrayValue(r, g, bl);
@@ -71,7 +71,7 @@ TEST_P(EveryColour, RgbToHslMatchesThePlainConversion) {
 }
 
 TEST(PencilLightingPass, AllPositionsAtTheExtremes) {
-  TBitmap32 in(256, 3);
+  Bitmap32 in(256, 3);
   for (int x = 0; x < 256; ++x) {
     const auto v = static_cast<std::uint8_t>(x);
     in.At(x, 0) = Pixel{v, v, v, 0};
@@ -79,7 +79,7 @@ TEST(PencilLightingPass, AllPositionsAtTheExtremes) {
     in.At(x, 2) = Pixel{v, static_cast<std::uint8_t>(255 - x), 0, 0};
   }
   for (int v = 0; v < 256; ++v) {
-    const TBitmap32 out = PencilLightingPass(in, v);
+    const Bitmap32 out = PencilLightingPass(in, v);
     for (int y = 0; y < 3; ++y)
       for (int x = 0; x < 256; ++x) {
         const Pixel p = in.At(x, y);
@@ -88,7 +88,7 @@ TEST(PencilLightingPass, AllPositionsAtTheExtremes) {
         ASSERT_EQ(out.At(x, y), (Pixel{e, e, e, 255})) << x << "," << y << " v=" << v;
       }
   }
-  EXPECT_TRUE(PencilLightingPass(TBitmap32(), 45).Empty());
+  EXPECT_TRUE(PencilLightingPass(Bitmap32(), 45).Empty());
 }
 
 class EveryHsl : public ::testing::TestWithParam<int> {};
@@ -106,7 +106,7 @@ TEST(PencilContrastPass, MatchesThePlainChainOnColourAndGrayPictures) {
   unsigned seed = 0;
   for (auto [w, h] : {std::pair{1, 1}, {7, 3}, {320, 240}})
     for (bool grayish : {false, true}) {
-      const TBitmap32 in = RandomPicture(w, h, ++seed, grayish);
+      const Bitmap32 in = RandomPicture(w, h, ++seed, grayish);
       for (int c : {0, 10, 44, 45, 46, 60, 89})
         ASSERT_EQ(PencilContrastPass(in, c), PencilContrastPassReference(in, c))
             << w << "x" << h << " c=" << c;

@@ -59,13 +59,13 @@ Pixel Gray(int v, int alpha = 255) {
 TEST(PencilContrastPass, GrayLevelsAtNeutralPosition) {
   const int levels[][2] = {{0, 0},     {1, 0},     {2, 3},     {127, 128},
                            {129, 131}, {200, 199}, {254, 255}, {255, 255}};
-  TBitmap32 ramp(8, 2);
+  Bitmap32 ramp(8, 2);
   for (int x = 0; x < 8; ++x) ramp.At(x, 0) = ramp.At(x, 1) = Gray(levels[x][0], 7);
-  const TBitmap32 result = PencilContrastPass(ramp, 45);
+  const Bitmap32 result = PencilContrastPass(ramp, 45);
   for (int x = 0; x < 8; ++x) EXPECT_EQ(result.At(x, 1), Gray(levels[x][1])) << levels[x][0];
-  EXPECT_TRUE(PencilContrastPass(TBitmap32(), 45).Empty());
+  EXPECT_TRUE(PencilContrastPass(Bitmap32(), 45).Empty());
   // A single row is an ordinary picture here.
-  EXPECT_EQ(PencilContrastPass(TBitmap32(4, 1, Pixel{0, 0, 0, 0}), 45), TBitmap32(4, 1, Gray(0)));
+  EXPECT_EQ(PencilContrastPass(Bitmap32(4, 1, Pixel{0, 0, 0, 0}), 45), Bitmap32(4, 1, Gray(0)));
 }
 
 }  // namespace

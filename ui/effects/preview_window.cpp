@@ -1,4 +1,4 @@
-#include "effects/adjust/preview_window.h"
+#include "ui/effects/preview_window.h"
 
 #include <QAbstractButton>
 #include <QButtonGroup>
@@ -42,7 +42,7 @@ PreviewWindow::PreviewWindow(const EffectSpec& spec, ToolHost& host, QWidget* pa
   const auto box = [&](PictureView*& view, const char* name, bool clickable) {
     auto* frame = new QWidget(this);
     frame->setFixedSize(kThumbnailBox, kThumbnailBox);
-    view = clickable ? new Clickable<PictureView>(frame, [this] { Image1Click(); })
+    view = clickable ? new Clickable<PictureView>(frame, [this] { ShowBase(); })
                      : new PictureView(frame);
     view->setObjectName(name);
     row->addWidget(frame);
@@ -54,9 +54,9 @@ PreviewWindow::PreviewWindow(const EffectSpec& spec, ToolHost& host, QWidget* pa
   ControlsLayout()->insertLayout(0, row);
 }
 
-void PreviewWindow::FormShow() {
+void PreviewWindow::OnShown() {
   // The shared steps uncheck "For current", which loads the source.
-  ToolWindow::FormShow();
+  ToolWindow::OnShown();
   LoadBase();
   // The swatches' style sheets take effect once the window is polished; only then does the
   // layout know how tall the window must be.
@@ -72,7 +72,7 @@ void PreviewWindow::LoadBase() {
   SetPreview(base_);
 }
 
-void PreviewWindow::SetPreview(TBitmap32 preview) {
+void PreviewWindow::SetPreview(Bitmap32 preview) {
   preview_ = std::move(preview);
   image2_->SetPicture(preview_);
   Host().DisplayImage(*image2_);
@@ -82,18 +82,18 @@ void PreviewWindow::ControlChanged(const ParamSpec& param) {
   if (param.name == "for-current") LoadBase();
 }
 
-void PreviewWindow::Image1Click() {
+void PreviewWindow::ShowBase() {
   ClearSwatches();
   SetPreview(base_);
 }
 
-void PreviewWindow::ApplyClick() {
+void PreviewWindow::ApplyShown() {
   Host().SetWorkingPicture(preview_, true);
   Host().SetStatusText(QString::fromStdString(Spec().statusText));
   close();
 }
 
-TColor_Filter::TColor_Filter(const EffectSpec& spec, ToolHost& host, QWidget* parent)
+ColorFilterWindow::ColorFilterWindow(const EffectSpec& spec, ToolHost& host, QWidget* parent)
     : PreviewWindow(spec, host, parent) {
   auto* grid = new QGridLayout;
   grid->setSpacing(6);
@@ -102,7 +102,7 @@ TColor_Filter::TColor_Filter(const EffectSpec& spec, ToolHost& host, QWidget* pa
   ClearSwatches();
 }
 
-void TColor_Filter::ClearSwatches() {
+void ColorFilterWindow::ClearSwatches() {
   // No swatch is chosen, so that a click on any one filters.
   auto* first = findChild<QAbstractButton*>(kSwatches[0]);
   if (first == nullptr || first->group() == nullptr) return;
@@ -112,14 +112,14 @@ void TColor_Filter::ClearSwatches() {
   group->setExclusive(true);
 }
 
-void TColor_Filter::ControlChanged(const ParamSpec& param) {
+void ColorFilterWindow::ControlChanged(const ParamSpec& param) {
   PreviewWindow::ControlChanged(param);
   if (param.name != "filter") return;
   const int f = Params().GetInt("filter");
-  if (f >= 1) SetPreview(filter(Base(), static_cast<ColorFilterKind>(f)));
+  if (f >= 1) SetPreview(ColorFilter(Base(), static_cast<ColorFilterKind>(f)));
 }
 
-TColor_variety::TColor_variety(const EffectSpec& spec, ToolHost& host, QWidget* parent)
+ColorVarietyWindow::ColorVarietyWindow(const EffectSpec& spec, ToolHost& host, QWidget* parent)
     : PreviewWindow(spec, host, parent) {
   auto* grid = new QGridLayout;
   grid->setSpacing(6);
@@ -127,11 +127,11 @@ TColor_variety::TColor_variety(const EffectSpec& spec, ToolHost& host, QWidget* 
   ControlsLayout()->insertLayout(1, grid);
 }
 
-void TColor_variety::ClearSwatches() {
+void ColorVarietyWindow::ClearSwatches() {
   if (!Params().GetList("more").empty()) SetParam("more", {});
 }
 
-void TColor_variety::ControlChanged(const ParamSpec& param) {
+void ColorVarietyWindow::ControlChanged(const ParamSpec& param) {
   PreviewWindow::ControlChanged(param);
   if (param.name == "more") SetPreview(VarietyClicks(Base(), Params().GetList("more")));
 }

@@ -1,4 +1,4 @@
-#include "effects/surface/texture_window.h"
+#include "ui/effects/texture_window.h"
 
 #include <QGridLayout>
 #include <QLabel>
@@ -36,7 +36,7 @@ class TileLabel : public QLabel {
 
 }  // namespace
 
-TTexture::TTexture(const EffectSpec& spec, ToolHost& host, QWidget* parent)
+TextureWindow::TextureWindow(const EffectSpec& spec, ToolHost& host, QWidget* parent)
     : SnapshotWindow(spec, host, parent) {
   auto* grid = new QGridLayout;
   grid->setSpacing(4);

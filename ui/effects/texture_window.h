@@ -2,15 +2,15 @@
 // it, and the snapshot behaviour of the windows laid over the picture as shown.
 #pragma once
 
-#include "effects/surface/snapshot_window.h"
+#include "ui/effects/snapshot_window.h"
 
 namespace quillane {
 
-class TTexture : public SnapshotWindow {
+class TextureWindow : public SnapshotWindow {
   Q_OBJECT
 
  public:
-  TTexture(const EffectSpec& spec, ToolHost& host, QWidget* parent);
+  TextureWindow(const EffectSpec& spec, ToolHost& host, QWidget* parent);
 };
 
 }  // namespace quillane

@@ -1,4 +1,4 @@
-#include "freehand/work_area_window.h"
+#include "ui/freehand/work_area_window.h"
 
 #include <QAction>
 #include <QCloseEvent>
@@ -37,7 +37,8 @@ int BandCoordinate(int at, int anchor) {
 
 // --- Image1 ------------------------------------------------------------------------------------
 
-FreehandCanvas::FreehandCanvas(TFreehand& area, QWidget* parent) : QWidget(parent), area_(area) {
+FreehandCanvas::FreehandCanvas(WorkAreaWindow& area, QWidget* parent)
+    : QWidget(parent), area_(area) {
   setObjectName("Image1");
   setToolTip("Right-down to move");
   setAttribute(Qt::WA_OpaquePaintEvent);
@@ -46,7 +47,7 @@ FreehandCanvas::FreehandCanvas(TFreehand& area, QWidget* parent) : QWidget(paren
 
 void FreehandCanvas::paintEvent(QPaintEvent* event) {
   QPainter painter(this);
-  const TBitmap32& picture = area_.Picture();
+  const Bitmap32& picture = area_.Picture();
   const QRect exposed = event->rect();
   if (picture.Empty()) {
     painter.fillRect(exposed, palette().window());
@@ -67,22 +68,23 @@ void FreehandCanvas::paintEvent(QPaintEvent* event) {
 }
 
 void FreehandCanvas::mousePressEvent(QMouseEvent* event) {
-  area_.Image1MouseDown(event->button(), PicturePoint(event));
+  area_.PictureMouseDown(event->button(), PicturePoint(event));
 }
 void FreehandCanvas::mouseMoveEvent(QMouseEvent* event) {
-  area_.Image1MouseMove(event->buttons(), PicturePoint(event));
+  area_.PictureMouseMove(event->buttons(), PicturePoint(event));
 }
 void FreehandCanvas::mouseReleaseEvent(QMouseEvent* event) {
-  area_.Image1MouseUp(event->button(), PicturePoint(event));
+  area_.PictureMouseUp(event->button(), PicturePoint(event));
 }
 void FreehandCanvas::leaveEvent(QEvent* event) {
-  area_.Image1MouseLeave();
+  area_.PictureMouseLeave();
   QWidget::leaveEvent(event);
 }
 
-// --- TFreehand ---------------------------------------------------------------------------------
+// --- WorkAreaWindow
+// ---------------------------------------------------------------------------------
 
-TFreehand::TFreehand(PaintingState& state, ToolHost& host)
+WorkAreaWindow::WorkAreaWindow(PaintingState& state, ToolHost& host)
     : QWidget(nullptr, Qt::Window | Qt::WindowStaysOnTopHint | Qt::CustomizeWindowHint |
                            Qt::WindowTitleHint | Qt::WindowCloseButtonHint),
       state_(state),
@@ -106,23 +108,23 @@ TFreehand::TFreehand(PaintingState& state, ToolHost& host)
   undo->setObjectName("UndoStroke");
   undo->setShortcut(QKeySequence::Undo);
   undo->setShortcutContext(Qt::WindowShortcut);
-  connect(undo, &QAction::triggered, this, &TFreehand::UndoStroke);
+  connect(undo, &QAction::triggered, this, &WorkAreaWindow::UndoStroke);
   addAction(undo);
 }
 
 // --- Opening and closing -----------------------------------------------------------------------
 
-void TFreehand::showEvent(QShowEvent* event) {
+void WorkAreaWindow::showEvent(QShowEvent* event) {
   QWidget::showEvent(event);
-  if (!event->spontaneous()) FormShow();
+  if (!event->spontaneous()) OnShown();
 }
 
-void TFreehand::closeEvent(QCloseEvent* event) {
-  FormClose();
+void WorkAreaWindow::closeEvent(QCloseEvent* event) {
+  OnClosed();
   QWidget::closeEvent(event);
 }
 
-void TFreehand::FormShow() {
+void WorkAreaWindow::OnShown() {
   picture_ = host_.Document().Working();
   strokes_.Clear();
   strokeTool_ = PaintingState::kNoTool;
@@ -130,22 +132,22 @@ void TFreehand::FormShow() {
   outlineShown_ = bandShown_ = pointerInside_ = false;
   image1_->resize(picture_.Width(), picture_.Height());
   image1_->update();
-  setcursorimage2();
+  UpdateToolCursor();
   host_.SetMainWindowEnabled(false);
 }
 
-void TFreehand::FormClose() {
+void WorkAreaWindow::OnClosed() {
   if (state_.controlPanelOpen && controlPanel_ != nullptr) controlPanel_->close();
   // The painting is over: nothing of it is kept unless OK took it.
   strokes_.Clear();
   strokeTool_ = PaintingState::kNoTool;
-  picture_ = TBitmap32();
+  picture_ = Bitmap32();
   image1_->resize(0, 0);
 }
 
 // --- Tools -------------------------------------------------------------------------------------
 
-void TFreehand::setcursorimage2() {
+void WorkAreaWindow::UpdateToolCursor() {
   image1_->setCursor(Qt::ArrowCursor);
   const bool outlined =
       state_.tool == PaintingState::kBrush || state_.tool == PaintingState::kRubber;
@@ -155,15 +157,15 @@ void TFreehand::setcursorimage2() {
     ShowOutline(pointer_);
 }
 
-void TFreehand::PenSizeChanged() {
+void WorkAreaWindow::PenSizeChanged() {
   if (outlineShown_) ShowOutline(outlineCentre_);
 }
 
-void TFreehand::Repaint(const PaintRect& area) {
+void WorkAreaWindow::Repaint(const PaintRect& area) {
   if (!area.Empty()) image1_->update(ToQRect(area));
 }
 
-void TFreehand::Dab(QPoint at) {
+void WorkAreaWindow::Dab(QPoint at) {
   const int size = state_.penSize;
   strokes_.Keep(picture_, DiscBounds(picture_, at.x(), at.y(), size));
   Repaint(strokeTool_ == PaintingState::kBrush
@@ -171,17 +173,17 @@ void TFreehand::Dab(QPoint at) {
               : RubDisc(picture_, at.x(), at.y(), size));
 }
 
-void TFreehand::StartPen() {
+void WorkAreaWindow::StartPen() {
   pen_ = LinePen{state_.brushColor, state_.penSize, 0};
 }
 
-void TFreehand::LineTo(QPoint to, bool withEnd) {
+void WorkAreaWindow::LineTo(QPoint to, bool withEnd) {
   strokes_.Keep(picture_, LineBounds(picture_, penAt_.x(), penAt_.y(), to.x(), to.y(), pen_.width));
   Repaint(DrawLine(picture_, pen_, penAt_.x(), penAt_.y(), to.x(), to.y(), withEnd));
   penAt_ = to;
 }
 
-void TFreehand::WholePictureStep(void (*operation)(TBitmap32&)) {
+void WorkAreaWindow::WholePictureStep(void (*operation)(Bitmap32&)) {
   if (picture_.Empty() || strokeTool_ != PaintingState::kNoTool) return;
   strokes_.Begin(picture_);
   strokes_.Keep(picture_, PaintRect{0, 0, picture_.Width(), picture_.Height()});
@@ -190,14 +192,14 @@ void TFreehand::WholePictureStep(void (*operation)(TBitmap32&)) {
   image1_->update();
 }
 
-void TFreehand::ThinPicture() {
+void WorkAreaWindow::ThinPicture() {
   WholePictureStep(&Thin);
 }
-void TFreehand::ThickPicture() {
+void WorkAreaWindow::ThickPicture() {
   WholePictureStep(&Thick);
 }
 
-void TFreehand::UndoStroke() {
+void WorkAreaWindow::UndoStroke() {
   // Not in the middle of a stroke: its pixels are still being saved.
   if (strokeTool_ != PaintingState::kNoTool) return;
   Repaint(strokes_.Undo(picture_));
@@ -205,7 +207,7 @@ void TFreehand::UndoStroke() {
 
 // --- The mouse ---------------------------------------------------------------------------------
 
-void TFreehand::Image1MouseDown(Qt::MouseButton button, QPoint at) {
+void WorkAreaWindow::PictureMouseDown(Qt::MouseButton button, QPoint at) {
   if (button == Qt::RightButton) {
     panning_ = true;
     panFrom_ = at;
@@ -235,7 +237,7 @@ void TFreehand::Image1MouseDown(Qt::MouseButton button, QPoint at) {
   }
 }
 
-void TFreehand::Image1MouseMove(Qt::MouseButtons buttons, QPoint at) {
+void WorkAreaWindow::PictureMouseMove(Qt::MouseButtons buttons, QPoint at) {
   pointerInside_ = true;
   pointer_ = at;
   if (panning_ && (buttons & Qt::RightButton)) {
@@ -267,7 +269,7 @@ void TFreehand::Image1MouseMove(Qt::MouseButtons buttons, QPoint at) {
     ShowOutline(at);
 }
 
-void TFreehand::Image1MouseUp(Qt::MouseButton button, QPoint at) {
+void WorkAreaWindow::PictureMouseUp(Qt::MouseButton button, QPoint at) {
   if (button == Qt::RightButton) {
     panning_ = false;
     return;
@@ -284,14 +286,14 @@ void TFreehand::Image1MouseUp(Qt::MouseButton button, QPoint at) {
   strokeTool_ = PaintingState::kNoTool;
 }
 
-void TFreehand::Image1MouseLeave() {
+void WorkAreaWindow::PictureMouseLeave() {
   pointerInside_ = false;
   RemoveOutline();
 }
 
 // --- What is drawn over the picture ------------------------------------------------------------
 
-void TFreehand::RemoveOutline() {
+void WorkAreaWindow::RemoveOutline() {
   if (!outlineShown_) return;
   outlineShown_ = false;
   const int r = outlineRadius_;
@@ -299,7 +301,7 @@ void TFreehand::RemoveOutline() {
       QRect(outlineCentre_ - QPoint(r, r), outlineCentre_ + QPoint(r, r)).adjusted(-1, -1, 2, 2));
 }
 
-void TFreehand::ShowOutline(QPoint at) {
+void WorkAreaWindow::ShowOutline(QPoint at) {
   RemoveOutline();
   // Not on the three leftmost columns or top rows, nor on the two rightmost or bottom ones.
   if (!(at.x() > 2 && at.x() < picture_.Width() - 2 && at.y() >= 3 &&
@@ -312,7 +314,7 @@ void TFreehand::ShowOutline(QPoint at) {
   image1_->update(QRect(at - QPoint(r, r), at + QPoint(r, r)).adjusted(-1, -1, 2, 2));
 }
 
-void TFreehand::RemoveBand() {
+void WorkAreaWindow::RemoveBand() {
   if (!bandShown_) return;
   bandShown_ = false;
   image1_->update(QRect(anchor_, bandEnd_).normalized().adjusted(-1, -1, 1, 1));

@@ -1,4 +1,4 @@
-#include "freehand/control_panel_window.h"
+#include "ui/freehand/control_panel_window.h"
 
 #include <QButtonGroup>
 #include <QCloseEvent>
@@ -18,9 +18,9 @@
 #include <algorithm>
 #include <cmath>
 
-#include "freehand/work_area_window.h"
 #include "imaging/numeric.h"
 #include "ui/clickable.h"
+#include "ui/freehand/work_area_window.h"
 #include "ui/picture_view.h"
 #include "ui/platform.h"
 #include "ui/tool_host.h"
@@ -76,7 +76,8 @@ constexpr ToolButtonSpec kToolButtons[] = {
 
 }  // namespace
 
-TFreehand_control::TFreehand_control(PaintingState& state, ToolHost& host, TFreehand& workArea)
+ControlPanelWindow::ControlPanelWindow(PaintingState& state, ToolHost& host,
+                                       WorkAreaWindow& workArea)
     : QWidget(nullptr, Qt::Window | Qt::WindowStaysOnTopHint | Qt::CustomizeWindowHint |
                            Qt::WindowTitleHint | Qt::WindowCloseButtonHint),
       state_(state),
@@ -91,10 +92,10 @@ TFreehand_control::TFreehand_control(PaintingState& state, ToolHost& host, TFree
   image2_->setGeometry(4, 4, kViewWidth, kViewHeight);
   image2_->installEventFilter(this);
 
-  panel1_ = new QFrame(this);
-  panel1_->setObjectName("Panel1");
-  panel1_->setGeometry(4, kViewHeight + 20, kViewWidth, 330);
-  auto* grid = new QGridLayout(panel1_);
+  toolPanel_ = new QFrame(this);
+  toolPanel_->setObjectName("Panel1");
+  toolPanel_->setGeometry(4, kViewHeight + 20, kViewWidth, 330);
+  auto* grid = new QGridLayout(toolPanel_);
   grid->setContentsMargins(2, 2, 2, 2);
   grid->setVerticalSpacing(8);
 
@@ -103,7 +104,7 @@ TFreehand_control::TFreehand_control(PaintingState& state, ToolHost& host, TFree
   tools_ = new QButtonGroup(this);
   tools_->setExclusive(true);
   for (const ToolButtonSpec& spec : kToolButtons) {
-    auto* button = new QToolButton(panel1_);
+    auto* button = new QToolButton(toolPanel_);
     button->setObjectName(spec.name);
     button->setText(spec.text);
     button->setToolTip(spec.hint);
@@ -115,7 +116,7 @@ TFreehand_control::TFreehand_control(PaintingState& state, ToolHost& host, TFree
   }
   grid->addLayout(toolRow, 0, 0, 1, 3);
 
-  auto* panel = new Clickable<QFrame>(panel1_, [this] { ColorPanelClick(); });
+  auto* panel = new Clickable<QFrame>(toolPanel_, [this] { ChooseBrushColor(); });
   panel->setObjectName("ColorPanel");
   panel->setToolTip("Select a color from ColorPanel");
   panel->setFixedHeight(28);
@@ -123,51 +124,51 @@ TFreehand_control::TFreehand_control(PaintingState& state, ToolHost& host, TFree
   colorPanel_ = panel;
   grid->addWidget(colorPanel_, 1, 0, 1, 3);
 
-  auto* label2 = new QLabel("Dia.", panel1_);
+  auto* label2 = new QLabel("Dia.", toolPanel_);
   label2->setObjectName("Label2");
-  trackBar1_ = new QSlider(Qt::Horizontal, panel1_);
-  trackBar1_->setObjectName("TrackBar1");
-  trackBar1_->setRange(PaintingState::kMinPenSize, PaintingState::kMaxPenSize);
-  trackBar1_->setValue(state_.penSize);
-  label1_ = new QLabel(QString::number(state_.penSize), panel1_);
-  label1_->setObjectName("Label1");
-  label1_->setMinimumWidth(24);
-  connect(trackBar1_, &QSlider::valueChanged, this, &TFreehand_control::TrackBar1Change);
+  penSizeSlider_ = new QSlider(Qt::Horizontal, toolPanel_);
+  penSizeSlider_->setObjectName("TrackBar1");
+  penSizeSlider_->setRange(PaintingState::kMinPenSize, PaintingState::kMaxPenSize);
+  penSizeSlider_->setValue(state_.penSize);
+  penSizeLabel_ = new QLabel(QString::number(state_.penSize), toolPanel_);
+  penSizeLabel_->setObjectName("Label1");
+  penSizeLabel_->setMinimumWidth(24);
+  connect(penSizeSlider_, &QSlider::valueChanged, this, &ControlPanelWindow::OnPenSizeChanged);
   grid->addWidget(label2, 2, 0);
-  grid->addWidget(trackBar1_, 2, 1);
-  grid->addWidget(label1_, 2, 2);
+  grid->addWidget(penSizeSlider_, 2, 1);
+  grid->addWidget(penSizeLabel_, 2, 2);
 
   auto* buttons = new QGridLayout;
   const auto addButton = [&](const char* name, const char* text, const char* hint, int row,
-                             int column, void (TFreehand_control::*click)()) {
-    auto* button = new QPushButton(text, panel1_);
+                             int column, void (ControlPanelWindow::*click)()) {
+    auto* button = new QPushButton(text, toolPanel_);
     button->setObjectName(name);
     if (hint != nullptr) button->setToolTip(hint);
     connect(button, &QPushButton::clicked, this, click);
     buttons->addWidget(button, row, column);
     return button;
   };
-  thin_ = addButton("Button8", "Thin", "Thin the line", 0, 0, &TFreehand_control::Button8Click);
-  thick_ = addButton("Button4", "Thick", "Thick the line", 0, 1, &TFreehand_control::Button4Click);
-  addButton("Button1", "OK", nullptr, 1, 0, &TFreehand_control::Button1Click);
-  addButton("Button2", "Cancel", nullptr, 1, 1, &TFreehand_control::Button2Click);
+  thin_ = addButton("Button8", "Thin", "Thin the line", 0, 0, &ControlPanelWindow::OnThin);
+  thick_ = addButton("Button4", "Thick", "Thick the line", 0, 1, &ControlPanelWindow::OnThick);
+  addButton("Button1", "OK", nullptr, 1, 0, &ControlPanelWindow::OnOk);
+  addButton("Button2", "Cancel", nullptr, 1, 1, &ControlPanelWindow::OnCancel);
   grid->addLayout(buttons, 3, 0, 1, 3);
   grid->setRowStretch(4, 1);
 }
 
 // --- Opening and closing -----------------------------------------------------------------------
 
-void TFreehand_control::showEvent(QShowEvent* event) {
+void ControlPanelWindow::showEvent(QShowEvent* event) {
   QWidget::showEvent(event);
-  if (!event->spontaneous()) FormShow();
+  if (!event->spontaneous()) OnShown();
 }
 
-void TFreehand_control::closeEvent(QCloseEvent* event) {
-  FormClose();
+void ControlPanelWindow::closeEvent(QCloseEvent* event) {
+  OnClosed();
   QWidget::closeEvent(event);
 }
 
-void TFreehand_control::FormShow() {
+void ControlPanelWindow::OnShown() {
   source_ = host_.Document().Source();
   image2_->SetPicture(source_);
   const int w = source_.Width(), h = source_.Height();
@@ -178,70 +179,70 @@ void TFreehand_control::FormShow() {
       image2_->resize(image2_->width(), ScaledRound(h, image2_->width(), w));
   }
   state_.controlPanelOpen = true;
-  panel1_->move(panel1_->x(), image2_->height() + 20);
+  toolPanel_->move(toolPanel_->x(), image2_->height() + 20);
   thin_->setEnabled(host_.LineArt());
   thick_->setEnabled(host_.LineArt());
   picking_ = false;
 }
 
-void TFreehand_control::FormClose() {
+void ControlPanelWindow::OnClosed() {
   host_.SetMainWindowEnabled(true);
   state_.controlPanelOpen = false;
   picking_ = false;
   image2_->resize(kViewWidth, kViewHeight);
-  source_ = TBitmap32();
+  source_ = Bitmap32();
   image2_->SetPicture(source_);
   workArea_.close();
 }
 
 // --- Buttons -----------------------------------------------------------------------------------
 
-void TFreehand_control::Button1Click() {
+void ControlPanelWindow::OnOk() {
   host_.SetMainWindowEnabled(true);
   host_.SetWorkingPicture(workArea_.Picture(), true);
   host_.SetStatusText("Color up");
   close();
 }
 
-void TFreehand_control::Button2Click() {
+void ControlPanelWindow::OnCancel() {
   close();
 }
 
-void TFreehand_control::Button8Click() {
+void ControlPanelWindow::OnThin() {
   workArea_.ThinPicture();
 }
 
-void TFreehand_control::Button4Click() {
+void ControlPanelWindow::OnThick() {
   workArea_.ThickPicture();
 }
 
-void TFreehand_control::ChooseTool(int tool, int penSize) {
+void ControlPanelWindow::ChooseTool(int tool, int penSize) {
   state_.tool = tool;
   image2_->setCursor(tool == PaintingState::kEyedropper ? EyedropCursor() : QCursor());
-  workArea_.setcursorimage2();
-  if (penSize > 0) trackBar1_->setValue(penSize);
+  workArea_.UpdateToolCursor();
+  if (penSize > 0) penSizeSlider_->setValue(penSize);
 }
 
-void TFreehand_control::TrackBar1Change(int position) {
+void ControlPanelWindow::OnPenSizeChanged(int position) {
   state_.penSize = position;
-  label1_->setText(QString::number(position));
+  penSizeLabel_->setText(QString::number(position));
   workArea_.PenSizeChanged();
 }
 
-void TFreehand_control::ColorPanelClick() {
+void ControlPanelWindow::ChooseBrushColor() {
   const std::optional<std::uint32_t> color =
       host_.Platform().ChooseColor(ColorRefFromPixel(state_.brushColor));
   if (color) SetBrushColor(PixelFromColorRef(*color));
 }
 
-void TFreehand_control::SetBrushColor(Pixel color) {
+void ControlPanelWindow::SetBrushColor(Pixel color) {
   state_.SetBrushColor(color);
   colorPanel_->setStyleSheet(ColorStyle(state_.brushColor));
 }
 
 // --- The eyedropper ----------------------------------------------------------------------------
 
-bool TFreehand_control::eventFilter(QObject* watched, QEvent* event) {
+bool ControlPanelWindow::eventFilter(QObject* watched, QEvent* event) {
   if (watched != image2_ || state_.tool != PaintingState::kEyedropper)
     return QWidget::eventFilter(watched, event);
   const auto at = [event] {
@@ -264,7 +265,7 @@ bool TFreehand_control::eventFilter(QObject* watched, QEvent* event) {
   }
 }
 
-void TFreehand_control::Pick(QPoint at) {
+void ControlPanelWindow::Pick(QPoint at) {
   const int w = source_.Width(), h = source_.Height();
   if (w == 0 || h == 0 || image2_->width() <= 0 || image2_->height() <= 0) return;
   // A point that rounds past the photo's last column or row (a photo less than half the view's

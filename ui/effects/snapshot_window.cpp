@@ -1,4 +1,4 @@
-#include "effects/surface/snapshot_window.h"
+#include "ui/effects/snapshot_window.h"
 
 #include <exception>
 
@@ -15,17 +15,17 @@ constexpr const char* kForCurrent = "for-current";
 SnapshotWindow::SnapshotWindow(const EffectSpec& spec, ToolHost& host, QWidget* parent)
     : ToolWindow(spec, host, parent) {}
 
-void SnapshotWindow::FormShow() {
-  ToolWindow::FormShow();
+void SnapshotWindow::OnShown() {
+  ToolWindow::OnShown();
   snapshot_ = Host().Document().Working();
 }
 
-void SnapshotWindow::FormClose() {
-  ToolWindow::FormClose();
-  snapshot_ = TBitmap32();
+void SnapshotWindow::OnClosed() {
+  ToolWindow::OnClosed();
+  snapshot_ = Bitmap32();
 }
 
-void SnapshotWindow::ApplyClick() {
+void SnapshotWindow::ApplyShown() {
   if (!Spec().routine) return;
   EffectParams settings = Spec().Defaults();
   settings.Merge(Params());
@@ -35,7 +35,7 @@ void SnapshotWindow::ApplyClick() {
   }
   // The document's working picture may have changed since the window was shown; the copy
   // taken then is what this effect is laid over.
-  TBitmap32 result;
+  Bitmap32 result;
   try {
     result = Spec().routine({Host().Document().Source(), snapshot_, settings});
   } catch (const std::exception& e) {

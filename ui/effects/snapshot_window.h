@@ -15,22 +15,22 @@ class SnapshotWindow : public ToolWindow {
   // The effect's parameters include the "for-current" switch.
   SnapshotWindow(const EffectSpec& spec, ToolHost& host, QWidget* parent);
 
-  const TBitmap32& Snapshot() const { return snapshot_; }
+  const Bitmap32& Snapshot() const { return snapshot_; }
 
  public slots:
-  void ApplyClick() override;
+  void ApplyShown() override;
 
  protected:
-  void FormShow() override;
-  void FormClose() override;
+  void OnShown() override;
+  void OnClosed() override;
   void BeforeBatch() override;
   void AfterBatch(const BatchResult& result) override;
 
  private:
-  TBitmap32 snapshot_;
+  Bitmap32 snapshot_;
 };
 
-class TStria : public SnapshotWindow {
+class StriaWindow : public SnapshotWindow {
   Q_OBJECT
 
  public:

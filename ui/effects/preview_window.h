@@ -16,46 +16,46 @@ class PreviewWindow : public ToolWindow {
  public:
   PreviewWindow(const EffectSpec& spec, ToolHost& host, QWidget* parent);
 
-  const TBitmap32& Base() const { return base_; }
-  const TBitmap32& Preview() const { return preview_; }
+  const Bitmap32& Base() const { return base_; }
+  const Bitmap32& Preview() const { return preview_; }
 
  public slots:
-  void ApplyClick() override;
-  void Image1Click();
+  void ApplyShown() override;
+  void ShowBase();
 
  protected:
-  void FormShow() override;
+  void OnShown() override;
   void ControlChanged(const ParamSpec& param) override;
   // The swatches' own way back to "nothing chosen".
   virtual void ClearSwatches() = 0;
-  void SetPreview(TBitmap32 preview);
+  void SetPreview(Bitmap32 preview);
 
  private:
   // Base and preview become a copy of the source, or of the working picture for "For current".
   void LoadBase();
 
-  TBitmap32 base_;
-  TBitmap32 preview_;
+  Bitmap32 base_;
+  Bitmap32 preview_;
   PictureView* image1_ = nullptr;
   PictureView* image2_ = nullptr;
 };
 
-class TColor_Filter : public PreviewWindow {
+class ColorFilterWindow : public PreviewWindow {
   Q_OBJECT
 
  public:
-  TColor_Filter(const EffectSpec& spec, ToolHost& host, QWidget* parent);
+  ColorFilterWindow(const EffectSpec& spec, ToolHost& host, QWidget* parent);
 
  protected:
   void ControlChanged(const ParamSpec& param) override;
   void ClearSwatches() override;
 };
 
-class TColor_variety : public PreviewWindow {
+class ColorVarietyWindow : public PreviewWindow {
   Q_OBJECT
 
  public:
-  TColor_variety(const EffectSpec& spec, ToolHost& host, QWidget* parent);
+  ColorVarietyWindow(const EffectSpec& spec, ToolHost& host, QWidget* parent);
 
  protected:
   void ControlChanged(const ParamSpec& param) override;

@@ -11,18 +11,18 @@ namespace quillane {
 
 class PlatformServices;
 
-class TBatchConvertOk : public QDialog {
+class BatchDoneDialog : public QDialog {
   Q_OBJECT
 
  public:
   // outputFolder gives the folder "Go Output Folder" hands to the file manager, read when the
   // button is pressed.
-  TBatchConvertOk(PlatformServices& platform, std::function<QString()> outputFolder,
+  BatchDoneDialog(PlatformServices& platform, std::function<QString()> outputFolder,
                   QWidget* parent = nullptr);
 
  public slots:
-  void SpeedButton1Click();  // Close
-  void SpeedButton2Click();  // Go Output Folder
+  void OnClose();
+  void OnOpenOutputFolder();  // "Go Output Folder"
 
  private:
   PlatformServices& platform_;

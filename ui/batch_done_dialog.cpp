@@ -1,4 +1,4 @@
-#include "batch/batch_convert_ok.h"
+#include "ui/batch_done_dialog.h"
 
 #include <QHBoxLayout>
 #include <QLabel>
@@ -10,7 +10,7 @@
 
 namespace quillane {
 
-TBatchConvertOk::TBatchConvertOk(PlatformServices& platform, std::function<QString()> outputFolder,
+BatchDoneDialog::BatchDoneDialog(PlatformServices& platform, std::function<QString()> outputFolder,
                                  QWidget* parent)
     // Above its parent, the main window, but not above every other program.
     : QDialog(parent, Qt::Dialog | Qt::CustomizeWindowHint | Qt::WindowTitleHint |
@@ -41,19 +41,19 @@ TBatchConvertOk::TBatchConvertOk(PlatformServices& platform, std::function<QStri
     return button;
   };
   connect(addButton("SpeedButton1", "Close"), &QToolButton::clicked, this,
-          &TBatchConvertOk::SpeedButton1Click);
+          &BatchDoneDialog::OnClose);
   connect(addButton("SpeedButton2", "Go Output Folder"), &QToolButton::clicked, this,
-          &TBatchConvertOk::SpeedButton2Click);
+          &BatchDoneDialog::OnOpenOutputFolder);
   layout->addLayout(row);
 
   setFixedSize(sizeHint().expandedTo(QSize(260, 100)));
 }
 
-void TBatchConvertOk::SpeedButton1Click() {
+void BatchDoneDialog::OnClose() {
   close();
 }
 
-void TBatchConvertOk::SpeedButton2Click() {
+void BatchDoneDialog::OnOpenOutputFolder() {
   const QString folder = outputFolder_ ? outputFolder_() : QString();
   close();
   if (!platform_.OpenFolder(folder))

@@ -6,11 +6,11 @@
 
 namespace quillane {
 
-class TColor_Panel : public ToolWindow {
+class ColorPanelWindow : public ToolWindow {
   Q_OBJECT
 
  public:
-  TColor_Panel(const EffectSpec& spec, ToolHost& host, QWidget* parent);
+  ColorPanelWindow(const EffectSpec& spec, ToolHost& host, QWidget* parent);
 
  protected:
   void ControlChanged(const ParamSpec& param) override;

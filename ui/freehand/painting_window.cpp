@@ -1,7 +1,7 @@
-#include "freehand/painting_window.h"
+#include "ui/freehand/painting_window.h"
 
-#include "freehand/control_panel_window.h"
-#include "freehand/work_area_window.h"
+#include "ui/freehand/control_panel_window.h"
+#include "ui/freehand/work_area_window.h"
 #include "ui/platform.h"
 #include "ui/tool_host.h"
 
@@ -10,8 +10,8 @@ namespace quillane {
 FreehandPainting::FreehandPainting(ToolHost& host, QObject* parent)
     : QObject(parent),
       host_(host),
-      workArea_(std::make_unique<TFreehand>(state_, host)),
-      controlPanel_(std::make_unique<TFreehand_control>(state_, host, *workArea_)) {
+      workArea_(std::make_unique<WorkAreaWindow>(state_, host)),
+      controlPanel_(std::make_unique<ControlPanelWindow>(state_, host, *workArea_)) {
   setObjectName("FreehandPainting");
   workArea_->SetControlPanel(controlPanel_.get());
 }

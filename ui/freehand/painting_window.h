@@ -9,8 +9,8 @@
 
 namespace quillane {
 
-class TFreehand;
-class TFreehand_control;
+class WorkAreaWindow;
+class ControlPanelWindow;
 class ToolHost;
 
 class FreehandPainting : public QObject {
@@ -22,8 +22,8 @@ class FreehandPainting : public QObject {
   FreehandPainting(ToolHost& host, QObject* parent);
   ~FreehandPainting() override;
 
-  TFreehand& WorkArea() { return *workArea_; }
-  TFreehand_control& ControlPanel() { return *controlPanel_; }
+  WorkAreaWindow& WorkArea() { return *workArea_; }
+  ControlPanelWindow& ControlPanel() { return *controlPanel_; }
   const PaintingState& State() const { return state_; }
 
  public slots:
@@ -34,8 +34,8 @@ class FreehandPainting : public QObject {
  private:
   ToolHost& host_;
   PaintingState state_;
-  std::unique_ptr<TFreehand> workArea_;
-  std::unique_ptr<TFreehand_control> controlPanel_;
+  std::unique_ptr<WorkAreaWindow> workArea_;
+  std::unique_ptr<ControlPanelWindow> controlPanel_;
 };
 
 }  // namespace quillane

@@ -7,16 +7,16 @@
 
 namespace quillane {
 
-class TBack_and_White_Sketch : public ToolWindow {
+class BwSketchWindow : public ToolWindow {
   Q_OBJECT
 
  public:
-  TBack_and_White_Sketch(const EffectSpec& spec, ToolHost& host, QWidget* parent);
+  BwSketchWindow(const EffectSpec& spec, ToolHost& host, QWidget* parent);
 
   PencilToneMode ToneMode() const;
 
  protected:
-  void FormShow() override;
+  void OnShown() override;
   void ControlChanged(const ParamSpec& param) override;
 
  private:

@@ -1,7 +1,7 @@
 // The work area: a private copy of the working picture at full size in a scrolling window,
 // taking the strokes of the brush, rubber, pen and beeline. Strokes write straight into the
 // copy and repaint only what they changed; each keeps the pixels it overwrote so Ctrl+Z can
-// take it back. The control panel (TFreehand_control) opens and closes with it.
+// take it back. The control panel (ControlPanelWindow) opens and closes with it.
 #pragma once
 
 #include <QPoint>
@@ -18,7 +18,7 @@ class QScrollArea;
 namespace quillane {
 
 class ToolHost;
-class TFreehand;
+class WorkAreaWindow;
 
 // Image1: shows the picture unscaled, with the brush outline and the beeline's rubber band
 // drawn over it (never into it).
@@ -26,7 +26,7 @@ class FreehandCanvas : public QWidget {
   Q_OBJECT
 
  public:
-  FreehandCanvas(TFreehand& area, QWidget* parent);
+  FreehandCanvas(WorkAreaWindow& area, QWidget* parent);
 
  protected:
   void paintEvent(QPaintEvent* event) override;
@@ -36,19 +36,19 @@ class FreehandCanvas : public QWidget {
   void leaveEvent(QEvent* event) override;
 
  private:
-  TFreehand& area_;
+  WorkAreaWindow& area_;
 };
 
-class TFreehand : public QWidget {
+class WorkAreaWindow : public QWidget {
   Q_OBJECT
 
  public:
-  TFreehand(PaintingState& state, ToolHost& host);
+  WorkAreaWindow(PaintingState& state, ToolHost& host);
 
   // The companion it closes with.
   void SetControlPanel(QWidget* panel) { controlPanel_ = panel; }
 
-  const TBitmap32& Picture() const { return picture_; }
+  const Bitmap32& Picture() const { return picture_; }
   FreehandCanvas* Canvas() const { return image1_; }
   QScrollArea* ScrollBox() const { return scrollBox_; }
   const StrokeHistory& Strokes() const { return strokes_; }
@@ -59,14 +59,14 @@ class TFreehand : public QWidget {
   // Ctrl+Z: the last stroke (or Thin, Thick) taken back.
   void UndoStroke();
   // The pointers for the current tool; the brush outline follows a new pen size at once.
-  void setcursorimage2();
+  void UpdateToolCursor();
   void PenSizeChanged();
 
   // The mouse on the picture, in picture pixels.
-  void Image1MouseDown(Qt::MouseButton button, QPoint at);
-  void Image1MouseMove(Qt::MouseButtons buttons, QPoint at);
-  void Image1MouseUp(Qt::MouseButton button, QPoint at);
-  void Image1MouseLeave();
+  void PictureMouseDown(Qt::MouseButton button, QPoint at);
+  void PictureMouseMove(Qt::MouseButtons buttons, QPoint at);
+  void PictureMouseUp(Qt::MouseButton button, QPoint at);
+  void PictureMouseLeave();
 
   // What the canvas draws over the picture.
   bool OutlineShown() const { return outlineShown_; }
@@ -81,12 +81,12 @@ class TFreehand : public QWidget {
   void closeEvent(QCloseEvent* event) override;
 
  private:
-  void FormShow();
-  void FormClose();
+  void OnShown();
+  void OnClosed();
   void Dab(QPoint at);
   void LineTo(QPoint to, bool withEnd = false);
   void Repaint(const PaintRect& area);
-  void WholePictureStep(void (*operation)(TBitmap32&));
+  void WholePictureStep(void (*operation)(Bitmap32&));
   void RemoveOutline();
   void ShowOutline(QPoint at);
   void RemoveBand();
@@ -98,7 +98,7 @@ class TFreehand : public QWidget {
   QScrollArea* scrollBox_ = nullptr;
   FreehandCanvas* image1_ = nullptr;
 
-  TBitmap32 picture_;
+  Bitmap32 picture_;
   StrokeHistory strokes_;
   int strokeTool_ = PaintingState::kNoTool;  // the tool of the stroke under way, or none
   LinePen pen_;

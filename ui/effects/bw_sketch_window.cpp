@@ -1,4 +1,4 @@
-#include "effects/mono/bw_sketch_window.h"
+#include "ui/effects/bw_sketch_window.h"
 
 #include <QLabel>
 #include <QPainter>
@@ -32,8 +32,7 @@ void SetTextColor(QLabel* label, const QColor& color) {
 
 }  // namespace
 
-TBack_and_White_Sketch::TBack_and_White_Sketch(const EffectSpec& spec, ToolHost& host,
-                                               QWidget* parent)
+BwSketchWindow::BwSketchWindow(const EffectSpec& spec, ToolHost& host, QWidget* parent)
     : ToolWindow(spec, host, parent) {
   auto* separator = new DashedSeparator(this);
   separator->setObjectName("Label5");
@@ -41,22 +40,22 @@ TBack_and_White_Sketch::TBack_and_White_Sketch(const EffectSpec& spec, ToolHost&
   MarkToneMode(PencilToneMode::Contrast);
 }
 
-PencilToneMode TBack_and_White_Sketch::ToneMode() const {
+PencilToneMode BwSketchWindow::ToneMode() const {
   return static_cast<PencilToneMode>(Params().GetInt("tone-mode"));
 }
 
-void TBack_and_White_Sketch::FormShow() {
+void BwSketchWindow::OnShown() {
   // The shared steps put the tone mode back to Contrast; the labels follow it.
-  ToolWindow::FormShow();
+  ToolWindow::OnShown();
   MarkToneMode(ToneMode());
   Host().SetLineArt(false);
 }
 
-void TBack_and_White_Sketch::ControlChanged(const ParamSpec&) {
+void BwSketchWindow::ControlChanged(const ParamSpec&) {
   MarkToneMode(ToneMode());
 }
 
-void TBack_and_White_Sketch::MarkToneMode(PencilToneMode mode) {
+void BwSketchWindow::MarkToneMode(PencilToneMode mode) {
   const QColor text = palette().color(QPalette::WindowText);
   const bool contrast = mode == PencilToneMode::Contrast;
   SetTextColor(FindLabel("Label1"), contrast ? text : kUnchosenGray);

@@ -1,4 +1,4 @@
-#include "effects/adjust/color_panel_window.h"
+#include "ui/effects/color_panel_window.h"
 
 #include <QButtonGroup>
 #include <QGridLayout>
@@ -25,7 +25,7 @@ const char* StatusFor(PanelLayout layout) {
 
 }  // namespace
 
-TColor_Panel::TColor_Panel(const EffectSpec& spec, ToolHost& host, QWidget* parent)
+ColorPanelWindow::ColorPanelWindow(const EffectSpec& spec, ToolHost& host, QWidget* parent)
     : ToolWindow(spec, host, parent) {
   // Left column: Panel 2 x 2, Pane 2 x 2, Catercorner (4); right: the 3 x 3 ones and (16).
   static const char* const kColumns[2][3] = {{"RadioButton1", "RadioButton2", "RadioButton3"},
@@ -48,7 +48,7 @@ TColor_Panel::TColor_Panel(const EffectSpec& spec, ToolHost& host, QWidget* pare
   SetWindowHeights(std::max(height(), sizeHint().height()), 0);
 }
 
-void TColor_Panel::ControlChanged(const ParamSpec&) {
+void ColorPanelWindow::ControlChanged(const ParamSpec&) {
   if (!Apply(true)) return;
   Host().SetStatusText(StatusFor(static_cast<PanelLayout>(Params().GetInt("layout"))));
 }

@@ -18,27 +18,27 @@ class QToolButton;
 namespace quillane {
 
 class PictureView;
-class TFreehand;
+class WorkAreaWindow;
 class ToolHost;
 
-class TFreehand_control : public QWidget {
+class ControlPanelWindow : public QWidget {
   Q_OBJECT
 
  public:
   static constexpr int kViewWidth = 217;
   static constexpr int kViewHeight = 193;
 
-  TFreehand_control(PaintingState& state, ToolHost& host, TFreehand& workArea);
+  ControlPanelWindow(PaintingState& state, ToolHost& host, WorkAreaWindow& workArea);
 
   PictureView* Image2() const { return image2_; }
 
  public slots:
-  void Button1Click();  // OK
-  void Button2Click();  // Cancel
-  void Button8Click();  // Thin
-  void Button4Click();  // Thick
-  void ColorPanelClick();
-  void TrackBar1Change(int position);
+  void OnOk();
+  void OnCancel();
+  void OnThin();
+  void OnThick();
+  void ChooseBrushColor();
+  void OnPenSizeChanged(int position);
 
  protected:
   void showEvent(QShowEvent* event) override;
@@ -46,24 +46,24 @@ class TFreehand_control : public QWidget {
   bool eventFilter(QObject* watched, QEvent* event) override;
 
  private:
-  void FormShow();
-  void FormClose();
+  void OnShown();
+  void OnClosed();
   void ChooseTool(int tool, int penSize);
   void SetBrushColor(Pixel color);
   void Pick(QPoint at);
 
   PaintingState& state_;
   ToolHost& host_;
-  TFreehand& workArea_;
-  TBitmap32 source_;  // the photo as shown, for the eyedropper
+  WorkAreaWindow& workArea_;
+  Bitmap32 source_;  // the photo as shown, for the eyedropper
   bool picking_ = false;
 
   PictureView* image2_ = nullptr;
-  QFrame* panel1_ = nullptr;
+  QFrame* toolPanel_ = nullptr;
   QButtonGroup* tools_ = nullptr;
   QWidget* colorPanel_ = nullptr;
-  QSlider* trackBar1_ = nullptr;
-  QLabel* label1_ = nullptr;
+  QSlider* penSizeSlider_ = nullptr;
+  QLabel* penSizeLabel_ = nullptr;
   QPushButton* thin_ = nullptr;
   QPushButton* thick_ = nullptr;
 };
