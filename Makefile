@@ -1,5 +1,6 @@
 # Two commands for a newcomer: `make run` and `make test`. Both install what is missing from
-# Debian's packages first (as root, or through sudo), then configure and build with CMake.
+# Debian's packages first (`make deps`, as root or through sudo), then configure and build with
+# CMake. `make build` only builds: it never calls the package manager.
 
 SHELL := /bin/bash
 BUILD ?= build
@@ -31,11 +32,12 @@ deps:
 	  DEBIAN_FRONTEND=noninteractive $$sudo apt-get install -y -qq $$missing; \
 	fi
 
-build: deps
+build:
 	cmake -S . -B $(BUILD) -DCMAKE_BUILD_TYPE=Release
 	cmake --build $(BUILD) -j $(JOBS)
 
-run: build
+run: deps
+	@$(MAKE) --no-print-directory build
 	@if [ -n "$$DISPLAY$$WAYLAND_DISPLAY" ]; then \
 	  exec $(BUILD)/app/quillane; \
 	else \
@@ -47,12 +49,13 @@ run: build
 install: build
 	DESTDIR="$(DESTDIR)" cmake --install $(BUILD) --prefix $(PREFIX)
 
-test: build
+test: deps
+	$(MAKE) build
 	cd $(BUILD) && ctest --output-on-failure -j $(JOBS)
 	$(MAKE) test-asan
 
 # The same suite once more with AddressSanitizer and UndefinedBehaviorSanitizer.
-test-asan: deps
+test-asan:
 	cmake -S . -B $(ASAN_BUILD) -DCMAKE_BUILD_TYPE=Debug -DQUILLANE_SANITIZE=ON -DQUILLANE_BENCH=OFF
 	cmake --build $(ASAN_BUILD) -j $(JOBS)
 	cd $(ASAN_BUILD) && \
@@ -68,7 +71,8 @@ fuzz: deps
 # Every effect beside a memcpy and the comparable OpenCV operations, in one table. OpenCV is
 # used by this benchmark only, so only this target installs it.
 bench:
-	$(MAKE) build PACKAGES="$(PACKAGES) libopencv-dev"
+	$(MAKE) deps PACKAGES="$(PACKAGES) libopencv-dev"
+	$(MAKE) build
 	$(BUILD)/bench/side_by_side_bench
 
 # Every benchmark program, the table's included.
