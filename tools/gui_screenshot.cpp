@@ -25,7 +25,7 @@ int main(int argc, char* argv[]) {
   const int tool = argc > 2 ? std::atoi(argv[2]) : 1;
   window.OpenTool(tool);
   if (quillane::ToolWindow* open = window.ToolWindowAt(tool)) {
-    open->OnOpen();
+    open->ToggleBatchPanel();
     open->ApplyShown();
     if (argc > 3 && QString(argv[3]) == "colorup") open->OpenColorUp();
   }
