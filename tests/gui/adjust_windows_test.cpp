@@ -19,31 +19,23 @@
 namespace quillane {
 namespace {
 
-constexpr int kHsl = 11;
-constexpr int kVariety = 12;
-constexpr int kPanel = 13;
-constexpr int kTexture = 14;
-constexpr int kEmboss = 15;
-constexpr int kFilter = 16;
-constexpr int kStria = 17;
-
 using AdjustWindows = WindowTest;
 
 // The settings that go back to their defaults on every showing share one path; HSL shows it.
 TEST_F(AdjustWindows, HslAdjustShowsSignedNumbersAndStartsNeutralOnEveryShowing) {
-  Open(kHsl);
+  Open(kHslAdjust);
   for (auto [position, shown] : {std::pair{0, "-100"}, {270, "50"}}) {
-    Slide(kHsl, "TrackBar1", position);
-    EXPECT_EQ(Text(kHsl, "Label4"), shown) << position;
+    Slide(kHslAdjust, "TrackBar1", position);
+    EXPECT_EQ(Text(kHslAdjust, "Label4"), shown) << position;
   }
-  Slide(kHsl, "TrackBar2", 0);
-  Slide(kHsl, "TrackBar3", 130);
-  Press(kHsl, "Button1");
+  Slide(kHslAdjust, "TrackBar2", 0);
+  Slide(kHslAdjust, "TrackBar3", 130);
+  Press(kHslAdjust, "Button1");
   EXPECT_EQ(Working(), HslAdjust(Source(), 270, 0, 130));
-  Tool(kHsl).close();
-  Open(kHsl);
-  EXPECT_EQ(Child<QSlider>(kHsl, "TrackBar1")->value(), 180);
-  EXPECT_EQ(Text(kHsl, "Label9"), "0");
+  Tool(kHslAdjust).close();
+  Open(kHslAdjust);
+  EXPECT_EQ(Child<QSlider>(kHslAdjust, "TrackBar1")->value(), 180);
+  EXPECT_EQ(Text(kHslAdjust, "Label9"), "0");
 }
 
 TEST_F(AdjustWindows, StriaTakesItsColourFromTheDialogAndStartsFromTheSnapshot) {
@@ -94,27 +86,27 @@ TEST_F(AdjustWindows, SnapshotBatchesWorkOnEachSourceAndRefreshTheSnapshot) {
 }
 
 TEST_F(AdjustWindows, ColorPanelAppliesALayoutWhenItBecomesSelected) {
-  Open(kPanel);
+  Open(kColorPanel);
   const std::tuple<const char*, PanelLayout, const char*> cases[] = {
       {"RadioButton5", PanelLayout::Pane3x3, "Color Pane"},
       {"RadioButton6", PanelLayout::Catercorner16, "Color Catercorner"},
       {"RadioButton4", PanelLayout::Panel3x3, "Color Panels"}};
   int steps = 0;
   for (const auto& [button, layout, status] : cases) {
-    Press(kPanel, button);
+    Press(kColorPanel, button);
     EXPECT_EQ(Working(), ColorPanel(Source(), layout)) << button;
     EXPECT_EQ(Main().StatusText(), status);
     EXPECT_EQ(Steps(), ++steps);
   }
-  Press(kPanel, "RadioButton4");  // already selected: nothing happens
+  Press(kColorPanel, "RadioButton4");  // already selected: nothing happens
   EXPECT_EQ(Steps(), steps);
 }
 
 // Panel 3 x 3 on a picture under 3 pixels leaves nothing to show; what follows must cope.
 TEST_F(AdjustWindows, AnEmptyWorkingPictureIsRefusedWhereNothingCanBeDone) {
   Main().ShowNewPicture(TestPicture(2, 5), true);
-  Open(kPanel);
-  Press(kPanel, "RadioButton4");
+  Open(kColorPanel);
+  Press(kColorPanel, "RadioButton4");
   ASSERT_TRUE(Working().Empty());
   EXPECT_EQ(Main().StatusText(), "Color Panels");
 
@@ -139,33 +131,33 @@ TEST_F(AdjustWindows, AnEmptyWorkingPictureIsRefusedWhereNothingCanBeDone) {
 }
 
 TEST_F(AdjustWindows, ColorFilterPreviewsEachSwatchAndOkAppliesThePreview) {
-  auto& window = dynamic_cast<PreviewWindow&>(Tool(kFilter));
-  Open(kFilter);
-  Press(kFilter, "Panel6");
+  auto& window = dynamic_cast<PreviewWindow&>(Tool(kColorFilter));
+  Open(kColorFilter);
+  Press(kColorFilter, "Panel6");
   EXPECT_EQ(window.Preview(), ColorFilter(Source(), ColorFilterKind::Yellow));
-  EXPECT_EQ(Child<PictureView>(kFilter, "Image2")->Image(), OpaqueImage(window.Preview()));
-  ClickOn(Child(kFilter, "Image1"));  // Reset
+  EXPECT_EQ(Child<PictureView>(kColorFilter, "Image2")->Image(), OpaqueImage(window.Preview()));
+  ClickOn(Child(kColorFilter, "Image1"));  // Reset
   EXPECT_EQ(window.Preview(), Source());
-  Press(kFilter, "Panel6");
-  Press(kFilter, "Panel4");  // replaces, does not add
+  Press(kColorFilter, "Panel6");
+  Press(kColorFilter, "Panel4");  // replaces, does not add
   EXPECT_EQ(Working(), Source());
-  Press(kFilter, "Button1");
+  Press(kColorFilter, "Button1");
   EXPECT_EQ(Working(), ColorFilter(Source(), ColorFilterKind::Green));
-  EXPECT_FALSE(Tool(kFilter).isVisible());
+  EXPECT_FALSE(Tool(kColorFilter).isVisible());
 }
 
 TEST_F(AdjustWindows, ColorVarietyAccumulatesClicksAndForCurrentStartsAgain) {
   Main().SetWorkingPicture(TestPicture(10, 30), true);
-  auto& window = dynamic_cast<PreviewWindow&>(Tool(kVariety));
-  Open(kVariety);
-  for (const char* swatch : {"Panel6", "Panel6", "Panel3"}) Press(kVariety, swatch);
+  auto& window = dynamic_cast<PreviewWindow&>(Tool(kColorVariety));
+  Open(kColorVariety);
+  for (const char* swatch : {"Panel6", "Panel6", "Panel3"}) Press(kColorVariety, swatch);
   EXPECT_EQ(window.Preview(), VarietyClicks(Source(), {4, 4, 1}));
-  Child<QCheckBox>(kVariety, "CheckBox1")->setChecked(true);
+  Child<QCheckBox>(kColorVariety, "CheckBox1")->setChecked(true);
   EXPECT_EQ(window.Preview(), TestPicture(10, 30));
-  Press(kVariety, "Panel5");
-  Press(kVariety, "Button1");
+  Press(kColorVariety, "Panel5");
+  Press(kColorVariety, "Button1");
   EXPECT_EQ(Working(), variety(TestPicture(10, 30), 3));
-  Open(kVariety);
+  Open(kColorVariety);
   EXPECT_EQ(window.Preview(), Source());
 }
 

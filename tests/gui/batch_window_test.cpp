@@ -30,7 +30,7 @@ class BatchWindow : public WindowTest {
     SaveJpeg(TestPicture(25, 25), LocalPath("in/c.jpeg"));
     WriteBytes(LocalPath("in/notes.txt"), "not a picture");
     MenuAction("Pencilsketch1")->trigger();
-    Press(1, "SpeedButton1");
+    Press(kPencilSketch, "SpeedButton1");
   }
 
   QListWidget* ListView1() { return MainChild<QListWidget>("ListView1"); }
@@ -38,12 +38,12 @@ class BatchWindow : public WindowTest {
 
   void BrowseInput(const QString& folder) {
     platform_.folderAnswers.push_back(folder);
-    Press(1, "SpeedButton2");
+    Press(kPencilSketch, "SpeedButton2");
   }
   void Convert(const QString& input, const QString& output) {
-    Child<QLineEdit>(1, "Edit1")->setText(input);
-    Child<QLineEdit>(1, "Edit2")->setText(output);
-    Press(1, "SpeedButton4");
+    Child<QLineEdit>(kPencilSketch, "Edit1")->setText(input);
+    Child<QLineEdit>(kPencilSketch, "Edit2")->setText(output);
+    Press(kPencilSketch, "SpeedButton4");
   }
 };
 
@@ -70,7 +70,7 @@ TEST_F(BatchWindow, BrowseListsThePicturesOfTheChosenFolder) {
 
 TEST_F(BatchWindow, ConvertWritesOnePencilSketchPerPicture) {
   Main().SetLineArt(true);
-  Slide(1, "TrackBar1", 70);
+  Slide(kPencilSketch, "TrackBar1", 70);
   BrowseInput(Path("in"));
   QSignalSpy progress(Main().statusBar(), &QStatusBar::messageChanged);
 
@@ -86,7 +86,7 @@ TEST_F(BatchWindow, ConvertWritesOnePencilSketchPerPicture) {
   EXPECT_EQ(Main().findChild<PictureView*>("Image1")->Image(),
             OpaqueImage(PencilSketch(Input("b.bmp"), PencilToneMode::Contrast, 70, 128)));
   EXPECT_FALSE(Main().LineArt());
-  EXPECT_TRUE(Child<QToolButton>(1, "Button2")->isEnabled());
+  EXPECT_TRUE(Child<QToolButton>(kPencilSketch, "Button2")->isEnabled());
   EXPECT_EQ(Main().OutputFolder(), Path("out/deeper/still"));
 
   // Progress while it ran, cleared after.

@@ -14,15 +14,15 @@ using BwWindows = WindowTest;
 // radio button, a slider and a check box reach the drawing.
 TEST_F(BwWindows, OkDrawsWithTheSettingsShown) {
   const Bitmap32 source = Source();
-  Open(3);
-  Press(3, "RadioButton4");
-  Slide(3, "TrackBar2", 5);
-  EXPECT_EQ(Text(3, "Label3"), "5");  // the scope as it is, not a percentage
-  Press(3, "Button1");
+  Open(kVuzorar);
+  Press(kVuzorar, "RadioButton4");
+  Slide(kVuzorar, "TrackBar2", 5);
+  EXPECT_EQ(Text(kVuzorar, "Label3"), "5");  // the scope as it is, not a percentage
+  Press(kVuzorar, "Button1");
   EXPECT_EQ(Working(), Vuzorar(source, 128, 5, HatchDirection::Horizontal));
-  Open(4);
-  Press(4, "CheckBox1");
-  Press(4, "Button1");
+  Open(kPenAndInk);
+  Press(kPenAndInk, "CheckBox1");
+  Press(kPenAndInk, "Button1");
   EXPECT_EQ(Working(), PenAndInk(source, 128, true));
 }
 

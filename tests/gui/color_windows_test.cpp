@@ -60,7 +60,7 @@ TEST_F(ColorWindows, KernelWindowsConvertTheCellsAsTypedAndRefuseWhatIsNoInteger
   Main().SetStatusText("before");
   for (const char* bad : {"abc", "2147483648"}) {
     cell(8, 2)->setText(bad);
-    Press(8, "Button1");
+    Press(kPopArt, "Button1");
     EXPECT_EQ(platform_.errors.back(), QString("'%1' is not a valid integer value").arg(bad));
   }
   EXPECT_EQ(Working(), before);
@@ -68,7 +68,7 @@ TEST_F(ColorWindows, KernelWindowsConvertTheCellsAsTypedAndRefuseWhatIsNoInteger
   EXPECT_EQ(Main().StatusText(), "before");
 
   const EffectSpec& spec = *FindEffect(8);
-  Press(8, "Button3");  // Default
+  Press(kPopArt, "Button3");  // Default
   EXPECT_EQ(cell(8, 2)->text(), QString::number(spec.params[0].defaultList[1]));
   EXPECT_EQ(Working(), Expected(spec, Source(), "kernel", spec.params[0].defaultList, seed));
 }
@@ -76,12 +76,12 @@ TEST_F(ColorWindows, KernelWindowsConvertTheCellsAsTypedAndRefuseWhatIsNoInteger
 TEST_F(ColorWindows, EachBatchWritesItsTagAndRecordsAStepPerPicture) {
   MakeInput({TestPicture(9, 7), TestPicture(12, 5)});
   // A kernel cell that is no integer stops Convert before any picture is loaded.
-  Open(6);
-  Child<QLineEdit>(6, "Edit4")->setText("x");
+  Open(kRealism);
+  Child<QLineEdit>(kRealism, "Edit4")->setText("x");
   EXPECT_TRUE(Convert(6).empty());
   EXPECT_EQ(platform_.errors, std::vector<QString>{"'x' is not a valid integer value"});
   EXPECT_EQ(Source(), TestPicture());
-  Child<QLineEdit>(6, "Edit4")->setText("0");
+  Child<QLineEdit>(kRealism, "Edit4")->setText("0");
 
   for (int tool : {2, 3, 4, 5, 6, 7, 8, 9, 10}) {
     const EffectSpec& spec = Open(tool);

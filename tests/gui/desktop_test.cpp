@@ -66,7 +66,7 @@ TEST_F(Desktop, StandardShortcutsRunTheirCommands) {
 
 TEST_F(Desktop, ADroppedPictureFileOpensAsFileOpenDoes) {
   const QString picture = Picture("dropped.bmp", 7);
-  Main().OpenTool(15);
+  Main().OpenTool(kEmboss);
   auto drop = [&](const QList<QUrl>& urls) {
     QMimeData data;
     data.setUrls(urls);
@@ -126,10 +126,10 @@ void WhileModal(const std::function<void()>& raise, const std::function<void(QDi
 
 TEST_F(Desktop, MessageBoxesBelongToTheWindowThatRaisedThem) {
   QtPlatformServices real;
-  Main().OpenTool(15);
+  Main().OpenTool(kEmboss);
   const std::pair<QWidget*, std::function<void()>> cases[] = {
-      {&Tool(15), [&] { real.ShowMessage("Sorry", "from the tool window"); }},
-      {&Tool(15), [&] { real.ShowError("an error in the tool window"); }},
+      {&Tool(kEmboss), [&] { real.ShowMessage("Sorry", "from the tool window"); }},
+      {&Tool(kEmboss), [&] { real.ShowError("an error in the tool window"); }},
       {&Main(), [&] { real.ShowMessage("Sorry", "from the main window"); }},
   };
   for (const auto& [active, raise] : cases) {

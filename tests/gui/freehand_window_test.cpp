@@ -89,9 +89,9 @@ TEST_F(FreehandWindows, EveryWayOfClosingEnablesTheMainWindowAgainAndOnlyOkWrite
 
 TEST_F(FreehandWindows, ColorUpOfADrawingWindowOpensThePair) {
   MenuAction("Pensketch1")->trigger();
-  ToolChild<QPushButton>(2, "Button1")->click();
-  ToolChild<QToolButton>(2, "Button2")->click();
-  EXPECT_TRUE(Area().isVisible() && Panel().isVisible() && Tool(2).isVisible());
+  ToolChild<QPushButton>(kPenSketch, "Button1")->click();
+  ToolChild<QToolButton>(kPenSketch, "Button2")->click();
+  EXPECT_TRUE(Area().isVisible() && Panel().isVisible() && Tool(kPenSketch).isVisible());
   EXPECT_EQ(Area().Picture(), Main().Document().Working());
   EXPECT_TRUE(Control<QPushButton>("Button8")->isEnabled()) << "pen sketch makes line art";
   Press("Button2");

@@ -20,6 +20,25 @@
 
 namespace quillane {
 
+// The tool windows by their effect, so that no test depends on where an effect stands in the
+// registry's list.
+inline int ToolNumber(const char* effect) {
+  return FindEffectByCliName(effect)->toolNumber;
+}
+inline const int kPencilSketch = ToolNumber("pencil-sketch");
+inline const int kPenSketch = ToolNumber("pen-sketch");
+inline const int kVuzorar = ToolNumber("vuzorar");
+inline const int kPenAndInk = ToolNumber("pen-and-ink");
+inline const int kRealism = ToolNumber("realism");
+inline const int kPopArt = ToolNumber("pop-art");
+inline const int kHslAdjust = ToolNumber("hsl-adjust");
+inline const int kColorVariety = ToolNumber("color-variety");
+inline const int kColorPanel = ToolNumber("color-panel");
+inline const int kTexture = ToolNumber("texture");
+inline const int kEmboss = ToolNumber("emboss");
+inline const int kColorFilter = ToolNumber("color-filter");
+inline const int kStria = ToolNumber("stria");
+
 inline QApplication& Application() {
   static int argc = 1;
   static char name[] = "gui_tests";

@@ -12,9 +12,9 @@ class PencilWindow : public WindowTest {
  protected:
   void SetUp() override {
     WindowTest::SetUp();
-    Open(1);
+    Open(kPencilSketch);
   }
-  BwSketchWindow& Pencil() { return dynamic_cast<BwSketchWindow&>(Tool(1)); }
+  BwSketchWindow& Pencil() { return dynamic_cast<BwSketchWindow&>(Tool(kPencilSketch)); }
   Bitmap32 Sketch(PencilToneMode mode, int contrast, int lighting) {
     return PencilSketch(Source(), mode, contrast, lighting);
   }
@@ -22,34 +22,34 @@ class PencilWindow : public WindowTest {
   // Contrast chosen: Lighting's number in gray.
   void ExpectContrastMarked(bool contrast) {
     EXPECT_EQ(Pencil().ToneMode(), contrast ? PencilToneMode::Contrast : PencilToneMode::Lighting);
-    EXPECT_EQ(
-        Child<QLabel>(1, "Label3")->palette().color(QPalette::WindowText) == QColor(128, 128, 128),
-        contrast);
+    EXPECT_EQ(Child<QLabel>(kPencilSketch, "Label3")->palette().color(QPalette::WindowText) ==
+                  QColor(128, 128, 128),
+              contrast);
   }
 };
 
 // OK's result, from the source each time, is the busy test's, which runs the pencil through it.
 TEST_F(PencilWindow, TheSliderMovedLastChoosesTheToneUntilTheWindowIsShownAgain) {
-  Slide(1, "TrackBar1", 30);
+  Slide(kPencilSketch, "TrackBar1", 30);
   ExpectContrastMarked(true);
-  Slide(1, "TrackBar2", 90);
+  Slide(kPencilSketch, "TrackBar2", 90);
   ExpectContrastMarked(false);
-  Press(1, "Button1");
+  Press(kPencilSketch, "Button1");
   EXPECT_EQ(Working(), Sketch(PencilToneMode::Lighting, 30, 90));
-  Slide(1, "TrackBar1", 60);
+  Slide(kPencilSketch, "TrackBar1", 60);
   ExpectContrastMarked(true);
-  Press(1, "Button1");
+  Press(kPencilSketch, "Button1");
   EXPECT_EQ(Working(), Sketch(PencilToneMode::Contrast, 60, 90));
 
   // Shown again, contrast is chosen; the sliders keep their places.
-  Slide(1, "TrackBar2", 200);
+  Slide(kPencilSketch, "TrackBar2", 200);
   Pencil().close();
   Main().SetLineArt(true);
-  Open(1);
+  Open(kPencilSketch);
   ExpectContrastMarked(true);
   EXPECT_FALSE(Main().LineArt());
-  EXPECT_EQ(Text(1, "Label3"), "78");
-  Press(1, "Button1");
+  EXPECT_EQ(Text(kPencilSketch, "Label3"), "78");
+  Press(kPencilSketch, "Button1");
   EXPECT_EQ(Working(), Sketch(PencilToneMode::Contrast, 60, 200));
 }
 

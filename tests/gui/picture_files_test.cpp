@@ -81,7 +81,7 @@ TEST_F(PictureFiles, CancellingTheOpenDialogChangesNothingButTheClosedToolWindow
   MainChild<QToolButton>("SpeedButton1")->click();  // the dialog answers "cancelled"
   EXPECT_EQ(platform_.openFilters.size(), 1u);
   EXPECT_EQ(State(), before);
-  EXPECT_FALSE(Tool(1).isVisible());
+  EXPECT_FALSE(Tool(kPencilSketch).isVisible());
   EXPECT_EQ(Main().ActiveTool(), 0);
   ExpectNoMessage();
 
@@ -118,7 +118,7 @@ TEST_F(PictureFiles, RefusedFilesAreShownAndKeepTheDocument) {
 
 TEST_F(PictureFiles, SaveWritesTheChosenTypeUnderItsOwnExtension) {
   MenuAction("Pencilsketch1")->trigger();
-  ToolChild<QPushButton>(1, "Button1")->click();
+  ToolChild<QPushButton>(kPencilSketch, "Button1")->click();
   const Bitmap32& working = Main().Document().Working();
   const DocumentState before = State();
 
@@ -144,7 +144,7 @@ TEST_F(PictureFiles, SaveWritesTheChosenTypeUnderItsOwnExtension) {
   ExpectNoMessage();
   EXPECT_EQ(State(), before);
   // Saving leaves the tool window open.
-  EXPECT_TRUE(Tool(1).isVisible());
+  EXPECT_TRUE(Tool(kPencilSketch).isVisible());
   EXPECT_EQ(Entries(), (std::vector<std::string>{"drawing.wmf", "plain.jpg", "reference.jpg",
                                                  "result.bmp", "result.jpg"}));
 

@@ -35,7 +35,7 @@ TEST_F(ToolWindows, EveryMenuEntryOpensItsOwnWindowAlone) {
 // open, closing the open tool closes nothing.
 TEST_F(ToolWindows, TheCloseBoxClearsTheOpenWindow) {
   MenuAction("Emboss1")->trigger();
-  Tool(15).close();
+  Tool(kEmboss).close();
   EXPECT_EQ(Main().ActiveTool(), 0);
   Main().CloseToolWindow();
   EXPECT_EQ(Main().ActiveTool(), 0);
@@ -43,11 +43,11 @@ TEST_F(ToolWindows, TheCloseBoxClearsTheOpenWindow) {
 
 TEST_F(ToolWindows, ChoosingTheOpenWindowAgainShowsItAfresh) {
   MenuAction("Pencilsketch1")->trigger();
-  Tool(1).findChild<QPushButton*>("Button1")->click();
-  auto* colorUp = Tool(1).findChild<QToolButton*>("Button2");
+  Tool(kPencilSketch).findChild<QPushButton*>("Button1")->click();
+  auto* colorUp = Tool(kPencilSketch).findChild<QToolButton*>("Button2");
   ASSERT_TRUE(colorUp->isEnabled());
   MenuAction("Pencilsketch1")->trigger();
-  EXPECT_TRUE(Tool(1).isVisible());
+  EXPECT_TRUE(Tool(kPencilSketch).isVisible());
   EXPECT_EQ(Main().ActiveTool(), 1);
   EXPECT_FALSE(colorUp->isEnabled());
 }
@@ -55,24 +55,24 @@ TEST_F(ToolWindows, ChoosingTheOpenWindowAgainShowsItAfresh) {
 TEST_F(ToolWindows, FoldersAreSharedBetweenWindows) {
   MenuAction("Emboss1")->trigger();
   platform_.folderAnswers.push_back(QString("/photos/in"));
-  ToolChild<QToolButton>(15, "SpeedButton2")->click();
-  EXPECT_EQ(ToolChild<QLineEdit>(15, "Edit10")->text(), "/photos/in");
+  ToolChild<QToolButton>(kEmboss, "SpeedButton2")->click();
+  EXPECT_EQ(ToolChild<QLineEdit>(kEmboss, "Edit10")->text(), "/photos/in");
 
   // The output folder dialog opens at the input folder.
   platform_.folderAnswers.push_back(QString("/photos/out"));
-  ToolChild<QToolButton>(15, "SpeedButton3")->click();
-  EXPECT_EQ(ToolChild<QLineEdit>(15, "Edit11")->text(), "/photos/out");
+  ToolChild<QToolButton>(kEmboss, "SpeedButton3")->click();
+  EXPECT_EQ(ToolChild<QLineEdit>(kEmboss, "Edit11")->text(), "/photos/out");
   EXPECT_EQ(platform_.folderRequests[1].startFolder, "/photos/in");
 
   MenuAction("Pencilsketch1")->trigger();
-  EXPECT_EQ(ToolChild<QLineEdit>(1, "Edit1")->text(), "/photos/in");
-  EXPECT_EQ(ToolChild<QLineEdit>(1, "Edit2")->text(), "/photos/out");
+  EXPECT_EQ(ToolChild<QLineEdit>(kPencilSketch, "Edit1")->text(), "/photos/in");
+  EXPECT_EQ(ToolChild<QLineEdit>(kPencilSketch, "Edit2")->text(), "/photos/out");
 
   // A cancelled dialog keeps the folder, and the field shows the shared folder again.
-  ToolChild<QLineEdit>(1, "Edit1")->setText("typed");
-  ToolChild<QToolButton>(1, "SpeedButton2")->click();
+  ToolChild<QLineEdit>(kPencilSketch, "Edit1")->setText("typed");
+  ToolChild<QToolButton>(kPencilSketch, "SpeedButton2")->click();
   EXPECT_EQ(Main().InputFolder(), "/photos/in");
-  EXPECT_EQ(ToolChild<QLineEdit>(1, "Edit1")->text(), "/photos/in");
+  EXPECT_EQ(ToolChild<QLineEdit>(kPencilSketch, "Edit1")->text(), "/photos/in");
 }
 
 }  // namespace
