@@ -251,12 +251,12 @@ void MainWindow::BuildView(QWidget* central) {
   scrollBox_->setBackgroundRole(QPalette::Window);
   scrollBox_->viewport()->setAutoFillBackground(true);
 
-  image1_ = new PictureView;
-  image1_->setObjectName("Image1");
-  image1_->setToolTip("scroll the mouse-wheel to zoom out or zoom in");
+  pictureView_ = new PictureView;
+  pictureView_->setObjectName("Image1");
+  pictureView_->setToolTip("scroll the mouse-wheel to zoom out or zoom in");
   // The context menu opens on the release of a right click that did not pan the view.
-  image1_->setContextMenuPolicy(Qt::PreventContextMenu);
-  scrollBox_->setWidget(image1_);
+  pictureView_->setContextMenuPolicy(Qt::PreventContextMenu);
+  scrollBox_->setWidget(pictureView_);
 }
 
 // --- Layout and lifecycle --------------------------------------------------------------------

@@ -223,7 +223,7 @@ class MainWindow : public QMainWindow, public ToolHost {
   QFrame* viewBand_ = nullptr;
   QLabel* zoomLabel_ = nullptr;
   QScrollArea* scrollBox_ = nullptr;
-  PictureView* image1_ = nullptr;
+  PictureView* pictureView_ = nullptr;
   QLabel* statusLine_ = nullptr;
   QMenu* popupMenu_ = nullptr;
   QToolButton* undoButton_ = nullptr;

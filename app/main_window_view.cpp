@@ -88,7 +88,7 @@ void MainWindow::BuildViewControls() {
 // --- Zoom ----------------------------------------------------------------------------------
 
 void MainWindow::ShowWorking(double zoom) {
-  image1_->SetPicture(document_.Working());
+  pictureView_->SetPicture(document_.Working());
   SetDisplaySize(zoom);
 }
 
@@ -99,7 +99,7 @@ void MainWindow::SetDisplaySize(double zoom) {
   const auto side = [zoom](int s) {
     return static_cast<int>(std::clamp<std::int64_t>(DisplaySide(s, zoom), 1, QWIDGETSIZE_MAX));
   };
-  image1_->resize(side(picture.Width()), side(picture.Height()));
+  pictureView_->resize(side(picture.Width()), side(picture.Height()));
 }
 
 QString MainWindow::ZoomLabelText(double zoom) {
@@ -162,13 +162,13 @@ bool MainWindow::eventFilter(QObject* watched, QEvent* event) {
       break;
     case QEvent::MouseButtonPress:
     case QEvent::MouseButtonDblClick:  // the second press of a double click
-      if (watched == image1_) PictureMouseDown(static_cast<QMouseEvent*>(event));
+      if (watched == pictureView_) PictureMouseDown(static_cast<QMouseEvent*>(event));
       break;
     case QEvent::MouseMove:
-      if (watched == image1_) PictureMouseMove(static_cast<QMouseEvent*>(event));
+      if (watched == pictureView_) PictureMouseMove(static_cast<QMouseEvent*>(event));
       break;
     case QEvent::MouseButtonRelease:
-      if (watched == image1_) PictureMouseUp(static_cast<QMouseEvent*>(event));
+      if (watched == pictureView_) PictureMouseUp(static_cast<QMouseEvent*>(event));
       break;
     default:
       break;
@@ -205,7 +205,7 @@ void MainWindow::PictureMouseDown(QMouseEvent* event) {
   panning_ =
       Panning{true, true, event->position().toPoint(), scrollBox_->horizontalScrollBar()->value(),
               scrollBox_->verticalScrollBar()->value()};
-  if (event->button() == Qt::RightButton) image1_->setCursor(Qt::ClosedHandCursor);
+  if (event->button() == Qt::RightButton) pictureView_->setCursor(Qt::ClosedHandCursor);
 }
 
 void MainWindow::PictureMouseMove(QMouseEvent* event) {
@@ -222,7 +222,7 @@ void MainWindow::PictureMouseMove(QMouseEvent* event) {
 
 void MainWindow::PictureMouseUp(QMouseEvent* event) {
   panning_.dragging = false;
-  image1_->unsetCursor();
+  pictureView_->unsetCursor();
   if (event->button() == Qt::RightButton && panning_.unmoved)
     popupMenu_->popup(event->globalPosition().toPoint());
 }

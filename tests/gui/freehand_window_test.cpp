@@ -139,18 +139,18 @@ TEST_F(FreehandWindows, PhotoFitsTheViewAndTheEyedropperPicksFromIt) {
   portrait.At(599, 799) = Pixel{1, 2, 3, 255};
   Main().ShowNewPicture(portrait, true);
   Painting().ColorUp();
-  EXPECT_EQ(Panel().Image2()->size(), QSize(145, 193));
+  EXPECT_EQ(Panel().PhotoView()->size(), QSize(145, 193));
   Press("SpeedButton11");
   QMouseEvent press(QEvent::MouseButtonPress, QPointF(145, 193), QPointF(145, 193),
                     QPointF(145, 193), Qt::RightButton, Qt::RightButton, Qt::NoModifier,
                     &TestMouse());
-  QCoreApplication::sendEvent(Panel().Image2(), &press);
+  QCoreApplication::sendEvent(Panel().PhotoView(), &press);
   EXPECT_EQ(Painting().State().brushColor, (Pixel{1, 2, 3, 255}))
       << "the edge picks the last pixel";
   Press("Button2");
   Main().ShowNewPicture(Bitmap32(800, 600, kWhite), true);
   Painting().ColorUp();
-  EXPECT_EQ(Panel().Image2()->size(), QSize(217, 163));
+  EXPECT_EQ(Panel().PhotoView()->size(), QSize(217, 163));
 }
 
 TEST_F(FreehandWindows, NoPictureNoPainting) {

@@ -37,9 +37,9 @@ TEST(MainWindowStartUp, ShowsTheBuiltInPicture) {
   main.show();
   const Bitmap32 startup = StartupPicture();
   EXPECT_EQ(main.Document().Opened(), startup);
-  auto* image1 = main.findChild<PictureView*>("Image1");
-  EXPECT_EQ(image1->size(), QSize(521, 346));
-  EXPECT_EQ(image1->Image(), OpaqueImage(startup));
+  auto* picture = main.findChild<PictureView*>("Image1");
+  EXPECT_EQ(picture->size(), QSize(521, 346));
+  EXPECT_EQ(picture->Image(), OpaqueImage(startup));
   EXPECT_EQ(main.ActiveTool(), 0);
 }
 

@@ -25,10 +25,10 @@ class View : public GuiTest {
     return o == Qt::Horizontal ? box->horizontalScrollBar() : box->verticalScrollBar();
   }
   void Mouse(QEvent::Type type, QPoint at, Qt::MouseButton button, Qt::MouseButtons held) {
-    auto* image1 = MainChild<PictureView>("Image1");
-    QMouseEvent event(type, at, image1->mapToGlobal(at), button, held, Qt::NoModifier,
+    auto* picture = MainChild<PictureView>("Image1");
+    QMouseEvent event(type, at, picture->mapToGlobal(at), button, held, Qt::NoModifier,
                       &TestMouse());
-    QApplication::sendEvent(image1, &event);
+    QApplication::sendEvent(picture, &event);
   }
 };
 

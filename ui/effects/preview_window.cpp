@@ -47,9 +47,9 @@ PreviewWindow::PreviewWindow(const EffectSpec& spec, ToolHost& host, QWidget* pa
     view->setObjectName(name);
     row->addWidget(frame);
   };
-  box(image1_, "Image1", true);
-  image1_->setToolTip("Reset");
-  box(image2_, "Image2", false);
+  box(baseView_, "Image1", true);
+  baseView_->setToolTip("Reset");
+  box(previewView_, "Image2", false);
   row->addStretch(1);
   ControlsLayout()->insertLayout(0, row);
 }
@@ -66,16 +66,16 @@ void PreviewWindow::OnShown() {
 void PreviewWindow::LoadBase() {
   const bool current = Params().GetInt("for-current") != 0;
   base_ = current ? Host().Document().Working() : Host().Document().Source();
-  image1_->SetPicture(base_);
-  Host().DisplayImage(*image1_);
+  baseView_->SetPicture(base_);
+  Host().DisplayImage(*baseView_);
   ClearSwatches();
   SetPreview(base_);
 }
 
 void PreviewWindow::SetPreview(Bitmap32 preview) {
   preview_ = std::move(preview);
-  image2_->SetPicture(preview_);
-  Host().DisplayImage(*image2_);
+  previewView_->SetPicture(preview_);
+  Host().DisplayImage(*previewView_);
 }
 
 void PreviewWindow::ControlChanged(const ParamSpec& param) {

@@ -36,8 +36,8 @@ class PreviewWindow : public ToolWindow {
 
   Bitmap32 base_;
   Bitmap32 preview_;
-  PictureView* image1_ = nullptr;
-  PictureView* image2_ = nullptr;
+  PictureView* baseView_ = nullptr;
+  PictureView* previewView_ = nullptr;
 };
 
 class ColorFilterWindow : public PreviewWindow {

@@ -87,10 +87,10 @@ ControlPanelWindow::ControlPanelWindow(PaintingState& state, ToolHost& host,
   setWindowTitle("Original photo");
   setGeometry(8, 39, 226, 598);
 
-  image2_ = new PictureView(this);
-  image2_->setObjectName("Image2");
-  image2_->setGeometry(4, 4, kViewWidth, kViewHeight);
-  image2_->installEventFilter(this);
+  photoView_ = new PictureView(this);
+  photoView_->setObjectName("Image2");
+  photoView_->setGeometry(4, 4, kViewWidth, kViewHeight);
+  photoView_->installEventFilter(this);
 
   toolPanel_ = new QFrame(this);
   toolPanel_->setObjectName("Panel1");
@@ -170,16 +170,16 @@ void ControlPanelWindow::closeEvent(QCloseEvent* event) {
 
 void ControlPanelWindow::OnShown() {
   source_ = host_.Document().Source();
-  image2_->SetPicture(source_);
+  photoView_->SetPicture(source_);
   const int w = source_.Width(), h = source_.Height();
   if (w > 0 && h > 0) {
     if (h >= w)
-      image2_->resize(ScaledRound(w, image2_->height(), h), image2_->height());
+      photoView_->resize(ScaledRound(w, photoView_->height(), h), photoView_->height());
     else
-      image2_->resize(image2_->width(), ScaledRound(h, image2_->width(), w));
+      photoView_->resize(photoView_->width(), ScaledRound(h, photoView_->width(), w));
   }
   state_.controlPanelOpen = true;
-  toolPanel_->move(toolPanel_->x(), image2_->height() + 20);
+  toolPanel_->move(toolPanel_->x(), photoView_->height() + 20);
   thin_->setEnabled(host_.LineArt());
   thick_->setEnabled(host_.LineArt());
   picking_ = false;
@@ -189,9 +189,9 @@ void ControlPanelWindow::OnClosed() {
   host_.SetMainWindowEnabled(true);
   state_.controlPanelOpen = false;
   picking_ = false;
-  image2_->resize(kViewWidth, kViewHeight);
+  photoView_->resize(kViewWidth, kViewHeight);
   source_ = Bitmap32();
-  image2_->SetPicture(source_);
+  photoView_->SetPicture(source_);
   workArea_.close();
 }
 
@@ -218,7 +218,7 @@ void ControlPanelWindow::OnThick() {
 
 void ControlPanelWindow::ChooseTool(int tool, int penSize) {
   state_.tool = tool;
-  image2_->setCursor(tool == PaintingState::kEyedropper ? EyedropCursor() : QCursor());
+  photoView_->setCursor(tool == PaintingState::kEyedropper ? EyedropCursor() : QCursor());
   workArea_.UpdateToolCursor();
   if (penSize > 0) penSizeSlider_->setValue(penSize);
 }
@@ -243,7 +243,7 @@ void ControlPanelWindow::SetBrushColor(Pixel color) {
 // --- The eyedropper ----------------------------------------------------------------------------
 
 bool ControlPanelWindow::eventFilter(QObject* watched, QEvent* event) {
-  if (watched != image2_ || state_.tool != PaintingState::kEyedropper)
+  if (watched != photoView_ || state_.tool != PaintingState::kEyedropper)
     return QWidget::eventFilter(watched, event);
   const auto at = [event] {
     const QPointF p = static_cast<QMouseEvent*>(event)->position();
@@ -267,13 +267,13 @@ bool ControlPanelWindow::eventFilter(QObject* watched, QEvent* event) {
 
 void ControlPanelWindow::Pick(QPoint at) {
   const int w = source_.Width(), h = source_.Height();
-  if (w == 0 || h == 0 || image2_->width() <= 0 || image2_->height() <= 0) return;
+  if (w == 0 || h == 0 || photoView_->width() <= 0 || photoView_->height() <= 0) return;
   // A point that rounds past the photo's last column or row (a photo less than half the view's
   // size), or a drag that left the view, picks the nearest pixel of the photo.
-  const int x = std::clamp(at.x(), 0, image2_->width());
-  const int y = std::clamp(at.y(), 0, image2_->height());
-  const int px = std::min(ScaledRound(w, x, image2_->width()), w - 1);
-  const int py = std::min(ScaledRound(h, y, image2_->height()), h - 1);
+  const int x = std::clamp(at.x(), 0, photoView_->width());
+  const int y = std::clamp(at.y(), 0, photoView_->height());
+  const int px = std::min(ScaledRound(w, x, photoView_->width()), w - 1);
+  const int py = std::min(ScaledRound(h, y, photoView_->height()), h - 1);
   SetBrushColor(source_.At(px, py));
 }
 

@@ -30,7 +30,7 @@ class ControlPanelWindow : public QWidget {
 
   ControlPanelWindow(PaintingState& state, ToolHost& host, WorkAreaWindow& workArea);
 
-  PictureView* Image2() const { return image2_; }
+  PictureView* PhotoView() const { return photoView_; }
 
  public slots:
   void OnOk();
@@ -58,7 +58,7 @@ class ControlPanelWindow : public QWidget {
   Bitmap32 source_;  // the photo as shown, for the eyedropper
   bool picking_ = false;
 
-  PictureView* image2_ = nullptr;
+  PictureView* photoView_ = nullptr;
   QFrame* toolPanel_ = nullptr;
   QButtonGroup* tools_ = nullptr;
   QWidget* colorPanel_ = nullptr;

@@ -99,9 +99,9 @@ WorkAreaWindow::WorkAreaWindow(PaintingState& state, ToolHost& host)
   scrollBox_->setObjectName("ScrollBox1");
   scrollBox_->setAlignment(Qt::AlignCenter);
   scrollBox_->setWidgetResizable(false);
-  image1_ = new FreehandCanvas(*this, scrollBox_);
-  image1_->resize(0, 0);
-  scrollBox_->setWidget(image1_);
+  canvas_ = new FreehandCanvas(*this, scrollBox_);
+  canvas_->resize(0, 0);
+  scrollBox_->setWidget(canvas_);
   layout->addWidget(scrollBox_);
 
   auto* undo = new QAction("Undo stroke", this);
@@ -130,8 +130,8 @@ void WorkAreaWindow::OnShown() {
   strokeTool_ = PaintingState::kNoTool;
   panning_ = false;
   outlineShown_ = bandShown_ = pointerInside_ = false;
-  image1_->resize(picture_.Width(), picture_.Height());
-  image1_->update();
+  canvas_->resize(picture_.Width(), picture_.Height());
+  canvas_->update();
   UpdateToolCursor();
   host_.SetMainWindowEnabled(false);
 }
@@ -142,13 +142,13 @@ void WorkAreaWindow::OnClosed() {
   strokes_.Clear();
   strokeTool_ = PaintingState::kNoTool;
   picture_ = Bitmap32();
-  image1_->resize(0, 0);
+  canvas_->resize(0, 0);
 }
 
 // --- Tools -------------------------------------------------------------------------------------
 
 void WorkAreaWindow::UpdateToolCursor() {
-  image1_->setCursor(Qt::ArrowCursor);
+  canvas_->setCursor(Qt::ArrowCursor);
   const bool outlined =
       state_.tool == PaintingState::kBrush || state_.tool == PaintingState::kRubber;
   if (!outlined)
@@ -162,7 +162,7 @@ void WorkAreaWindow::PenSizeChanged() {
 }
 
 void WorkAreaWindow::Repaint(const PaintRect& area) {
-  if (!area.Empty()) image1_->update(ToQRect(area));
+  if (!area.Empty()) canvas_->update(ToQRect(area));
 }
 
 void WorkAreaWindow::Dab(QPoint at) {
@@ -189,7 +189,7 @@ void WorkAreaWindow::WholePictureStep(void (*operation)(Bitmap32&)) {
   strokes_.Keep(picture_, PaintRect{0, 0, picture_.Width(), picture_.Height()});
   operation(picture_);
   strokes_.End();
-  image1_->update();
+  canvas_->update();
 }
 
 void WorkAreaWindow::ThinPicture() {
@@ -259,7 +259,7 @@ void WorkAreaWindow::PictureMouseMove(Qt::MouseButtons buttons, QPoint at) {
         RemoveBand();
         bandEnd_ = QPoint(BandCoordinate(at.x(), anchor_.x()), BandCoordinate(at.y(), anchor_.y()));
         bandShown_ = true;
-        image1_->update(QRect(anchor_, bandEnd_).normalized().adjusted(-1, -1, 1, 1));
+        canvas_->update(QRect(anchor_, bandEnd_).normalized().adjusted(-1, -1, 1, 1));
         break;
       default:
         break;
@@ -297,7 +297,7 @@ void WorkAreaWindow::RemoveOutline() {
   if (!outlineShown_) return;
   outlineShown_ = false;
   const int r = outlineRadius_;
-  image1_->update(
+  canvas_->update(
       QRect(outlineCentre_ - QPoint(r, r), outlineCentre_ + QPoint(r, r)).adjusted(-1, -1, 2, 2));
 }
 
@@ -311,13 +311,13 @@ void WorkAreaWindow::ShowOutline(QPoint at) {
   outlineCentre_ = at;
   outlineRadius_ = state_.penSize;
   const int r = outlineRadius_;
-  image1_->update(QRect(at - QPoint(r, r), at + QPoint(r, r)).adjusted(-1, -1, 2, 2));
+  canvas_->update(QRect(at - QPoint(r, r), at + QPoint(r, r)).adjusted(-1, -1, 2, 2));
 }
 
 void WorkAreaWindow::RemoveBand() {
   if (!bandShown_) return;
   bandShown_ = false;
-  image1_->update(QRect(anchor_, bandEnd_).normalized().adjusted(-1, -1, 1, 1));
+  canvas_->update(QRect(anchor_, bandEnd_).normalized().adjusted(-1, -1, 1, 1));
 }
 
 }  // namespace quillane

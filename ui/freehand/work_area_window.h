@@ -49,7 +49,7 @@ class WorkAreaWindow : public QWidget {
   void SetControlPanel(QWidget* panel) { controlPanel_ = panel; }
 
   const Bitmap32& Picture() const { return picture_; }
-  FreehandCanvas* Canvas() const { return image1_; }
+  FreehandCanvas* Canvas() const { return canvas_; }
   QScrollArea* ScrollBox() const { return scrollBox_; }
   const StrokeHistory& Strokes() const { return strokes_; }
 
@@ -96,7 +96,7 @@ class WorkAreaWindow : public QWidget {
   ToolHost& host_;
   QWidget* controlPanel_ = nullptr;
   QScrollArea* scrollBox_ = nullptr;
-  FreehandCanvas* image1_ = nullptr;
+  FreehandCanvas* canvas_ = nullptr;
 
   Bitmap32 picture_;
   StrokeHistory strokes_;
