@@ -26,7 +26,7 @@ int main(int argc, char* argv[]) {
   window.OpenTool(tool);
   if (quillane::ToolWindow* open = window.ToolWindowAt(tool)) {
     open->ToggleBatchPanel();
-    open->ApplyShown();
+    open->OnApply();
     if (argc > 3 && QString(argv[3]) == "colorup") open->OpenColorUp();
   }
   QTimer::singleShot(700, [&] {

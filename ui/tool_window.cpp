@@ -95,7 +95,7 @@ void ToolWindow::BuildButtonRow(QBoxLayout* outer) {
     connect(button, &QPushButton::clicked, this, click);
     row->addWidget(button);
   };
-  if (!spec_.apply.objectName.empty()) addButton(spec_.apply, &ToolWindow::ApplyShown);
+  if (!spec_.apply.objectName.empty()) addButton(spec_.apply, &ToolWindow::OnApply);
   if (!spec_.restoreDefaults.objectName.empty())
     addButton(spec_.restoreDefaults, &ToolWindow::RestoreDefaultsAndApply);
   outer->addLayout(row);
@@ -270,7 +270,7 @@ void ToolWindow::AfterEffect() {
   AfterApply();
 }
 
-void ToolWindow::ApplyShown() {
+void ToolWindow::OnApply() {
   Apply(true);
 }
 

@@ -52,7 +52,7 @@ class ToolWindow : public QWidget {
 
  public slots:
   // The apply button (OK, or "Convert" in the kernel windows).
-  virtual void ApplyShown();
+  virtual void OnApply();
   void RestoreDefaultsAndApply();  // "Default": every parameter back to its default, then apply
   void OpenColorUp();              // "Color up"
   void ToggleBatchPanel();

@@ -87,7 +87,7 @@ void PreviewWindow::ShowBase() {
   SetPreview(base_);
 }
 
-void PreviewWindow::ApplyShown() {
+void PreviewWindow::OnApply() {
   Host().SetWorkingPicture(preview_, true);
   Host().SetStatusText(QString::fromStdString(Spec().statusText));
   close();

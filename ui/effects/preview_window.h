@@ -20,7 +20,7 @@ class PreviewWindow : public ToolWindow {
   const Bitmap32& Preview() const { return preview_; }
 
  public slots:
-  void ApplyShown() override;
+  void OnApply() override;
   void ShowBase();
 
  protected:

@@ -25,7 +25,7 @@ void SnapshotWindow::OnClosed() {
   snapshot_ = Bitmap32();
 }
 
-void SnapshotWindow::ApplyShown() {
+void SnapshotWindow::OnApply() {
   if (!Spec().routine) return;
   EffectParams settings = Spec().Defaults();
   settings.Merge(Params());

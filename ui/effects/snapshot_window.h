@@ -18,7 +18,7 @@ class SnapshotWindow : public ToolWindow {
   const Bitmap32& Snapshot() const { return snapshot_; }
 
  public slots:
-  void ApplyShown() override;
+  void OnApply() override;
 
  protected:
   void OnShown() override;
