@@ -39,7 +39,8 @@ class MemorySink : public ByteSink {
 // for anything it cannot read completely.
 
 // JPEG through libjpeg-turbo: baseline, progressive, grayscale, RGB, CMYK and YCCK (Adobe
-// files store inverted inks; both forms give the right colours). Alpha is 255.
+// files store inverted inks; both forms give the right colours). Alpha is 255. The picture is
+// stood upright by the EXIF Orientation tag (exif_orientation.h) when the file has one.
 TBitmap32 DecodeJpeg(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels);
 
 // The formats read through Qt's image readers, each with its own reader only (the content is
