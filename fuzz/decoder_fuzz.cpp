@@ -3,8 +3,11 @@
 #include <QtGlobal>
 #include <cstddef>
 #include <cstdint>
+#include <vector>
 
 #include "codecs/codec_internal.h"
+#include "codecs/exif_orientation.h"
+#include "imaging/orientation.h"
 
 namespace {
 
@@ -30,6 +33,12 @@ quillane::TBitmap32 Decode(quillane::codecs::Bytes bytes) {
   return DecodeWindowsMetafile(bytes, kFuzzMaxPixels);
 #elif defined(QUILLANE_FUZZ_FAMILY_emf)
   return DecodeEnhancedMetafile(bytes, kFuzzMaxPixels);
+#elif defined(QUILLANE_FUZZ_FAMILY_exif)
+  // The input is the TIFF block of an APP1 segment; the fixed header is put in front so that
+  // every input reaches libexif.
+  std::vector<std::uint8_t> segment = {'E', 'x', 'i', 'f', 0, 0};
+  segment.insert(segment.end(), bytes.begin(), bytes.end());
+  return quillane::UprightPicture(quillane::TBitmap32(3, 2), ExifOrientation(segment));
 #else
 #error "no decoder family chosen"
 #endif
