@@ -54,6 +54,10 @@ enum class QtFormat {
 // background a freshly made bitmap shows); the alpha bytes are returned as the decoder gives
 // them. Bitmaps keep their stored colours and alpha.
 TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels = TBitmap32::kMaxPixels);
+// For a 16-bit bitmap (BI_RGB 5-5-5, BI_BITFIELDS or BI_ALPHABITFIELDS) that Qt has decoded
+// into picture, takes every pixel again from data with each field widened to the full range
+// (bitmap16.cpp says how); any other file is left as it is.
+void WidenSixteenBitBitmap(Bytes data, TBitmap32& picture);
 
 // Metafiles are told apart by their content: an enhanced metafile starts with an EMR_HEADER
 // record carrying the " EMF" signature; anything else must be a Windows metafile (placeable
