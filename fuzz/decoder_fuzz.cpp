@@ -15,7 +15,7 @@ namespace {
 // any pixel is allocated, as it would be on a machine with little memory. With the full budget
 // every input could allocate a gigabyte, and the targets ran 25 to 100 inputs a second; at 16K
 // pixels (64 KB, 128 by 128) they run thousands.
-constexpr std::int64_t kFuzzMaxPixels = std::int64_t{1} << 14;
+[[maybe_unused]] constexpr std::int64_t kFuzzMaxPixels = std::int64_t{1} << 14;
 
 quillane::TBitmap32 Decode(quillane::codecs::Bytes bytes) {
   using namespace quillane::codecs;

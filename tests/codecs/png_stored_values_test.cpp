@@ -2,6 +2,7 @@
 // are rounded to 8 bits.
 #include <png.h>
 
+#include <algorithm>
 #include <csetjmp>
 #include <cstdio>
 #include <cstring>
@@ -181,6 +182,29 @@ TEST_F(TempFolder, PaletteFileWithGammaKeepsItsColoursThroughASaveAndLoad) {
   EXPECT_EQ(loaded.At(2, 0), (Pixel{32, 64, 128, 255}));
   SavePng(loaded, Path("b.png"));
   EXPECT_EQ(*LoadPng(Path("b.png")), loaded);
+}
+
+// A damaged file is refused with libpng's reason, whatever part of it is broken.
+TEST(PngStoredValues, DamagedFilesAreRefused) {
+  const std::vector<std::uint8_t> good =
+      WritePng(16, 16, PNG_COLOR_TYPE_RGB, 8, Samples(16 * 16 * 3, 8, 5), {.gamma = 1.0});
+  ASSERT_EQ(DecodePng(good).Width(), 16);
+  auto find = [&](const char* type) {
+    return static_cast<std::size_t>(std::search(good.begin(), good.end(), type, type + 4) -
+                                    good.begin());
+  };
+  const std::size_t idat = find("IDAT"), iend = find("IEND");
+  std::vector<std::vector<std::uint8_t>> broken(5, good);
+  broken[0][1] = 'Q';            // signature
+  broken[1][8 + 4 + 4 + 8] = 3;  // IHDR bit depth 3, its checksum now wrong too
+  broken[2][iend - 8] ^= 0x40;   // the checksum of the image data
+  broken[3].resize(idat + 20);   // cut inside the image data
+  broken[4].erase(broken[4].begin() + static_cast<std::ptrdiff_t>(idat - 4),
+                  broken[4].begin() + static_cast<std::ptrdiff_t>(iend - 4));  // no IDAT
+  for (std::size_t i = 0; i < broken.size(); ++i) {
+    const std::string error = ErrorOf([&] { DecodePng(broken[i]); });
+    EXPECT_TRUE(Contains(error, "PNG")) << i << ": " << error;
+  }
 }
 
 }  // namespace
