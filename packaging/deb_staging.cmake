@@ -1,7 +1,7 @@
 # Runs inside cpack on the staged tree, before the package is made: what a Debian package needs
-# beyond "cmake --install" - the copyright file and a changelog in the documentation folder, and
-# the manual page compressed (gzip -9n, so the package does not change with the time it is
-# built).
+# beyond "cmake --install" - the copyright file and a changelog in the documentation folder,
+# lintian's notes on the metafile renderers, and the manual pages compressed (gzip -9n, so the
+# package does not change with the time it is built).
 find_program(GZIP gzip REQUIRED)
 file(GLOB_RECURSE staged_docs LIST_DIRECTORIES true "${CPACK_TEMPORARY_DIRECTORY}/*/share/doc/quillane")
 if(NOT staged_docs)
@@ -15,6 +15,8 @@ foreach(doc IN LISTS staged_docs)
   file(COPY "${CPACK_QUILLANE_PACKAGING_DIR}/copyright" DESTINATION "${doc}"
        FILE_PERMISSIONS OWNER_READ OWNER_WRITE GROUP_READ WORLD_READ)
   configure_file("${CPACK_QUILLANE_PACKAGING_DIR}/changelog.in" "${doc}/changelog" @ONLY)
+  configure_file("${CPACK_QUILLANE_PACKAGING_DIR}/lintian-overrides"
+                 "${share}/lintian/overrides/quillane" COPYONLY)
   set(to_compress "${doc}/changelog")
   file(GLOB pages "${share}/man/man*/*.[0-9]")
   list(APPEND to_compress ${pages})

@@ -29,12 +29,13 @@ for library in libjpeg62-turbo libpng16 libexif12 libqt6core6; do
 done
 
 # The same files as "cmake --install" gives under /usr, but for the manual page, which is
-# compressed, and the copyright file and changelog every Debian package carries.
+# compressed, the copyright file and changelog every Debian package carries, and lintian's notes.
 DESTDIR=$stage/root cmake --install "$build" --prefix /usr >"$stage/install.log" 2>&1 ||
   { cat "$stage/install.log"; fail "cmake --install"; }
 (cd "$stage/root" && find . -type f | sed 's|^\./|/|; s|\(/man/man[0-9]/.*\.[0-9]\)$|\1.gz|' | sort) \
   >"$stage/installed"
-printf '%s\n' /usr/share/doc/quillane/copyright /usr/share/doc/quillane/changelog.gz >>"$stage/installed"
+printf '%s\n' /usr/share/doc/quillane/copyright /usr/share/doc/quillane/changelog.gz \
+  /usr/share/lintian/overrides/quillane >>"$stage/installed"
 sort -o "$stage/installed" "$stage/installed"
 dpkg -c "$deb" | awk '$1 !~ /^d/ {print $6}' | sed 's|^\./|/|' | sort >"$stage/packaged"
 diff "$stage/installed" "$stage/packaged" || fail "the package's files differ from the install's"
