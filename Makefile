@@ -14,9 +14,9 @@ PREFIX ?= /usr/local
 PACKAGES := build-essential cmake pkg-config clang libclang-rt-14-dev clang-format \
 	qt6-base-dev qt6-svg-dev qt6-qpa-plugins libgl-dev fonts-dejavu-core \
 	libjpeg62-turbo-dev libpng-dev libgtest-dev libgmock-dev libbenchmark-dev libwmf-dev libemf2svg-dev \
-	xdg-utils libzstd-dev
+	xdg-utils libzstd-dev libexif-dev
 
-.PHONY: all deps build run install test test-asan fuzz bench bench-all format clean
+.PHONY: all deps build run install deb test test-asan fuzz bench bench-all format clean
 
 all: build
 
@@ -48,6 +48,13 @@ run: deps
 # Into PREFIX (/usr/local unless given); DESTDIR=/some/stage stages it there instead.
 install: build
 	DESTDIR="$(DESTDIR)" cmake --install $(BUILD) --prefix $(PREFIX)
+
+# The Debian package of what "make install" installs under /usr, checked by lintian when it is
+# there: $(BUILD)/quillane_<version>_<arch>.deb, for "apt-get install ./quillane_*.deb".
+deb: deps
+	$(MAKE) build
+	cd $(BUILD) && cpack -G DEB
+	@if command -v lintian >/dev/null; then lintian --fail-on error $(BUILD)/quillane_*.deb; fi
 
 test: deps
 	$(MAKE) build

@@ -39,7 +39,8 @@ class MemorySink : public ByteSink {
 // for anything it cannot read completely.
 
 // JPEG through libjpeg-turbo: baseline, progressive, grayscale, RGB, CMYK and YCCK (Adobe
-// files store inverted inks; both forms give the right colours). Alpha is 255.
+// files store inverted inks; both forms give the right colours). Alpha is 255. The picture is
+// stood upright by the EXIF Orientation tag (exif_orientation.h) when the file has one.
 Bitmap32 DecodeJpeg(Bytes data, std::int64_t maxPixels = Bitmap32::kMaxPixels);
 
 // The formats read through Qt's image readers, each with its own reader only (the content is
@@ -53,6 +54,10 @@ enum class QtFormat {
 // background a freshly made bitmap shows); the alpha bytes are returned as the decoder gives
 // them. Bitmaps keep their stored colours and alpha.
 Bitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels = Bitmap32::kMaxPixels);
+// For a 16-bit bitmap (BI_RGB 5-5-5, BI_BITFIELDS or BI_ALPHABITFIELDS) that Qt has decoded
+// into picture, takes every pixel again from data with each field widened to the full range
+// (bitmap16.cpp says how); any other file is left as it is.
+void WidenSixteenBitBitmap(Bytes data, Bitmap32& picture);
 
 // Metafiles are told apart by their content: an enhanced metafile starts with an EMR_HEADER
 // record carrying the " EMF" signature; anything else must be a Windows metafile (placeable

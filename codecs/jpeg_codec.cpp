@@ -15,8 +15,11 @@
 #include <cstring>
 #include <new>
 #include <string>
+#include <utility>
 
 #include "codecs/codec_internal.h"
+#include "codecs/exif_orientation.h"
+#include "imaging/orientation.h"
 
 namespace quillane::codecs {
 namespace {
@@ -78,6 +81,16 @@ void EmitMessage(j_common_ptr cinfo, int level) {
 
 void OutputMessage(j_common_ptr) {}
 
+// The first EXIF block among the APP1 segments libjpeg kept (XMP packets are APP1 too).
+int OrientationOf(const jpeg_decompress_struct& cinfo) {
+  for (jpeg_saved_marker_ptr m = cinfo.marker_list; m != nullptr; m = m->next) {
+    if (m->marker == JPEG_APP0 + 1 && m->data != nullptr && m->data_length >= 6 &&
+        std::memcmp(m->data, "Exif\0\0", 6) == 0)
+      return ExifOrientation(Bytes(m->data, m->data_length));
+  }
+  return 1;
+}
+
 void LimitScans(j_common_ptr cinfo) {
   if (!cinfo->is_decompressor) return;
   const auto* dinfo = reinterpret_cast<j_decompress_ptr>(cinfo);
@@ -106,6 +119,7 @@ struct Decompressor {
   ErrorManager err{};
   jpeg_progress_mgr progress{};
   bool created = false;
+  int orientation = 1;  // from the EXIF block, 1 without one
   ~Decompressor() {
     if (created) jpeg_destroy_decompress(&cinfo);
   }
@@ -120,13 +134,17 @@ bool RunDecoder(Decompressor& d, Bytes data, std::int64_t maxPixels, Bitmap32& r
   d.progress.progress_monitor = LimitScans;
   d.cinfo.progress = &d.progress;
   jpeg_mem_src(&d.cinfo, data.data(), static_cast<unsigned long>(data.size()));
+  jpeg_save_markers(&d.cinfo, JPEG_APP0 + 1, 0xFFFF);
   jpeg_read_header(&d.cinfo, TRUE);
   d.err.headerRead = true;
+  d.orientation = OrientationOf(d.cinfo);
 
   const std::int64_t width = d.cinfo.image_width;
   const std::int64_t height = d.cinfo.image_height;
   // A progressive file is decoded into a coefficient buffer of two bytes per sample first.
-  const int extraBytesPerPixel = d.cinfo.progressive_mode ? 2 * d.cinfo.num_components : 0;
+  // Standing a picture upright across its diagonal copies it once more.
+  const int extraBytesPerPixel = (d.cinfo.progressive_mode ? 2 * d.cinfo.num_components : 0) +
+                                 (OrientationSwapsSides(d.orientation) ? 4 : 0);
   try {
     CheckPictureSize(width, height, maxPixels, "JPEG", extraBytesPerPixel);
   } catch (const PictureFileError& e) {
@@ -284,7 +302,7 @@ Bitmap32 DecodeJpeg(Bytes data, std::int64_t maxPixels) {
     throw PictureFileError(std::string("Cannot read the JPEG picture: ") + d.err.message);
   }
   if (!sizeProblem.empty()) throw PictureFileError(sizeProblem);
-  return result;
+  return UprightPicture(std::move(result), d.orientation);
 }
 
 std::vector<std::uint8_t> EncodeJpeg(const Bitmap32& picture, int quality) {

@@ -1,28 +1,111 @@
-// PNG reading through libpng's simplified interface, which keeps its errors to itself (Qt's
-// reader lets libpng print them on the terminal) and gives B, G, R, A bytes as Pixel holds them.
+// PNG reading through libpng. The file's stored sample values are what the picture gets, as
+// with every other format: the gamma, chromaticity, sRGB and ICC profile chunks are left
+// unapplied (the simplified reader would convert by them). 16-bit samples are reduced to
+// (v * 255 + 32767) / 65535, which is what libpng's png_set_scale_16 gives. libpng's complaints
+// become the error message; none goes to the terminal. libpng reports errors by longjmp to the one
+// function that owns the reader, and only after that function has returned does anything throw.
 #include <png.h>
 
-#include <memory>
+#include <algorithm>
+#include <csetjmp>
+#include <cstdio>
+#include <cstring>
+#include <string>
+#include <vector>
 
 #include "codecs/codec_internal.h"
 
 namespace quillane::codecs {
+namespace {
+
+struct PngSource {
+  Bytes data;
+  std::size_t at = 0;
+  bool headerRead = false;
+  char message[160] = "";
+};
+
+void ReadFromMemory(png_structp png, png_bytep out, png_size_t size) {
+  auto* source = static_cast<PngSource*>(png_get_io_ptr(png));
+  if (size > source->data.size() - source->at) png_error(png, "the file ends too early");
+  std::memcpy(out, source->data.data() + source->at, size);
+  source->at += size;
+}
+
+[[noreturn]] void OnError(png_structp png, png_const_charp text) {
+  auto* source = static_cast<PngSource*>(png_get_error_ptr(png));
+  std::snprintf(source->message, sizeof source->message, "%s", text);
+  png_longjmp(png, 1);
+}
+
+void OnWarning(png_structp, png_const_charp) {}
+
+struct PngReader {
+  png_structp png = nullptr;
+  png_infop info = nullptr;
+  ~PngReader() {
+    if (png != nullptr) png_destroy_read_struct(&png, info != nullptr ? &info : nullptr, nullptr);
+  }
+};
+
+// Everything libpng touches happens here; returns false with source.message set on failure.
+bool RunPngDecoder(PngReader& r, PngSource& source, std::int64_t maxPixels, Bitmap32& result,
+                   std::vector<png_bytep>& rows, std::string& sizeProblem) {
+  if (setjmp(png_jmpbuf(r.png))) return false;
+  png_set_read_fn(r.png, &source, ReadFromMemory);
+  png_read_info(r.png, r.info);
+  source.headerRead = true;
+  const std::int64_t width = png_get_image_width(r.png, r.info);
+  const std::int64_t height = png_get_image_height(r.png, r.info);
+  try {
+    CheckPictureSize(width, height, maxPixels, "PNG");
+  } catch (const PictureFileError& e) {
+    sizeProblem = e.what();
+    return true;
+  }
+  // Palette, gray and transparency colour become B, G, R, A bytes, with alpha 255 where the
+  // file has none; no gamma step is asked for, so none is made.
+  png_set_expand(r.png);
+  png_set_scale_16(r.png);
+  png_set_gray_to_rgb(r.png);
+  png_set_bgr(r.png);
+  png_set_filler(r.png, 0xFF, PNG_FILLER_AFTER);
+  png_set_interlace_handling(r.png);
+  png_read_update_info(r.png, r.info);
+  if (png_get_rowbytes(r.png, r.info) != static_cast<png_size_t>(width) * sizeof(Pixel)) {
+    png_error(r.png, "unexpected row layout");
+  }
+  result.SetSize(static_cast<int>(width), static_cast<int>(height));
+  rows.resize(static_cast<std::size_t>(height));
+  for (int y = 0; y < static_cast<int>(height); ++y) {
+    rows[static_cast<std::size_t>(y)] = reinterpret_cast<png_bytep>(result.ScanLine(y));
+  }
+  png_read_image(r.png, rows.data());
+  return true;
+}
+
+}  // namespace
 
 Bitmap32 DecodePng(Bytes data, std::int64_t maxPixels) {
   if (data.empty()) throw PictureFileError("The PNG file is empty");
-  png_image image{};
-  image.version = PNG_IMAGE_VERSION;
-  const std::unique_ptr<png_image, void (*)(png_imagep)> cleanup(&image, png_image_free);
-  if (!png_image_begin_read_from_memory(&image, data.data(), data.size())) {
-    throw PictureFileError(std::string("The file is not a valid PNG picture (") + image.message +
-                           ")");
+  if (data.size() < 8 || png_sig_cmp(data.data(), 0, 8) != 0) {
+    throw PictureFileError("The file is not a valid PNG picture (no PNG signature)");
   }
-  CheckPictureSize(image.width, image.height, maxPixels, "PNG");
-  image.format = PNG_FORMAT_BGRA;
-  Bitmap32 result(static_cast<int>(image.width), static_cast<int>(image.height));
-  if (!png_image_finish_read(&image, nullptr, result.Data(), 0, nullptr)) {
-    throw PictureFileError(std::string("Cannot read the PNG picture: ") + image.message);
+  PngSource source{data};
+  PngReader r;
+  r.png = png_create_read_struct(PNG_LIBPNG_VER_STRING, &source, OnError, OnWarning);
+  if (r.png != nullptr) r.info = png_create_info_struct(r.png);
+  if (r.png == nullptr || r.info == nullptr) throw PictureFileError("Out of memory");
+  Bitmap32 result;
+  std::vector<png_bytep> rows;
+  std::string sizeProblem;
+  if (!RunPngDecoder(r, source, maxPixels, result, rows, sizeProblem)) {
+    throw PictureFileError(source.headerRead
+                               ? std::string("Cannot read the PNG picture: ") + source.message
+                               : std::string("The file is not a valid PNG picture (") +
+                                     source.message + ")");
   }
+  if (!sizeProblem.empty()) throw PictureFileError(sizeProblem);
   return result;
 }
 

@@ -260,6 +260,7 @@ Bitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
   for (int y = 0; y < image.height(); ++y) {
     std::memcpy(result.ScanLine(y), image.constScanLine(y), rowBytes);
   }
+  if (format == QtFormat::kBitmap) WidenSixteenBitBitmap(data, result);
   if (format != QtFormat::kBitmap) CompositeOverWhite(result);
   return result;
 }

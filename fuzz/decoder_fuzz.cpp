@@ -3,8 +3,11 @@
 #include <QtGlobal>
 #include <cstddef>
 #include <cstdint>
+#include <vector>
 
 #include "codecs/codec_internal.h"
+#include "codecs/exif_orientation.h"
+#include "imaging/orientation.h"
 
 namespace {
 
@@ -12,7 +15,7 @@ namespace {
 // any pixel is allocated, as it would be on a machine with little memory. With the full budget
 // every input could allocate a gigabyte, and the targets ran 25 to 100 inputs a second; at 16K
 // pixels (64 KB, 128 by 128) they run thousands.
-constexpr std::int64_t kFuzzMaxPixels = std::int64_t{1} << 14;
+[[maybe_unused]] constexpr std::int64_t kFuzzMaxPixels = std::int64_t{1} << 14;
 
 quillane::Bitmap32 Decode(quillane::codecs::Bytes bytes) {
   using namespace quillane::codecs;
@@ -30,6 +33,12 @@ quillane::Bitmap32 Decode(quillane::codecs::Bytes bytes) {
   return DecodeWindowsMetafile(bytes, kFuzzMaxPixels);
 #elif defined(QUILLANE_FUZZ_FAMILY_emf)
   return DecodeEnhancedMetafile(bytes, kFuzzMaxPixels);
+#elif defined(QUILLANE_FUZZ_FAMILY_exif)
+  // The input is the TIFF block of an APP1 segment; the fixed header is put in front so that
+  // every input reaches libexif.
+  std::vector<std::uint8_t> segment = {'E', 'x', 'i', 'f', 0, 0};
+  segment.insert(segment.end(), bytes.begin(), bytes.end());
+  return quillane::UprightPicture(quillane::Bitmap32(3, 2), ExifOrientation(segment));
 #else
 #error "no decoder family chosen"
 #endif

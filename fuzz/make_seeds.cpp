@@ -186,6 +186,53 @@ Bytes Wmf() {
   return head.Add(records.b).b;
 }
 
+// The TIFF block of an EXIF segment: the first directory with a camera name, the orientation
+// (6) and a pointer to a second directory holding the capture date, in either byte order.
+Bytes Exif(bool bigEndian) {
+  Bytes b;
+  auto u16 = [&](unsigned v) {
+    const std::uint8_t hi = static_cast<std::uint8_t>(v >> 8), lo = static_cast<std::uint8_t>(v);
+    b.insert(b.end(), bigEndian ? std::initializer_list<std::uint8_t>{hi, lo}
+                                : std::initializer_list<std::uint8_t>{lo, hi});
+  };
+  auto u32 = [&](std::uint32_t v) {
+    if (bigEndian) {
+      u16(v >> 16);
+      u16(v & 0xFFFF);
+    } else {
+      u16(v & 0xFFFF);
+      u16(v >> 16);
+    }
+  };
+  auto entry = [&](unsigned tag, unsigned type, std::uint32_t count, std::uint32_t value) {
+    u16(tag);
+    u16(type);
+    u32(count);
+    if (type == 3) {
+      u16(value);
+      u16(0);
+    } else {
+      u32(value);
+    }
+  };
+  u16(bigEndian ? 0x4D4D : 0x4949);
+  u16(42);
+  u32(8);
+  u16(3);                   // 8: the first directory
+  entry(0x010F, 2, 8, 50);  // Make, at 50
+  entry(0x0112, 3, 1, 6);   // Orientation
+  entry(0x8769, 4, 1, 58);  // the EXIF directory, at 58
+  u32(0);                   // 46: no second picture
+  // 50: the camera name; 58: the EXIF directory.
+  for (char c : std::string("Camera\0\0", 8)) b.push_back(static_cast<std::uint8_t>(c));
+  u16(1);
+  entry(0x9003, 2, 20, 76);  // DateTimeOriginal, at 76
+  u32(0);
+  for (char c : std::string("2026:12:07 03:00:00")) b.push_back(static_cast<std::uint8_t>(c));
+  b.push_back(0);
+  return b;
+}
+
 void Save(const std::filesystem::path& folder, const std::string& family, int index,
           const Bytes& bytes) {
   std::filesystem::create_directories(folder / family);
@@ -211,6 +258,16 @@ int main(int argc, char** argv) {
     Save(folder, "jpeg", 1, Jpeg(3, true));
     Save(folder, "jpeg", 2, Jpeg(1, false));
     Save(folder, "jpeg", 3, Jpeg(4, false));
+    // A phone's portrait photo: EXIF first, then the picture.
+    const Bytes exif[] = {Exif(false), Exif(true)};
+    Bytes tagged = c::EncodeJpeg(picture, 90);
+    Bytes app1 = {0xFF, 0xE1, 0, static_cast<std::uint8_t>(exif[0].size() + 8), 'E', 'x', 'i',
+                  'f',  0,    0};
+    app1.insert(app1.end(), exif[0].begin(), exif[0].end());
+    tagged.insert(tagged.begin() + 2, app1.begin(), app1.end());
+    Save(folder, "jpeg", 4, tagged);
+    Save(folder, "exif", 0, exif[0]);
+    Save(folder, "exif", 1, exif[1]);
 
     c::MemorySink bmp24;
     c::EncodeBitmap24(picture, bmp24);

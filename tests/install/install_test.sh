@@ -35,6 +35,7 @@ bash -n "$root/share/bash-completion/completions/quillane-cli" || fail "completi
 
 if [ "$gui" = 1 ]; then
   [ -x "$root/bin/quillane" ] || fail "bin/quillane is not installed"
+  [ -s "$root/share/man/man1/quillane.1" ] || fail "quillane.1 is missing"
   desktop-file-validate "$root/share/applications/$id.desktop" || fail "desktop entry"
   appstreamcli validate --no-net "$root/share/metainfo/$id.metainfo.xml" || fail "metainfo"
   for size in 16 32 48 64 128 256; do
