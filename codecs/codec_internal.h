@@ -36,11 +36,14 @@ class MemorySink : public ByteSink {
 
 // Every decoder refuses a picture of more than maxPixels (or of a width or height of 0 or
 // below) from its header, before any pixel memory is allocated, and throws PictureFileError
-// for anything it cannot read completely.
+// for anything it cannot read completely. Before that, each checks that the file holds enough
+// data for the picture its header announces (run-length bitmap data, a GIF frame's LZW data, a
+// JPEG's entropy-coded data and scans, a PNG's compressed rows) and refuses it as damaged or
+// truncated when it cannot, so that a few bytes never cost gigabytes or minutes.
 
 // JPEG through libjpeg-turbo: baseline, progressive, grayscale, RGB, CMYK and YCCK (Adobe
 // files store inverted inks; both forms give the right colours). Alpha is 255.
-TBitmap32 DecodeJpeg(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels);
+TBitmap32 DecodeJpeg(Bytes data, std::int64_t maxPixels = MaxPicturePixels());
 
 // The formats read through Qt's image readers, each with its own reader only (the content is
 // not sniffed, so a PNG named .bmp is refused as a bad bitmap).
@@ -52,17 +55,17 @@ enum class QtFormat {
 // For icons and GIFs, transparent and partly transparent pixels are composited over white (the
 // background a freshly made bitmap shows); the alpha bytes are returned as the decoder gives
 // them. Bitmaps keep their stored colours and alpha.
-TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels = TBitmap32::kMaxPixels);
+TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels = MaxPicturePixels());
 
 // Metafiles are told apart by their content: an enhanced metafile starts with an EMR_HEADER
 // record carrying the " EMF" signature; anything else must be a Windows metafile (placeable
 // or not). The picture is played onto a white background; alpha is 255. Windows metafiles, and
 // enhanced metafiles with more than bitmaps in them, are drawn in a separate, limited process
 // (codecs/metafile_render.h); a file that keeps it drawing too long is refused.
-TBitmap32 DecodeMetafile(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels);
+TBitmap32 DecodeMetafile(Bytes data, std::int64_t maxPixels = MaxPicturePixels());
 bool LooksLikeEnhancedMetafile(Bytes data);
-TBitmap32 DecodeEnhancedMetafile(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels);
-TBitmap32 DecodeWindowsMetafile(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels);
+TBitmap32 DecodeEnhancedMetafile(Bytes data, std::int64_t maxPixels = MaxPicturePixels());
+TBitmap32 DecodeWindowsMetafile(Bytes data, std::int64_t maxPixels = MaxPicturePixels());
 
 // Encoders. quality is clamped to 1..100.
 std::vector<std::uint8_t> EncodeJpeg(const TBitmap32& picture, int quality);
@@ -103,7 +106,7 @@ void CheckPictureSize(std::int64_t width, std::int64_t height, std::int64_t maxP
 
 // PNG through libpng's simplified reader, alpha kept as stored (not premultiplied). libpng's
 // complaints become the error message; none goes to the terminal.
-TBitmap32 DecodePng(Bytes data, std::int64_t maxPixels = TBitmap32::kMaxPixels);
+TBitmap32 DecodePng(Bytes data, std::int64_t maxPixels = MaxPicturePixels());
 
 // The family a file's first bytes belong to ("JPEG", "PNG", "GIF", "bitmap", "icon",
 // "metafile"), or "" when none is recognised.

@@ -5,6 +5,7 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <atomic>
 #include <cerrno>
 #include <cstring>
 #include <new>
@@ -14,6 +15,21 @@
 #include "imaging/memory_budget.h"
 
 namespace quillane {
+namespace {
+
+std::atomic<std::int64_t> maxPicturePixels{kDefaultMaxPicturePixels};
+
+}  // namespace
+
+std::int64_t MaxPicturePixels() {
+  return maxPicturePixels.load(std::memory_order_relaxed);
+}
+
+void SetMaxPicturePixels(std::int64_t pixels) {
+  maxPicturePixels.store(std::clamp<std::int64_t>(pixels, 1, TBitmap32::kMaxPixels),
+                         std::memory_order_relaxed);
+}
+
 namespace codecs {
 
 void CheckPictureSize(std::int64_t width, std::int64_t height, std::int64_t maxPixels,
@@ -25,9 +41,17 @@ void CheckPictureSize(std::int64_t width, std::int64_t height, std::int64_t maxP
   }
   // Each side is at most 2^32 here, so the product cannot overflow.
   if (width > 0xFFFFFFFFll || height > 0xFFFFFFFFll || width * height > maxPixels) {
+    // Only a limit below what a bitmap can hold can be raised.
+    const bool fitsBitmap = width <= TBitmap32::kMaxPixels && height <= TBitmap32::kMaxPixels &&
+                            width * height <= TBitmap32::kMaxPixels;
+    const std::string raise =
+        maxPixels < TBitmap32::kMaxPixels && fitsBitmap
+            ? " (quillane-cli --max-pixels " + std::to_string(width * height) +
+                  " raises the limit, up to " + std::to_string(TBitmap32::kMaxPixels) + ")"
+            : std::string();
     throw PictureFileError(std::string("The ") + what + " picture is " + size +
                            " pixels, more than the " + std::to_string(maxPixels) +
-                           " pixels a picture may have");
+                           " pixels a picture may have" + raise);
   }
   try {
     CheckMemoryFor(width, height, std::string("The ") + what + " picture", extraBytesPerPixel);
