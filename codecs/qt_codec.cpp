@@ -257,7 +257,8 @@ std::uint64_t LzwPixels(Bytes data, std::size_t at, int minCodeSize, std::uint64
 // Qt renders a GIF's first frame on the whole logical screen that the header declares. The
 // screen beyond the frame is only background (transparent, shown white), so it is not evidence
 // of anything: a 27 KB file claiming a 16000 by 16000 screen would take gigabytes. The screen is
-// honoured while it is at most kScreenPixelsFree pixels or four times the frame; beyond that it
+// honoured (the first frame at its place, the rest transparent) while it is at most
+// kScreenPixelsFree pixels or four times the frame; beyond that it
 // is cut back to the frame's right and bottom edges, and if even that is too much of nothing,
 // to the frame itself. The changes are made in a copy handed to the reader. The frame must be
 // there: its LZW data has to give at least half its pixels (some files lose their tail, and
@@ -266,7 +267,12 @@ std::uint64_t LzwPixels(Bytes data, std::size_t at, int minCodeSize, std::uint64
 // 12-bit code table.
 constexpr std::int64_t kScreenPixelsFree = std::int64_t{1} << 22;
 
-std::vector<std::uint8_t> GifWithFittedScreen(Bytes data, std::int64_t maxPixels) {
+struct FittedGif {
+  std::vector<std::uint8_t> bytes;
+  std::int64_t left = 0, top = 0, width = 0, height = 0;  // the first frame on the screen
+};
+
+FittedGif GifWithFittedScreen(Bytes data, std::int64_t maxPixels) {
   const auto bad = [](const std::string& why) {
     return PictureFileError("The file is not a valid GIF picture (" + why + ")");
   };
@@ -324,7 +330,21 @@ std::vector<std::uint8_t> GifWithFittedScreen(Bytes data, std::int64_t maxPixels
     std::uint8_t* place = fitted.data() + at + 1;
     Put16(place, static_cast<std::uint16_t>(frameLeft));
     Put16(place, static_cast<std::uint16_t>(frameTop));
-    return fitted;
+    return {std::move(fitted), frameLeft, frameTop, frameWidth, frameHeight};
+  }
+}
+
+// Qt fills the screen around the first frame with the background colour unless the frame has
+// a transparent colour. The background colour is a relic that browsers and other readers
+// ignore: the screen outside the frame is transparent, as with a transparent colour.
+void ClearOutside(TBitmap32& screen, const FittedGif& frame) {
+  for (int y = 0; y < screen.Height(); ++y) {
+    Pixel* row = screen.ScanLine(y);
+    const bool rowInside = y >= frame.top && y < frame.top + frame.height;
+    for (int x = 0; x < screen.Width(); ++x) {
+      if (rowInside && x >= frame.left && x < frame.left + frame.width) continue;
+      row[x] = Pixel{0, 0, 0, 0};
+    }
   }
 }
 
@@ -336,10 +356,10 @@ TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
   if (data.size() > static_cast<std::size_t>(std::numeric_limits<int>::max())) {
     throw PictureFileError(std::string("The ") + family + " file is too large");
   }
-  std::vector<std::uint8_t> fittedGif;
+  FittedGif fittedGif;
   if (format == QtFormat::kGif) {
     fittedGif = GifWithFittedScreen(data, maxPixels);
-    data = fittedGif;
+    data = fittedGif.bytes;
   }
   // The reader only looks at the bytes; no copy is made.
   const QByteArray bytes = QByteArray::fromRawData(reinterpret_cast<const char*>(data.data()),
@@ -387,6 +407,7 @@ TBitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels) {
   for (int y = 0; y < image.height(); ++y) {
     std::memcpy(result.ScanLine(y), image.constScanLine(y), rowBytes);
   }
+  if (format == QtFormat::kGif) ClearOutside(result, fittedGif);
   if (format != QtFormat::kBitmap) CompositeOverWhite(result);
   return result;
 }
