@@ -112,4 +112,9 @@ TBitmap32 DecodePng(Bytes data, std::int64_t maxPixels = MaxPicturePixels());
 // "metafile"), or "" when none is recognised.
 std::string SniffFamily(Bytes data);
 
+// A picture whose type is known only from its content, as standard input gives it: decoded by
+// the decoder of the family SniffFamily finds. Throws PictureFileError for an unknown family and
+// as each decoder does.
+TBitmap32 DecodeByContent(Bytes data, std::int64_t maxPixels = MaxPicturePixels());
+
 }  // namespace quillane::codecs

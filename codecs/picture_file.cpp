@@ -111,6 +111,17 @@ std::string SniffFamily(Bytes data) {
   return "";
 }
 
+TBitmap32 DecodeByContent(Bytes data, std::int64_t maxPixels) {
+  const std::string family = SniffFamily(data);
+  if (family == "JPEG") return DecodeJpeg(data, maxPixels);
+  if (family == "PNG") return DecodePng(data, maxPixels);
+  if (family == "GIF") return DecodeWithQt(data, QtFormat::kGif, maxPixels);
+  if (family == "bitmap") return DecodeWithQt(data, QtFormat::kBitmap, maxPixels);
+  if (family == "icon") return DecodeWithQt(data, QtFormat::kIcon, maxPixels);
+  if (family == "metafile") return DecodeMetafile(data, maxPixels);
+  throw PictureFileError("The data is not a picture of any type the program reads");
+}
+
 std::uint64_t Dib24BitsSize(const TBitmap32& picture) {
   const std::uint64_t stride = (static_cast<std::uint64_t>(picture.Width()) * 3 + 3) / 4 * 4;
   return stride * static_cast<std::uint64_t>(picture.Height());

@@ -136,5 +136,26 @@ TEST_F(CraftedSizes, LimitIsTheOneSetAndItsMessageSaysHowToRaiseIt) {
   EXPECT_EQ(MaxPicturePixels(), TBitmap32::kMaxPixels);
 }
 
+// Standard input has no name: the content alone chooses the decoder, with its checks.
+TEST(DecodeByContent, ChoosesTheDecoderByTheFirstBytes) {
+  const TBitmap32 blue(5, 4, kBlue);
+  codecs::MemorySink bmp;
+  codecs::EncodeBitmap24(blue, bmp);
+  for (const std::vector<std::uint8_t>& bytes :
+       {codecs::EncodePng(blue), codecs::EncodeJpeg(blue, 100), bmp.bytes()}) {
+    const TBitmap32 p = codecs::DecodeByContent(bytes);
+    ASSERT_EQ(p.Width(), 5);
+    EXPECT_NEAR(p.At(4, 3).b, 255, 2);
+  }
+  EXPECT_TRUE(Contains(ErrorOf([] {
+                         codecs::DecodeByContent(PngFile(16384, 16384, {0, 0}));
+                       }),
+                       "cannot hold"));
+  EXPECT_TRUE(Contains(ErrorOf([] {
+                         codecs::DecodeByContent(std::vector<std::uint8_t>{'t', 'e', 'x', 't'});
+                       }),
+                       "not a picture of any type the program reads"));
+}
+
 }  // namespace
 }  // namespace quillane::testing
