@@ -90,6 +90,8 @@ void OutputMessage(j_common_ptr) {}
 // crafted file of hundreds of scans over a large picture (minutes of work from 10 KB) is refused
 // before the decoder starts.
 constexpr std::uint64_t kMostVisitsPerBlock = 32;
+// Visits that cost nothing worth refusing a file for (a few tens of milliseconds).
+constexpr std::uint64_t kFreeBlockVisits = std::uint64_t{1} << 20;
 // Arithmetic coding can give a block of one flat colour in a small fraction of a bit, so a file
 // is only asked for one byte per this many blocks of its first component: a flat picture of
 // 16000 by 16000 pixels needs 4 KB, and no photograph comes near.
@@ -157,7 +159,7 @@ std::string EvidenceProblem(Bytes data, const jpeg_decompress_struct& cinfo) {
         std::uint64_t{cinfo.comp_info[c].width_in_blocks} * cinfo.comp_info[c].height_in_blocks;
   int scans = 0;
   const std::uint64_t visits = ScanBlockVisits(data, cinfo, scans);
-  if (scans > kMaxScans || visits > kMostVisitsPerBlock * allBlocks) {
+  if (scans > kMaxScans || visits > std::max(kFreeBlockVisits, kMostVisitsPerBlock * allBlocks)) {
     return "The JPEG file is damaged (its " + std::to_string(scans) +
            " progressive scans go over " + picture + " more often than any encoder writes)";
   }
