@@ -97,70 +97,80 @@ constexpr std::uint64_t kFreeBlockVisits = std::uint64_t{1} << 20;
 // 16000 by 16000 pixels needs 4 KB, and no photograph comes near.
 constexpr std::uint64_t kArithmeticBlocksPerByte = 1024;
 
-// The blocks the scans of the file visit in all, walking its markers: each start of scan names
-// its components, and entropy-coded data runs up to the next marker that is not a restart.
-// Also counts the scans.
-std::uint64_t ScanBlockVisits(Bytes data, const jpeg_decompress_struct& cinfo, int& scans) {
-  std::uint64_t visits = 0;
-  scans = 0;
+// What the scans of a file hold, found by walking its markers: each start of scan names its
+// components, and entropy-coded data runs up to the next marker that is not a restart.
+struct ScanSurvey {
+  int scans = 0;
+  std::uint64_t blockVisits = 0;   // blocks of the components each scan names, summed
+  std::uint64_t entropyBytes = 0;  // coded data, not counting headers, tables or metadata
+};
+
+ScanSurvey SurveyScans(Bytes data, const jpeg_decompress_struct& cinfo) {
+  ScanSurvey survey;
   std::size_t at = 2;  // after the start of image
   while (at + 4 <= data.size()) {
-    if (data[at] != 0xFF) return visits;
+    if (data[at] != 0xFF) {  // stray bytes between segments, which libjpeg skips as well
+      ++at;
+      continue;
+    }
     const std::uint8_t marker = data[at + 1];
     if (marker == 0xFF) {  // fill byte
       ++at;
       continue;
     }
-    if (marker == 0xD9) return visits;  // end of image
-    if (marker == 0x01 || (marker >= 0xD0 && marker <= 0xD8)) {
+    if (marker == 0xD9) break;  // end of image
+    if (marker == 0x00 || marker == 0x01 || (marker >= 0xD0 && marker <= 0xD8)) {
       at += 2;
       continue;
     }
     const std::size_t length = std::size_t{data[at + 2]} << 8 | data[at + 3];
-    if (marker == 0xDA && length >= 3 && at + 4 < data.size()) {
-      ++scans;
-      const unsigned count = data[at + 4];
-      for (unsigned i = 0; i < count && at + 5 + 2 * i < data.size(); ++i) {
-        const int id = data[at + 5 + 2 * i];
-        for (int c = 0; c < cinfo.num_components; ++c) {
-          const jpeg_component_info& comp = cinfo.comp_info[c];
-          if (comp.component_id == id)
-            visits += std::uint64_t{comp.width_in_blocks} * comp.height_in_blocks;
-        }
-      }
-      at += 2 + length;
-      while (at + 1 < data.size() && !(data[at] == 0xFF && data[at + 1] != 0 &&
-                                       (data[at + 1] < 0xD0 || data[at + 1] > 0xD7)))
-        ++at;
-      continue;
-    }
     at += 2 + length;
+    if (marker != 0xDA || length < 3) continue;
+    ++survey.scans;
+    const std::size_t header = at - length + 2;  // the component count, after the length
+    if (header >= data.size()) break;
+    const unsigned count = data[header];
+    for (unsigned i = 0; i < count && header + 1 + 2 * i < std::min(at, data.size()); ++i) {
+      const int id = data[header + 1 + 2 * i];
+      for (int c = 0; c < cinfo.num_components; ++c) {
+        const jpeg_component_info& comp = cinfo.comp_info[c];
+        if (comp.component_id == id)
+          survey.blockVisits += std::uint64_t{comp.width_in_blocks} * comp.height_in_blocks;
+      }
+    }
+    const std::size_t dataStart = std::min(at, data.size());
+    while (at + 1 < data.size() &&
+           !(data[at] == 0xFF && data[at + 1] != 0 && (data[at + 1] < 0xD0 || data[at + 1] > 0xD7)))
+      ++at;
+    at = std::min(at + (at + 1 >= data.size() ? 1 : 0), data.size());
+    survey.entropyBytes += at - dataStart;
   }
-  return visits;
+  return survey;
 }
 
 // What makes the file unable to hold the picture its header announces, or "" when it can. Runs
-// before anything of the picture's size is allocated.
+// before anything of the picture's size is allocated. Only coded data counts: metadata such as
+// a large profile or thumbnail says nothing about the picture.
 std::string EvidenceProblem(Bytes data, const jpeg_decompress_struct& cinfo) {
   const std::string picture = "a picture of " + std::to_string(cinfo.image_width) + " by " +
                               std::to_string(cinfo.image_height) + " pixels";
+  const ScanSurvey survey = SurveyScans(data, cinfo);
   const std::uint64_t blocks =
       std::uint64_t{cinfo.comp_info[0].width_in_blocks} * cinfo.comp_info[0].height_in_blocks;
   // Huffman coding spends at least one bit on every block of the first component.
   const std::uint64_t blocksPerByte = cinfo.arith_code ? kArithmeticBlocksPerByte : 8;
-  if (data.size() < blocks / blocksPerByte) {
-    return "The JPEG file is truncated (" + std::to_string(data.size()) + " bytes cannot hold " +
-           picture + ")";
+  if (survey.entropyBytes < blocks / blocksPerByte) {
+    return "The JPEG file is truncated (" + std::to_string(survey.entropyBytes) +
+           " bytes of picture data cannot hold " + picture + ")";
   }
   if (!cinfo.progressive_mode) return {};
   std::uint64_t allBlocks = 0;
   for (int c = 0; c < cinfo.num_components; ++c)
     allBlocks +=
         std::uint64_t{cinfo.comp_info[c].width_in_blocks} * cinfo.comp_info[c].height_in_blocks;
-  int scans = 0;
-  const std::uint64_t visits = ScanBlockVisits(data, cinfo, scans);
-  if (scans > kMaxScans || visits > std::max(kFreeBlockVisits, kMostVisitsPerBlock * allBlocks)) {
-    return "The JPEG file is damaged (its " + std::to_string(scans) +
+  if (survey.scans > kMaxScans ||
+      survey.blockVisits > std::max(kFreeBlockVisits, kMostVisitsPerBlock * allBlocks)) {
+    return "The JPEG file is damaged (its " + std::to_string(survey.scans) +
            " progressive scans go over " + picture + " more often than any encoder writes)";
   }
   return {};

@@ -205,6 +205,16 @@ TEST(JpegDecoder, RefusesHugeEmptyShortAndBrokenFiles) {
   EXPECT_EQ(DecodeJpeg(file, 4096).Width(), 64);
 }
 
+// The file with a segment of marker and size bytes of zeros after its start-of-image marker.
+std::vector<std::uint8_t> WithSegment(std::vector<std::uint8_t> file, std::uint8_t marker,
+                                      std::size_t size) {
+  std::vector<std::uint8_t> segment = {0xFF, marker, static_cast<std::uint8_t>((size + 2) >> 8),
+                                       static_cast<std::uint8_t>(size + 2)};
+  segment.resize(4 + size, 0);
+  file.insert(file.begin() + 2, segment.begin(), segment.end());
+  return file;
+}
+
 // Arithmetic coding can hold a flat block in a sliver of a bit, so the one-bit-a-block rule of
 // Huffman coding never applied to it, and a 139-byte file opened as 16000 x 16000 pixels; a
 // progressive file of hundreds of scans took minutes. Each is refused before anything large is
@@ -223,6 +233,11 @@ TEST_F(JpegEvidence, ArithmeticAndManyScannedFilesMustHoldTheirPicture) {
   const std::vector<std::uint8_t> arithmeticFile = WriteJpeg(64, 64, arithmetic, rgb);
   const std::pair<std::vector<std::uint8_t>, const char*> cases[] = {
       {WithFrameSize(WriteJpeg(16, 16, arithmetic, flat), 16000, 16000), "cannot hold"},
+      // Metadata is no picture data: a large profile or thumbnail makes no difference.
+      {WithSegment(WithFrameSize(WriteJpeg(16, 16, arithmetic, flat), 16000, 16000), 0xE2, 60'000),
+       "cannot hold"},
+      {WithSegment(WithFrameSize(WriteJpeg(16, 16, {}, flat), 4000, 4000), 0xE1, 60'000),
+       "cannot hold"},
       {WithFrameSize(WriteJpeg(16, 16, progressiveArithmetic, flat), 16384, 16384), "cannot hold"},
       {WriteJpeg(1024, 1024, {.progressive = true, .arithmetic = true, .scans = manyScans}, flat),
        "190 progressive scans"},
@@ -250,7 +265,8 @@ TEST_F(JpegEvidence, ArithmeticAndManyScannedFilesMustHoldTheirPicture) {
 TEST(JpegDecoder, PictureBeyondTheAvailableMemorySaysWhatItNeeds) {
   QUILLANE_SKIP_UNDER_ADDRESS_LIMIT();
   auto big = WithFrameSize(WriteJpeg(16, 16, {}, [](int, int, int) { return 9; }), 7000, 7000);
-  big.resize(big.size() + 100'000);  // as long as a file of so many blocks must be
+  // As much coded data as a picture of so many blocks needs at least.
+  big.insert(big.end() - 2, 100'000, 0);
   EXPECT_EXIT(
       {
         LimitAddressSpaceGrowth(std::uint64_t{300} << 20);
