@@ -330,6 +330,44 @@ ParseResult ParseGallery(const std::vector<std::string>& args) {
   return result;
 }
 
+// "--max-pixels N" or "--max-pixels=N" anywhere before "--" in the arguments of a command that
+// reads pictures: taken out into maxPixels, the other arguments left in rest. An error text
+// for a bad or repeated value.
+std::string TakeMaxPixels(const std::vector<std::string>& args, std::vector<std::string>& rest,
+                          std::int64_t& maxPixels) {
+  const std::string name = "--max-pixels";
+  bool optionsEnded = false;
+  for (std::size_t i = 0; i < args.size(); ++i) {
+    const std::string& arg = args[i];
+    if (arg == "--") optionsEnded = true;
+    std::optional<std::string> value;
+    if (optionsEnded || i == 0 || arg.compare(0, name.size(), name) != 0) {
+      rest.push_back(arg);
+      continue;
+    }
+    if (arg == name) {
+      if (i + 1 < args.size()) value = args[++i];
+    } else if (arg[name.size()] == '=') {
+      value = arg.substr(name.size() + 1);
+    } else {
+      rest.push_back(arg);  // another option that starts alike
+      continue;
+    }
+    const std::string range = "from 1 to " + std::to_string(Bitmap32::kMaxPixels);
+    std::int64_t pixels = 0;
+    const char* end = value ? value->data() + value->size() : nullptr;
+    const auto read =
+        value ? std::from_chars(value->data(), end, pixels) : std::from_chars_result{};
+    if (!value || value->empty() || read.ec != std::errc() || read.ptr != end || pixels < 1 ||
+        pixels > Bitmap32::kMaxPixels)
+      return name + " must be a whole number of pixels " + range +
+             (value ? ", not '" + *value + "'" : std::string());
+    if (maxPixels != 0) return name + " given twice";
+    maxPixels = pixels;
+  }
+  return {};
+}
+
 }  // namespace
 
 OutputType OutputTypeFor(const std::string& path) {
@@ -349,6 +387,18 @@ ParseResult ParseCommandLine(const std::vector<std::string>& args) {
   if (args.empty()) return Fail("no command given (quillane-cli --help shows the usage)");
 
   const std::string& verb = args[0];
+  if (verb == "apply" || verb == "batch" || verb == "gallery" || verb == "rotate" ||
+      verb == "resize" || verb == "convert") {
+    std::vector<std::string> rest;
+    std::int64_t maxPixels = 0;
+    if (std::string error = TakeMaxPixels(args, rest, maxPixels); !error.empty())
+      return Fail(error);
+    if (maxPixels != 0) {
+      ParseResult result = ParseCommandLine(rest);
+      result.options.maxPixels = maxPixels;
+      return result;
+    }
+  }
   if (verb == "--version" || verb == "-V") {
     if (args.size() > 1) return Fail("--version takes no arguments");
     return Plain(Command::Version);
@@ -417,6 +467,10 @@ unset ones keep their defaults; each may be given once. Values may also be writt
 the random generator that brume draws from where N says, as the program starts it at 0;
 the same seed, picture and settings give the same result, and a batch continues the
 sequence from one picture to the next.
+
+Pictures of more than 200000000 pixels are refused (the largest cameras write about 150
+million); --max-pixels N, given to any command that reads pictures, sets another limit,
+from 1 to 268435456 pixels, the most a picture can have.
 
 Examples:
   quillane-cli apply pencil-sketch --contrast 60 photo.jpg -o sketch.png

@@ -53,6 +53,8 @@ struct Options {
   QuarterTurn turn = QuarterTurn::Clockwise;
   int width = 0;
   int height = 0;
+  // --max-pixels: the largest picture the decoders accept; 0 leaves the program's default.
+  std::int64_t maxPixels = 0;
 };
 
 struct ParseResult {

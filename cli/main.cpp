@@ -8,6 +8,7 @@
 
 #include "cli/cli_commands.h"
 #include "cli/cli_options.h"
+#include "codecs/picture_file.h"
 #include "imaging/picture_memory.h"
 
 namespace {
@@ -34,5 +35,6 @@ int main(int argc, char** argv) {
     std::cerr << "quillane-cli: " << parsed.error << "\n";
     return parsed.exitCode;
   }
+  if (parsed.options.maxPixels > 0) quillane::SetMaxPicturePixels(parsed.options.maxPixels);
   return RunCommand(parsed.options, std::cout, std::cerr, isatty(STDERR_FILENO) == 1);
 }

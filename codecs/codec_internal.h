@@ -36,12 +36,15 @@ class MemorySink : public ByteSink {
 
 // Every decoder refuses a picture of more than maxPixels (or of a width or height of 0 or
 // below) from its header, before any pixel memory is allocated, and throws PictureFileError
-// for anything it cannot read completely.
+// for anything it cannot read completely. Before that, each checks that the file holds enough
+// data for the picture its header announces (run-length bitmap data, a GIF frame's LZW data, a
+// JPEG's entropy-coded data and scans, a PNG's compressed rows) and refuses it as damaged or
+// truncated when it cannot, so that a few bytes never cost gigabytes or minutes.
 
 // JPEG through libjpeg-turbo: baseline, progressive, grayscale, RGB, CMYK and YCCK (Adobe
 // files store inverted inks; both forms give the right colours). Alpha is 255. The picture is
 // stood upright by the EXIF Orientation tag (exif_orientation.h) when the file has one.
-Bitmap32 DecodeJpeg(Bytes data, std::int64_t maxPixels = Bitmap32::kMaxPixels);
+Bitmap32 DecodeJpeg(Bytes data, std::int64_t maxPixels = MaxPicturePixels());
 
 // The formats read through Qt's image readers, each with its own reader only (the content is
 // not sniffed, so a PNG named .bmp is refused as a bad bitmap).
@@ -53,7 +56,7 @@ enum class QtFormat {
 // For icons and GIFs, transparent and partly transparent pixels are composited over white (the
 // background a freshly made bitmap shows); the alpha bytes are returned as the decoder gives
 // them. Bitmaps keep their stored colours and alpha.
-Bitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels = Bitmap32::kMaxPixels);
+Bitmap32 DecodeWithQt(Bytes data, QtFormat format, std::int64_t maxPixels = MaxPicturePixels());
 // For a 16-bit bitmap (BI_RGB 5-5-5, BI_BITFIELDS or BI_ALPHABITFIELDS) that Qt has decoded
 // into picture, takes every pixel again from data with each field widened to the full range
 // (bitmap16.cpp says how); any other file is left as it is.
@@ -64,10 +67,10 @@ void WidenSixteenBitBitmap(Bytes data, Bitmap32& picture);
 // or not). The picture is played onto a white background; alpha is 255. Windows metafiles, and
 // enhanced metafiles with more than bitmaps in them, are drawn in a separate, limited process
 // (codecs/metafile_render.h); a file that keeps it drawing too long is refused.
-Bitmap32 DecodeMetafile(Bytes data, std::int64_t maxPixels = Bitmap32::kMaxPixels);
+Bitmap32 DecodeMetafile(Bytes data, std::int64_t maxPixels = MaxPicturePixels());
 bool LooksLikeEnhancedMetafile(Bytes data);
-Bitmap32 DecodeEnhancedMetafile(Bytes data, std::int64_t maxPixels = Bitmap32::kMaxPixels);
-Bitmap32 DecodeWindowsMetafile(Bytes data, std::int64_t maxPixels = Bitmap32::kMaxPixels);
+Bitmap32 DecodeEnhancedMetafile(Bytes data, std::int64_t maxPixels = MaxPicturePixels());
+Bitmap32 DecodeWindowsMetafile(Bytes data, std::int64_t maxPixels = MaxPicturePixels());
 
 // Encoders. quality is clamped to 1..100.
 std::vector<std::uint8_t> EncodeJpeg(const Bitmap32& picture, int quality);
@@ -108,10 +111,15 @@ void CheckPictureSize(std::int64_t width, std::int64_t height, std::int64_t maxP
 
 // PNG through libpng's simplified reader, alpha kept as stored (not premultiplied). libpng's
 // complaints become the error message; none goes to the terminal.
-Bitmap32 DecodePng(Bytes data, std::int64_t maxPixels = Bitmap32::kMaxPixels);
+Bitmap32 DecodePng(Bytes data, std::int64_t maxPixels = MaxPicturePixels());
 
 // The family a file's first bytes belong to ("JPEG", "PNG", "GIF", "bitmap", "icon",
 // "metafile"), or "" when none is recognised.
 std::string SniffFamily(Bytes data);
+
+// A picture whose type is known only from its content, as standard input gives it: decoded by
+// the decoder of the family SniffFamily finds. Throws PictureFileError for an unknown family and
+// as each decoder does.
+Bitmap32 DecodeByContent(Bytes data, std::int64_t maxPixels = MaxPicturePixels());
 
 }  // namespace quillane::codecs

@@ -11,7 +11,10 @@
 
 #include <algorithm>
 #include <cerrno>
+#include <cstring>
 #include <utility>
+
+#include "codecs/helper_parent.h"
 
 extern char** environ;
 
@@ -163,12 +166,23 @@ HelperEnding RunHelper(const std::string& program, const std::vector<std::string
   argv.push_back(const_cast<char*>(program.c_str()));
   for (const std::string& argument : arguments) argv.push_back(const_cast<char*>(argument.c_str()));
   argv.push_back(nullptr);
+  // The child's environment is ours with our process id added, for DieWithParent.
+  const std::string parent = std::string(kHelperParentVariable) + "=" + std::to_string(::getpid());
+  std::vector<char*> environment;
+  const std::size_t nameLength = std::strlen(kHelperParentVariable);
+  for (char** entry = environ; entry != nullptr && *entry != nullptr; ++entry) {
+    if (std::strncmp(*entry, kHelperParentVariable, nameLength) == 0 && (*entry)[nameLength] == '=')
+      continue;
+    environment.push_back(*entry);
+  }
+  environment.push_back(const_cast<char*>(parent.c_str()));
+  environment.push_back(nullptr);
   pid_t pid = 0;
   {
     SpawnSetup setup(inputTheirs.get(), outputTheirs.get());
     if (setup.failed != 0) return NotStarted(setup.failed);
     const int failed = ::posix_spawn(&pid, program.c_str(), &setup.actions, &setup.attributes,
-                                     argv.data(), environ);
+                                     argv.data(), environment.data());
     if (failed != 0) return NotStarted(failed);
   }
   Child child(pid);

@@ -43,7 +43,8 @@ struct HelperEnding {
 // until timeout has passed, when the child is killed. The child's standard error goes to
 // /dev/null (libraries chatter there on hostile input, and the child may not be allowed to write
 // files); it starts with no blocked signals and default dispositions for the signals that matter
-// to it.
+// to it, and with this process's id in its environment (helper_parent.h) so that it can arrange
+// to die with us.
 HelperEnding RunHelper(const std::string& program, const std::vector<std::string>& arguments,
                        Bytes input, std::chrono::milliseconds timeout, HelperOutput& output);
 

@@ -61,6 +61,10 @@ void EmitMessage(j_common_ptr cinfo, int level) {
   switch (cinfo->err->msg_code) {
     case JWRN_JPEG_EOF:
       if (!err->headerRead) Fail(cinfo, "The JPEG file is truncated (it ends inside its header)");
+      // The arithmetic decoder reads on past the data as zeros without a word, so the end of
+      // the file before the last row is the only sign of loss it gives.
+      if (reinterpret_cast<j_decompress_ptr>(cinfo)->arith_code && !err->allRowsRead)
+        Fail(cinfo, "The JPEG file is truncated (premature end of data)");
       err->dataEnded = true;
       break;
     case JWRN_HIT_MARKER:
@@ -71,6 +75,9 @@ void EmitMessage(j_common_ptr cinfo, int level) {
       if (cinfo->err->msg_parm.i[1] == 0xD9) break;
       [[fallthrough]];
     case JWRN_MUST_RESYNC:
+    case JWRN_HUFF_BAD_CODE:
+    case JWRN_ARITH_BAD_CODE:
+    case JWRN_BOGUS_PROGRESSION:
       if (!err->allRowsRead) Fail(cinfo, "The JPEG file is damaged (corrupt data)");
       break;
     default:
@@ -89,6 +96,97 @@ int OrientationOf(const jpeg_decompress_struct& cinfo) {
       return ExifOrientation(Bytes(m->data, m->data_length));
   }
   return 1;
+}
+
+// Times each block may be visited by the scans of a progressive file: the usual scan script goes
+// over a 4:2:0 picture's blocks about five times, so 32 leaves room for any real encoder while a
+// crafted file of hundreds of scans over a large picture (minutes of work from 10 KB) is refused
+// before the decoder starts.
+constexpr std::uint64_t kMostVisitsPerBlock = 32;
+// Visits that cost nothing worth refusing a file for (a few tens of milliseconds).
+constexpr std::uint64_t kFreeBlockVisits = std::uint64_t{1} << 20;
+// Arithmetic coding can give a block of one flat colour in a small fraction of a bit, so a file
+// is only asked for one byte per this many blocks of its first component: a flat picture of
+// 16000 by 16000 pixels needs 4 KB, and no photograph comes near.
+constexpr std::uint64_t kArithmeticBlocksPerByte = 1024;
+
+// What the scans of a file hold, found by walking its markers: each start of scan names its
+// components, and entropy-coded data runs up to the next marker that is not a restart.
+struct ScanSurvey {
+  int scans = 0;
+  std::uint64_t blockVisits = 0;   // blocks of the components each scan names, summed
+  std::uint64_t entropyBytes = 0;  // coded data, not counting headers, tables or metadata
+};
+
+ScanSurvey SurveyScans(Bytes data, const jpeg_decompress_struct& cinfo) {
+  ScanSurvey survey;
+  std::size_t at = 2;  // after the start of image
+  while (at + 4 <= data.size()) {
+    if (data[at] != 0xFF) {  // stray bytes between segments, which libjpeg skips as well
+      ++at;
+      continue;
+    }
+    const std::uint8_t marker = data[at + 1];
+    if (marker == 0xFF) {  // fill byte
+      ++at;
+      continue;
+    }
+    if (marker == 0xD9) break;  // end of image
+    if (marker == 0x00 || marker == 0x01 || (marker >= 0xD0 && marker <= 0xD8)) {
+      at += 2;
+      continue;
+    }
+    const std::size_t length = std::size_t{data[at + 2]} << 8 | data[at + 3];
+    at += 2 + length;
+    if (marker != 0xDA || length < 3) continue;
+    ++survey.scans;
+    const std::size_t header = at - length + 2;  // the component count, after the length
+    if (header >= data.size()) break;
+    const unsigned count = data[header];
+    for (unsigned i = 0; i < count && header + 1 + 2 * i < std::min(at, data.size()); ++i) {
+      const int id = data[header + 1 + 2 * i];
+      for (int c = 0; c < cinfo.num_components; ++c) {
+        const jpeg_component_info& comp = cinfo.comp_info[c];
+        if (comp.component_id == id)
+          survey.blockVisits += std::uint64_t{comp.width_in_blocks} * comp.height_in_blocks;
+      }
+    }
+    const std::size_t dataStart = std::min(at, data.size());
+    while (at + 1 < data.size() &&
+           !(data[at] == 0xFF && data[at + 1] != 0 && (data[at + 1] < 0xD0 || data[at + 1] > 0xD7)))
+      ++at;
+    at = std::min(at + (at + 1 >= data.size() ? 1 : 0), data.size());
+    survey.entropyBytes += at - dataStart;
+  }
+  return survey;
+}
+
+// What makes the file unable to hold the picture its header announces, or "" when it can. Runs
+// before anything of the picture's size is allocated. Only coded data counts: metadata such as
+// a large profile or thumbnail says nothing about the picture.
+std::string EvidenceProblem(Bytes data, const jpeg_decompress_struct& cinfo) {
+  const std::string picture = "a picture of " + std::to_string(cinfo.image_width) + " by " +
+                              std::to_string(cinfo.image_height) + " pixels";
+  const ScanSurvey survey = SurveyScans(data, cinfo);
+  const std::uint64_t blocks =
+      std::uint64_t{cinfo.comp_info[0].width_in_blocks} * cinfo.comp_info[0].height_in_blocks;
+  // Huffman coding spends at least one bit on every block of the first component.
+  const std::uint64_t blocksPerByte = cinfo.arith_code ? kArithmeticBlocksPerByte : 8;
+  if (survey.entropyBytes < blocks / blocksPerByte) {
+    return "The JPEG file is truncated (" + std::to_string(survey.entropyBytes) +
+           " bytes of picture data cannot hold " + picture + ")";
+  }
+  if (!cinfo.progressive_mode) return {};
+  std::uint64_t allBlocks = 0;
+  for (int c = 0; c < cinfo.num_components; ++c)
+    allBlocks +=
+        std::uint64_t{cinfo.comp_info[c].width_in_blocks} * cinfo.comp_info[c].height_in_blocks;
+  if (survey.scans > kMaxScans ||
+      survey.blockVisits > std::max(kFreeBlockVisits, kMostVisitsPerBlock * allBlocks)) {
+    return "The JPEG file is damaged (its " + std::to_string(survey.scans) +
+           " progressive scans go over " + picture + " more often than any encoder writes)";
+  }
+  return {};
 }
 
 void LimitScans(j_common_ptr cinfo) {
@@ -141,6 +239,10 @@ bool RunDecoder(Decompressor& d, Bytes data, std::int64_t maxPixels, Bitmap32& r
 
   const std::int64_t width = d.cinfo.image_width;
   const std::int64_t height = d.cinfo.image_height;
+  // A file too short for the picture its header announces is refused before a huge picture is
+  // allocated and decoded from a few bytes.
+  sizeProblem = EvidenceProblem(data, d.cinfo);
+  if (!sizeProblem.empty()) return true;
   // A progressive file is decoded into a coefficient buffer of two bytes per sample first.
   // Standing a picture upright across its diagonal copies it once more.
   const int extraBytesPerPixel = (d.cinfo.progressive_mode ? 2 * d.cinfo.num_components : 0) +
@@ -149,17 +251,6 @@ bool RunDecoder(Decompressor& d, Bytes data, std::int64_t maxPixels, Bitmap32& r
     CheckPictureSize(width, height, maxPixels, "JPEG", extraBytesPerPixel);
   } catch (const PictureFileError& e) {
     sizeProblem = e.what();
-    return true;
-  }
-  // Huffman coding spends at least one bit on every block of the first component, so a file
-  // shorter than that cannot hold the picture its header announces; refusing it here spares
-  // allocating and decoding a huge picture from a few kilobytes.
-  const std::uint64_t blocks =
-      std::uint64_t{d.cinfo.comp_info[0].width_in_blocks} * d.cinfo.comp_info[0].height_in_blocks;
-  if (!d.cinfo.arith_code && data.size() < blocks / 8) {
-    sizeProblem = "The JPEG file is truncated (" + std::to_string(data.size()) +
-                  " bytes cannot hold a picture of " + std::to_string(width) + " by " +
-                  std::to_string(height) + " pixels)";
     return true;
   }
   const bool inks = d.cinfo.jpeg_color_space == JCS_CMYK || d.cinfo.jpeg_color_space == JCS_YCCK;

@@ -5,6 +5,7 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <atomic>
 #include <cerrno>
 #include <cstring>
 #include <new>
@@ -14,6 +15,21 @@
 #include "imaging/memory_budget.h"
 
 namespace quillane {
+namespace {
+
+std::atomic<std::int64_t> maxPicturePixels{kDefaultMaxPicturePixels};
+
+}  // namespace
+
+std::int64_t MaxPicturePixels() {
+  return maxPicturePixels.load(std::memory_order_relaxed);
+}
+
+void SetMaxPicturePixels(std::int64_t pixels) {
+  maxPicturePixels.store(std::clamp<std::int64_t>(pixels, 1, Bitmap32::kMaxPixels),
+                         std::memory_order_relaxed);
+}
+
 namespace codecs {
 
 void CheckPictureSize(std::int64_t width, std::int64_t height, std::int64_t maxPixels,
@@ -25,9 +41,17 @@ void CheckPictureSize(std::int64_t width, std::int64_t height, std::int64_t maxP
   }
   // Each side is at most 2^32 here, so the product cannot overflow.
   if (width > 0xFFFFFFFFll || height > 0xFFFFFFFFll || width * height > maxPixels) {
+    // Only a limit below what a bitmap can hold can be raised.
+    const bool fitsBitmap = width <= Bitmap32::kMaxPixels && height <= Bitmap32::kMaxPixels &&
+                            width * height <= Bitmap32::kMaxPixels;
+    const std::string raise =
+        maxPixels < Bitmap32::kMaxPixels && fitsBitmap
+            ? " (quillane-cli --max-pixels " + std::to_string(width * height) +
+                  " raises the limit, up to " + std::to_string(Bitmap32::kMaxPixels) + ")"
+            : std::string();
     throw PictureFileError(std::string("The ") + what + " picture is " + size +
                            " pixels, more than the " + std::to_string(maxPixels) +
-                           " pixels a picture may have");
+                           " pixels a picture may have" + raise);
   }
   try {
     CheckMemoryFor(width, height, std::string("The ") + what + " picture", extraBytesPerPixel);
@@ -85,6 +109,17 @@ std::string SniffFamily(Bytes data) {
       LooksLikeEnhancedMetafile(data))
     return "metafile";
   return "";
+}
+
+Bitmap32 DecodeByContent(Bytes data, std::int64_t maxPixels) {
+  const std::string family = SniffFamily(data);
+  if (family == "JPEG") return DecodeJpeg(data, maxPixels);
+  if (family == "PNG") return DecodePng(data, maxPixels);
+  if (family == "GIF") return DecodeWithQt(data, QtFormat::kGif, maxPixels);
+  if (family == "bitmap") return DecodeWithQt(data, QtFormat::kBitmap, maxPixels);
+  if (family == "icon") return DecodeWithQt(data, QtFormat::kIcon, maxPixels);
+  if (family == "metafile") return DecodeMetafile(data, maxPixels);
+  throw PictureFileError("The data is not a picture of any type the program reads");
 }
 
 std::uint64_t Dib24BitsSize(const Bitmap32& picture) {

@@ -2,6 +2,7 @@
 // characters of the name; the writers never leave a half-written file behind.
 #pragma once
 
+#include <cstdint>
 #include <functional>
 #include <optional>
 #include <stdexcept>
@@ -19,6 +20,20 @@ class PictureFileError : public std::runtime_error {
   using std::runtime_error::runtime_error;
 };
 
+// The largest picture the decoders accept unless told otherwise, in pixels. The largest
+// single-shot cameras write about 151 million pixels (14204 by 10652, medium-format backs), and
+// 100 million is common among them; 200 million opens all of those, and stitched panoramas of
+// that size, with room to spare. A picture at the limit already needs 3.2 GB for the copies an
+// effect holds at once. Pixel-shift composites (240 to 400 million) and larger panoramas can be
+// let in with SetMaxPicturePixels (quillane-cli --max-pixels), up to Bitmap32::kMaxPixels, the
+// most a working bitmap can hold.
+inline constexpr std::int64_t kDefaultMaxPicturePixels = 200'000'000;
+
+// The limit every decoder applies by default, for the whole process. SetMaxPicturePixels takes
+// values from 1 to Bitmap32::kMaxPixels (others are clamped into that range).
+std::int64_t MaxPicturePixels();
+void SetMaxPicturePixels(std::int64_t pixels);
+
 // Receives the loader's own message boxes (caption, text): an icon that cannot be read.
 using LoaderNotice = std::function<void(const std::string& caption, const std::string& text)>;
 
@@ -29,7 +44,7 @@ using LoaderNotice = std::function<void(const std::string& caption, const std::s
 // - PictureFileError "<path> is not a picture file" for a folder, FIFO, device or socket;
 // - otherwise the decoded 32-bit picture. Its alpha bytes are whatever the decoder gives;
 //   callers set them to 255.
-// A corrupt file, a picture larger than Bitmap32::kMaxPixels or one that would not fit in the
+// A corrupt file, a picture larger than MaxPicturePixels() or one that would not fit in the
 // memory available (the message says how much it needs) throws PictureFileError; an
 // icon that cannot be read is reported through notice (caption "Exit") and gives an empty
 // bitmap.

@@ -18,6 +18,43 @@
 namespace quillane::codecs {
 namespace {
 
+std::uint32_t Big32(Bytes data, std::size_t at) {
+  return std::uint32_t{data[at]} << 24 | std::uint32_t{data[at + 1]} << 16 |
+         std::uint32_t{data[at + 2]} << 8 | data[at + 3];
+}
+
+// Deflate gives at most 1032 bytes for one (a run of 258 bytes costs at least two bits), so the
+// picture data of a PNG file can only hold rows of up to 1032 times its size. A file whose header
+// says 16384 by 16384 with 100 bytes of data was otherwise refused only after a gigabyte had been
+// filled. Throws when the IDAT chunks are too short for the rows the header announces (filter
+// bytes included; interlacing only adds to them).
+void CheckPngDataBacksPicture(Bytes data, std::uint64_t width, std::uint64_t height) {
+  constexpr std::uint64_t kDeflateMostPerByte = 1032;
+  constexpr std::uint64_t kZlibWrapping = 6;
+  std::uint64_t idat = 0;
+  unsigned depth = 8, channels = 4;
+  for (std::size_t at = 8; at + 8 <= data.size();) {
+    const std::uint64_t length = Big32(data, at);
+    const bool header = std::equal(data.begin() + at + 4, data.begin() + at + 8, "IHDR");
+    if (header && length >= 13 && at + 8 + 13 <= data.size()) {
+      depth = data[at + 8 + 8];
+      constexpr unsigned kChannels[7] = {1, 0, 3, 1, 2, 0, 4};
+      const unsigned type = data[at + 8 + 9];
+      channels = type < 7 && kChannels[type] > 0 ? kChannels[type] : 4;
+    }
+    if (std::equal(data.begin() + at + 4, data.begin() + at + 8, "IDAT")) idat += length;
+    at += 12 + length;
+  }
+  const std::uint64_t rowBytes = (width * depth * channels + 7) / 8 + 1;
+  // libpng refuses sides beyond a million pixels, so this cannot overflow.
+  const std::uint64_t rows = height * rowBytes;
+  if (idat <= kZlibWrapping || (idat - kZlibWrapping) * kDeflateMostPerByte < rows) {
+    throw PictureFileError("The PNG file is truncated (" + std::to_string(idat) +
+                           " bytes of picture data cannot hold a picture of " +
+                           std::to_string(width) + " by " + std::to_string(height) + " pixels)");
+  }
+}
+
 struct PngSource {
   Bytes data;
   std::size_t at = 0;
@@ -58,6 +95,8 @@ bool RunPngDecoder(PngReader& r, PngSource& source, std::int64_t maxPixels, Bitm
   const std::int64_t width = png_get_image_width(r.png, r.info);
   const std::int64_t height = png_get_image_height(r.png, r.info);
   try {
+    CheckPngDataBacksPicture(source.data, static_cast<std::uint64_t>(width),
+                             static_cast<std::uint64_t>(height));
     CheckPictureSize(width, height, maxPixels, "PNG");
   } catch (const PictureFileError& e) {
     sizeProblem = e.what();

@@ -1,11 +1,15 @@
 #include "codecs/render_child.h"
 
 #include <fcntl.h>
+#include <signal.h>
+#include <sys/prctl.h>
 #include <unistd.h>
 
 #include <algorithm>
 #include <cerrno>
 #include <cstdlib>
+
+#include "codecs/helper_parent.h"
 
 namespace quillane::codecs::render_child {
 namespace {
@@ -34,9 +38,19 @@ bool SetLimit(int resource, rlim_t soft, rlim_t hard) {
   return setrlimit(resource, &limit) == 0;
 }
 
+bool DieWithParent() {
+  if (::prctl(PR_SET_PDEATHSIG, SIGKILL) != 0) return false;
+  // The parent may have ended between starting us and the line above; we then belong to
+  // another process already, and no signal will come.
+  const char* starter = std::getenv(kHelperParentVariable);
+  std::uint64_t parent = 0;
+  if (starter == nullptr || !ParseCount(starter, 0x7FFFFFFF, parent)) return true;  // run by hand
+  return static_cast<std::uint64_t>(::getppid()) == parent;
+}
+
 bool LimitSelf(rlim_t cpuSoft, rlim_t cpuHard, std::uint64_t addressSpace) {
-  bool done = SetLimit(RLIMIT_CORE, 0, 0) && SetLimit(RLIMIT_CPU, cpuSoft, cpuHard) &&
-              SetLimit(RLIMIT_FSIZE, 0, 0);
+  bool done = DieWithParent() && SetLimit(RLIMIT_CORE, 0, 0) &&
+              SetLimit(RLIMIT_CPU, cpuSoft, cpuHard) && SetLimit(RLIMIT_FSIZE, 0, 0);
   if (!kAddressSanitizer) done = done && SetLimit(RLIMIT_AS, addressSpace, addressSpace);
   return done;
 }

@@ -16,10 +16,16 @@ namespace quillane::codecs::render_child {
 // Never above a limit the program was started with: only lowering is allowed.
 bool SetLimit(int resource, rlim_t soft, rlim_t hard);
 
-// No core dumps, no files written, cpuSoft then cpuHard seconds of CPU time (SIGXCPU, then
-// SIGKILL), and at most addressSpace bytes of memory. AddressSanitizer reserves terabytes of
-// address space for its shadow memory at start-up, so a sanitizer build relies on the CPU limit
-// and the sanitizer's own allocation checks only.
+// Has the kernel kill this process when the process that started it ends (a renderer killed
+// with its parent would otherwise draw on until its CPU limit), and checks that the starter,
+// named by RunHelper in the environment, has not ended already before that took effect. False
+// when it has or the request failed. Called by LimitSelf.
+bool DieWithParent();
+
+// Dies with the parent (above), no core dumps, no files written, cpuSoft then cpuHard seconds of
+// CPU time (SIGXCPU, then SIGKILL), and at most addressSpace bytes of memory. AddressSanitizer
+// reserves terabytes of address space for its shadow memory at start-up, so a sanitizer build
+// relies on the CPU limit and the sanitizer's own allocation checks only.
 bool LimitSelf(rlim_t cpuSoft, rlim_t cpuHard, std::uint64_t addressSpace);
 
 // Moves the reply channel off standard output, which then goes to /dev/null, so that a library

@@ -6,10 +6,12 @@
 #include <jpeglib.h>
 // clang-format on
 
+#include <algorithm>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <iostream>
+#include <iterator>
 #include <string>
 #include <vector>
 
@@ -71,8 +73,11 @@ Bitmap32 Pattern(int w, int h) {
   return p;
 }
 
-// progressive: simple progression; components: 1 gray, 3 YCbCr, 4 Adobe CMYK.
-Bytes Jpeg(int components, bool progressive) {
+// progressive: simple progression; components: 1 gray, 3 YCbCr, 4 Adobe CMYK; arithmetic
+// coding instead of Huffman; scanPerCoefficient: a progressive script of a scan for every
+// coefficient of every component (190 scans), far more than any encoder writes.
+Bytes Jpeg(int components, bool progressive, bool arithmetic = false,
+           bool scanPerCoefficient = false) {
   jpeg_compress_struct cinfo{};
   jpeg_error_mgr err{};
   cinfo.err = jpeg_std_error(&err);
@@ -88,6 +93,15 @@ Bytes Jpeg(int components, bool progressive) {
   jpeg_set_quality(&cinfo, 75, TRUE);
   cinfo.restart_in_rows = 1;
   if (progressive) jpeg_simple_progression(&cinfo);
+  cinfo.arith_code = arithmetic;
+  std::vector<jpeg_scan_info> scans;
+  if (scanPerCoefficient) {
+    scans.push_back({components, {0, 1, 2, 3}, 0, 0, 0, 0});
+    for (int c = 0; c < components; ++c)
+      for (int k = 1; k < 64; ++k) scans.push_back({1, {c, 0, 0, 0}, k, k, 0, 0});
+    cinfo.scan_info = scans.data();
+    cinfo.num_scans = static_cast<int>(scans.size());
+  }
   jpeg_start_compress(&cinfo, TRUE);
   std::vector<JSAMPLE> row(24 * static_cast<std::size_t>(components));
   while (cinfo.next_scanline < cinfo.image_height) {
@@ -233,6 +247,89 @@ Bytes Exif(bool bigEndian) {
   return b;
 }
 
+// The frame header of a JPEG file rewritten to announce width by height.
+Bytes WithJpegFrameSize(Bytes file, unsigned width, unsigned height) {
+  for (std::size_t i = 2; i + 9 < file.size(); ++i) {
+    if (file[i] == 0xFF && (file[i + 1] == 0xC0 || file[i + 1] == 0xC2 || file[i + 1] == 0xC9 ||
+                            file[i + 1] == 0xCA)) {
+      file[i + 5] = static_cast<std::uint8_t>(height >> 8);
+      file[i + 6] = static_cast<std::uint8_t>(height);
+      file[i + 7] = static_cast<std::uint8_t>(width >> 8);
+      file[i + 8] = static_cast<std::uint8_t>(width);
+      break;
+    }
+  }
+  return file;
+}
+
+// A GIF with a 4-colour table whose first frame (width by height at left, top on a screen of
+// screenWidth by screenHeight) holds the given literal indices, with a minimum code size of
+// codeSize; the frame may announce far more pixels than it holds.
+Bytes GifFrame(unsigned screenWidth, unsigned screenHeight, unsigned left, unsigned top,
+               unsigned width, unsigned height, int codeSize, const Bytes& indices) {
+  Writer w;
+  for (char c : std::string("GIF89a")) w.U8(static_cast<unsigned char>(c));
+  w.U16(screenWidth).U16(screenHeight).U8(0xF1).U8(0).U8(0);
+  w.U8(255).U8(0).U8(0).U8(0).U8(255).U8(0).U8(0).U8(0).U8(255).U8(255).U8(255).U8(255);
+  w.U8(0x2C).U16(left).U16(top).U16(width).U16(height).U8(0).U8(static_cast<unsigned>(codeSize));
+  const unsigned clear = 1u << codeSize;
+  const int bitsPerCode = codeSize + 1;
+  Bytes data;
+  std::uint32_t acc = 0;
+  int bits = 0;
+  const auto emit = [&](unsigned code) {
+    acc |= code << bits;
+    for (bits += bitsPerCode; bits >= 8; bits -= 8, acc >>= 8) data.push_back(acc & 0xFF);
+  };
+  for (std::size_t i = 0; i < indices.size(); ++i) {
+    if (i % 2 == 0) emit(clear);
+    emit(indices[i]);
+  }
+  emit(clear + 1);
+  if (bits > 0) data.push_back(acc & 0xFF);
+  for (std::size_t at = 0; at < data.size(); at += 255) {
+    const std::size_t n = std::min<std::size_t>(255, data.size() - at);
+    w.U8(static_cast<unsigned>(n)).Add(Bytes(data.begin() + at, data.begin() + at + n));
+  }
+  return w.U8(0).U8(0x3B).b;
+}
+
+std::uint32_t Crc32(const std::uint8_t* data, std::size_t size) {
+  std::uint32_t crc = 0xFFFFFFFFu;
+  for (std::size_t i = 0; i < size; ++i) {
+    crc ^= data[i];
+    for (int k = 0; k < 8; ++k) crc = crc & 1 ? 0xEDB88320u ^ (crc >> 1) : crc >> 1;
+  }
+  return ~crc;
+}
+
+// A gray PNG announcing width by height around idatSize bytes of picture data.
+Bytes ShortPng(std::uint32_t width, std::uint32_t height, std::size_t idatSize) {
+  Bytes file = {0x89, 'P', 'N', 'G', 0x0D, 0x0A, 0x1A, 0x0A};
+  const auto chunk = [&](const char* type, const Bytes& body) {
+    const auto big32 = [&](std::uint32_t v) {
+      for (int shift = 24; shift >= 0; shift -= 8)
+        file.push_back(static_cast<std::uint8_t>(v >> shift));
+    };
+    big32(static_cast<std::uint32_t>(body.size()));
+    const std::size_t start = file.size();
+    file.insert(file.end(), type, type + 4);
+    file.insert(file.end(), body.begin(), body.end());
+    big32(Crc32(file.data() + start, file.size() - start));
+  };
+  Bytes header;
+  for (std::uint32_t v : {width, height})
+    for (int shift = 24; shift >= 0; shift -= 8)
+      header.push_back(static_cast<std::uint8_t>(v >> shift));
+  header.insert(header.end(), {8, 0, 0, 0, 0});
+  chunk("IHDR", header);
+  Bytes idat = {0x78, 0x9C};
+  idat.resize(idatSize, 0);
+  chunk("IDAT", idat);
+  chunk("IEND", {});
+  return file;
+}
+
 void Save(const std::filesystem::path& folder, const std::string& family, int index,
           const Bytes& bytes) {
   std::filesystem::create_directories(folder / family);
@@ -299,6 +396,31 @@ int main(int argc, char** argv) {
     c::EncodeEnhancedMetafile(Pattern(3, 2), tiny);
     Save(folder, "emf", 1, tiny.bytes());
     Save(folder, "emf", 2, VectorEmf(tiny.bytes()));
+
+    // Headers announcing far more than the files hold, and the codings the size checks treat
+    // apart: each decoder must refuse these from its own evidence, before its pixel limit.
+    Save(folder, "jpeg", 4, Jpeg(3, false, true));
+    Save(folder, "jpeg", 5, Jpeg(3, true, true));
+    Save(folder, "jpeg", 6, WithJpegFrameSize(Jpeg(3, false, true), 16000, 16000));
+    Save(folder, "jpeg", 7, WithJpegFrameSize(Jpeg(3, true, true), 16384, 16384));
+    Save(folder, "jpeg", 8, Jpeg(3, true, true, true));
+    Save(folder, "jpeg", 9, WithJpegFrameSize(Jpeg(1, true), 8000, 8000));
+    Save(folder, "bmp", 6, Bmp(InfoHeader(16384, 16384, 8, 1, 4), palette, {0, 1}));
+    Save(folder, "bmp", 7,
+         Bmp(InfoHeader(16384, 16384, 4, 2, 4), palette, {255, 0x12, 0, 2, 255, 255, 0, 1}));
+    Save(folder, "gif", 2, GifFrame(12000, 12000, 0, 0, 12000, 12000, 2, {1}));
+    Save(folder, "gif", 3, GifFrame(65535, 4096, 0, 0, 65535, 4096, 2, {1, 2}));
+    Save(folder, "gif", 4, GifFrame(3, 2, 0, 0, 3, 2, 11, {0, 1, 2, 2, 1, 0}));
+    Save(folder, "gif", 5, GifFrame(40, 30, 10, 5, 2, 2, 2, {0, 1, 2, 3}));
+    Save(folder, "png", 2, ShortPng(16384, 16384, 100));
+
+    // Standard input: one of each family, told apart by content alone.
+    int stdinSeed = 0;
+    for (const char* family : {"jpeg", "bmp", "ico", "gif", "png", "wmf", "emf"}) {
+      std::ifstream in(folder / family / "seed-0", std::ios::binary);
+      Save(folder, "stdin", stdinSeed++,
+           Bytes(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()));
+    }
   } catch (const std::exception& error) {
     std::cerr << error.what() << "\n";
     return 1;

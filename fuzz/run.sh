@@ -7,7 +7,7 @@ seconds=${1:-20}
 build=${2:-/tmp/quillane-fuzz}
 runs=${3:--1}
 source=$(cd "$(dirname "$0")/.." && pwd)
-families="jpeg bmp ico gif png wmf emf exif"
+families="jpeg bmp ico gif png wmf emf exif stdin"
 
 cmake -S "$source" -B "$build" -DCMAKE_C_COMPILER=clang -DCMAKE_CXX_COMPILER=clang++ \
   -DCMAKE_BUILD_TYPE=RelWithDebInfo -DQUILLANE_FUZZ=ON -DQUILLANE_GUI=OFF -DQUILLANE_BENCH=OFF

@@ -29,6 +29,14 @@ class NotEnoughMemory : public std::bad_alloc {
 // what its control group's limit leaves and what the system reports available.
 std::int64_t AvailableMemory();
 
+// Bytes the control groups of this process still let it take: for the memory controller of
+// cgroup v1 and for cgroup v2, at every level from the process's own group up to the top of the
+// mounted hierarchy, the tightest of limit less usage, where file cache the kernel can drop
+// does not count as used. The groups come from /proc/self/cgroup, their folders from the
+// cgroup mounts in /proc/self/mountinfo. root is put before every path read (a fake tree for
+// tests). INT64_MAX when no group sets a limit.
+std::int64_t ControlGroupMemoryLeft(const std::string& root = "");
+
 // bytes written for people: "512 KB", "38 MB", "1.9 GB".
 std::string MemoryAmount(std::int64_t bytes);
 

@@ -22,6 +22,8 @@ struct JpegOptions {
   int lumaH = 2, lumaV = 2;  // sampling factors of the first component
   int restartRows = 0;
   int quality = 95;
+  bool arithmetic = false;
+  std::vector<jpeg_scan_info> scans;  // a scan script of one's own (progressive)
 };
 
 // Encodes width x height samples given per pixel by sample(x, y, channel).
@@ -52,6 +54,11 @@ std::vector<std::uint8_t> WriteJpeg(int width, int height, const JpegOptions& op
   }
   cinfo.restart_in_rows = options.restartRows;
   if (options.progressive) jpeg_simple_progression(&cinfo);
+  cinfo.arith_code = options.arithmetic;
+  if (!options.scans.empty()) {
+    cinfo.scan_info = options.scans.data();
+    cinfo.num_scans = static_cast<int>(options.scans.size());
+  }
   jpeg_start_compress(&cinfo, TRUE);
   std::vector<JSAMPLE> row(static_cast<std::size_t>(width * cinfo.input_components));
   while (cinfo.next_scanline < cinfo.image_height) {
@@ -152,7 +159,8 @@ TEST(JpegDecoder, AdobeCmykAndYcckGiveTrueColours) {
 std::vector<std::uint8_t> WithFrameSize(std::vector<std::uint8_t> file, unsigned width,
                                         unsigned height) {
   for (std::size_t i = 2; i + 9 < file.size(); ++i) {
-    if (file[i] == 0xFF && (file[i + 1] == 0xC0 || file[i + 1] == 0xC2)) {
+    if (file[i] == 0xFF && (file[i + 1] == 0xC0 || file[i + 1] == 0xC2 || file[i + 1] == 0xC9 ||
+                            file[i + 1] == 0xCA)) {
       file[i + 5] = static_cast<std::uint8_t>(height >> 8);
       file[i + 6] = static_cast<std::uint8_t>(height);
       file[i + 7] = static_cast<std::uint8_t>(width >> 8);
@@ -197,11 +205,68 @@ TEST(JpegDecoder, RefusesHugeEmptyShortAndBrokenFiles) {
   EXPECT_EQ(DecodeJpeg(file, 4096).Width(), 64);
 }
 
+// The file with a segment of marker and size bytes of zeros after its start-of-image marker.
+std::vector<std::uint8_t> WithSegment(std::vector<std::uint8_t> file, std::uint8_t marker,
+                                      std::size_t size) {
+  std::vector<std::uint8_t> segment = {0xFF, marker, static_cast<std::uint8_t>((size + 2) >> 8),
+                                       static_cast<std::uint8_t>(size + 2)};
+  segment.resize(4 + size, 0);
+  file.insert(file.begin() + 2, segment.begin(), segment.end());
+  return file;
+}
+
+// Arithmetic coding can hold a flat block in a sliver of a bit, so the one-bit-a-block rule of
+// Huffman coding never applied to it, and a 139-byte file opened as 16000 x 16000 pixels; a
+// progressive file of hundreds of scans took minutes. Each is refused before anything large is
+// allocated; real arithmetic and progressive files still open.
+class JpegEvidence : public TempFolder {};
+
+TEST_F(JpegEvidence, ArithmeticAndManyScannedFilesMustHoldTheirPicture) {
+  const auto flat = [](int, int, int c) { return 60 * c + 20; };
+  const auto rgb = [](int x, int y, int c) { return (x * 7 + y * 3 + c * 50) & 255; };
+  // Every coefficient its own scan, for each of three components: 190 scans, 64 visits a block.
+  std::vector<jpeg_scan_info> manyScans = {{3, {0, 1, 2, 0}, 0, 0, 0, 0}};
+  for (int c = 0; c < 3; ++c)
+    for (int k = 1; k < 64; ++k) manyScans.push_back({1, {c, 0, 0, 0}, k, k, 0, 0});
+  const JpegOptions arithmetic{.arithmetic = true};
+  const JpegOptions progressiveArithmetic{.progressive = true, .arithmetic = true};
+  const std::vector<std::uint8_t> arithmeticFile = WriteJpeg(64, 64, arithmetic, rgb);
+  const std::pair<std::vector<std::uint8_t>, const char*> cases[] = {
+      {WithFrameSize(WriteJpeg(16, 16, arithmetic, flat), 16000, 16000), "cannot hold"},
+      // Metadata is no picture data: a large profile or thumbnail makes no difference.
+      {WithSegment(WithFrameSize(WriteJpeg(16, 16, arithmetic, flat), 16000, 16000), 0xE2, 60'000),
+       "cannot hold"},
+      {WithSegment(WithFrameSize(WriteJpeg(16, 16, {}, flat), 4000, 4000), 0xE1, 60'000),
+       "cannot hold"},
+      {WithFrameSize(WriteJpeg(16, 16, progressiveArithmetic, flat), 16384, 16384), "cannot hold"},
+      {WriteJpeg(1024, 1024, {.progressive = true, .arithmetic = true, .scans = manyScans}, flat),
+       "190 progressive scans"},
+      {WriteJpeg(1024, 1024, {.progressive = true, .scans = manyScans}, flat),
+       "190 progressive scans"},
+      {{arithmeticFile.begin(), arithmeticFile.end() - 60}, "truncated"},
+  };
+  for (const auto& [bytes, reason] : cases) {
+    WriteBytes(Path("crafted.jpg"), bytes);
+    const std::string error = ErrorOf([&] { LoadPictureFile(Path("crafted.jpg")); });
+    EXPECT_TRUE(Contains(error, reason)) << reason << " (" << bytes.size() << " bytes): " << error;
+  }
+  // On a small picture so many scans cost nothing, and the file opens.
+  EXPECT_EQ(
+      DecodeJpeg(WriteJpeg(256, 256, {.progressive = true, .scans = manyScans}, flat)).Width(),
+      256);
+  for (const JpegOptions& options : {arithmetic, progressiveArithmetic}) {
+    const Bitmap32 picture = DecodeJpeg(WriteJpeg(64, 64, options, rgb));
+    EXPECT_EQ(picture.Width(), 64);
+    EXPECT_NEAR(picture.At(10, 20).r, rgb(10, 20, 0), 8);
+  }
+}
+
 // Running out of memory ended the program; now the header is checked against what is left.
 TEST(JpegDecoder, PictureBeyondTheAvailableMemorySaysWhatItNeeds) {
   QUILLANE_SKIP_UNDER_ADDRESS_LIMIT();
-  const auto big =
-      WithFrameSize(WriteJpeg(16, 16, {}, [](int, int, int) { return 9; }), 7000, 7000);
+  auto big = WithFrameSize(WriteJpeg(16, 16, {}, [](int, int, int) { return 9; }), 7000, 7000);
+  // As much coded data as a picture of so many blocks needs at least.
+  big.insert(big.end() - 2, 100'000, 0);
   EXPECT_EXIT(
       {
         LimitAddressSpaceGrowth(std::uint64_t{300} << 20);

@@ -1,9 +1,14 @@
 // Windows metafiles (played by libwmf) and enhanced metafiles (our own reader and writer, and
 // the renderer program for vector content).
+#include <signal.h>
 #include <sys/wait.h>
+#include <unistd.h>
 
 #include <cerrno>
 #include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <string>
 
 #include "tests/codecs/test_support.h"
 
@@ -126,7 +131,7 @@ std::string DecodeError(const std::vector<std::uint8_t>& file) {
 
 // Found by fuzzing: a pen 3841 units wide on a 40 x 30 window kept libwmf drawing for minutes
 // inside a single record, out of reach of any check between records.
-TEST(WindowsMetafile, EndlessDrawingIsStoppedAndReported) {
+ByteWriter EndlessWmf() {
   ByteWriter file;
   file.U32(0x9AC6CDD7).U16(0).I16(-2304).I16(-1).I16(215).I16(30).U16(96).U32(0).U16(0x5747);
   file.U16(1).U16(9).U16(0x0300).U32(0x3B).U16(2).U32(6).U16(0);
@@ -138,6 +143,11 @@ TEST(WindowsMetafile, EndlessDrawingIsStoppedAndReported) {
   file.U32(7).U16(0x041B).I16(25).I16(30).I16(5).I16(10);      // Rectangle
   file.U32(7).U16(0x0418).I16(28).I16(0x5526).I16(2).I16(20);  // Ellipse
   file.U32(3).U16(0);
+  return file;
+}
+
+TEST(WindowsMetafile, EndlessDrawingIsStoppedAndReported) {
+  const ByteWriter file = EndlessWmf();
   ASSERT_EQ(file.Size(), 130u);
   const std::string error = DecodeError(file.bytes);
   EXPECT_TRUE(error == "The metafile takes too long to draw" ||
@@ -148,6 +158,53 @@ TEST(WindowsMetafile, EndlessDrawingIsStoppedAndReported) {
   errno = 0;
   EXPECT_EQ(::waitpid(-1, nullptr, WNOHANG), -1);
   EXPECT_EQ(errno, ECHILD);
+}
+
+// The renderer processes whose parent is pid.
+std::vector<pid_t> RenderersOf(pid_t parent) {
+  std::vector<pid_t> found;
+  for (const auto& entry : std::filesystem::directory_iterator("/proc")) {
+    std::ifstream stat(entry.path() / "stat");
+    std::string pid, name, state;
+    pid_t ppid = 0;
+    if (stat >> pid >> name >> state >> ppid && ppid == parent && Contains(name, "(quillane-") &&
+        state != "Z")
+      found.push_back(std::stoi(pid));
+  }
+  return found;
+}
+
+bool Running(pid_t pid) {
+  std::ifstream stat("/proc/" + std::to_string(pid) + "/stat");
+  std::string id, name, state;
+  return stat >> id >> name >> state && state != "Z";
+}
+
+// A renderer killed with the program once drew on for as long as its CPU limit let it (10 to 17
+// seconds); the kernel now ends it with its parent.
+TEST(WindowsMetafile, RendererDiesWithTheProgram) {
+  const std::vector<std::uint8_t> file = EndlessWmf().bytes;
+  const pid_t program = ::fork();
+  ASSERT_GE(program, 0);
+  if (program == 0) {
+    ErrorOf([&] { DecodeMetafile(file, 1 << 22); });
+    std::_Exit(0);
+  }
+  std::vector<pid_t> renderers;
+  for (int tries = 0; tries < 500 && renderers.empty(); ++tries) {
+    ::usleep(10'000);
+    renderers = RenderersOf(program);
+  }
+  ::kill(program, SIGKILL);
+  ::waitpid(program, nullptr, 0);
+  ASSERT_EQ(renderers.size(), 1u);
+  // Well within the renderer's CPU limit.
+  bool gone = false;
+  for (int tries = 0; tries < 300 && !gone; ++tries) {
+    gone = !Running(renderers[0]);
+    if (!gone) ::usleep(10'000);
+  }
+  EXPECT_TRUE(gone);
 }
 
 // An enhanced metafile for a 96 dpi reference device whose frame is width x height pixels,

@@ -152,44 +152,91 @@ TEST(IconDecoder, RefusesDamagedFiles) {
 const std::vector<std::uint8_t> kGifPalette = {255, 0, 0, 0, 255, 0, 0, 0, 255, 0, 0, 0};
 
 TEST(GifDecoder, TransparentPixelsAndUncoveredScreenBecomeWhite) {
-  // A 4 x 3 screen, cut to the frame's right and bottom edges; a 2 x 2 frame at (1, 1) whose
-  // index 3 is transparent.
+  // A 4 x 3 screen with a 2 x 2 frame at (1, 1) whose index 3 is transparent.
   const Bitmap32 p =
       DecodeWithQt(GifFile(4, 3, 1, 1, 2, 2, kGifPalette, {0, 3, 1, 2}, 3), QtFormat::kGif);
-  ASSERT_EQ(p.Width(), 3);
+  ASSERT_EQ(p.Width(), 4);
   ASSERT_EQ(p.Height(), 3);
   EXPECT_EQ(p.At(1, 1), kRed);
   EXPECT_EQ(p.At(1, 2), kGreen);
   EXPECT_EQ(p.At(2, 2), kBlue);
   EXPECT_EQ(p.At(2, 1), (Pixel{255, 255, 255, 0}));
   EXPECT_EQ(p.At(0, 0), (Pixel{255, 255, 255, 0}));
+  EXPECT_EQ(p.At(3, 2), (Pixel{255, 255, 255, 0}));
 }
 
-// Qt's reader refuses images above its own process-wide allocation limit (128 MB by default);
-// a 50-megapixel GIF needs 203 MB in 32 bits and must open like any photo. A 27 KB file whose
-// screen is 16000 x 16000 once took gigabytes: only the frame is allocated.
-TEST(GifDecoder, FiftyMegapixelPictureOpensAndALargerScreenIsNotAllocated) {
-  // Screen width and height, and the 1 x 1 frame's place, which is the picture's corner.
-  for (const auto& [sw, sh, x, y] : {std::array{8200, 6200, 8199, 6199}, {16000, 16000, 0, 0}}) {
-    const Bitmap32 p =
-        DecodeWithQt(GifFile(sw, sh, x, y, 1, 1, kGifPalette, {1}, -1), QtFormat::kGif);
-    EXPECT_EQ(p.Width(), x + 1);
-    EXPECT_EQ(p.Height(), y + 1);
-    EXPECT_EQ(p.At(x, y), kGreen);
+// The screen is what the picture is (transparent where the frame does not cover it), as long as the
+// file's frame is evidence enough for it: up to 4 megapixels of screen, or four times the frame.
+// Beyond that a 27 KB file once took gigabytes; the screen is cut to the frame's corner, or to the
+// frame alone.
+TEST(GifDecoder, ScreenIsHonouredWithinWhatTheFrameBacks) {
+  struct Case {
+    int sw, sh, x, y, w, h;  // screen, then the frame's place and size
+    int width, height;       // the picture
+    int frameX, frameY;      // where the frame lands in it
+  } cases[] = {
+      {2048, 2048, 5, 6, 1, 1, 2048, 2048, 5, 6},                // small enough to need no evidence
+      {3000, 3000, 0, 0, 1000, 1000, 1000, 1000, 0, 0},          // 9 times the frame: cut to it
+      {3000, 3000, 1990, 10, 1000, 1000, 2990, 1010, 1990, 10},  // cut to the frame's corner
+      {8200, 6200, 8199, 6199, 1, 1, 1, 1, 0, 0},  // a pixel in a corner: only the frame
+      {16000, 16000, 0, 0, 1, 1, 1, 1, 0, 0},
+      {65535, 65535, 65534, 65534, 1, 1, 1, 1, 0, 0},
+  };
+  for (const Case& c : cases) {
+    const std::uint64_t pixels = std::uint64_t(c.w) * c.h;
+    const Bitmap32 p = DecodeWithQt(
+        GifFileWithData(c.sw, c.sh, c.x, c.y, c.w, c.h, kGifPalette, 2, LzwUniform(pixels, 1, 2)),
+        QtFormat::kGif);
+    ASSERT_EQ(p.Width(), c.width) << c.sw << " x " << c.sh;
+    ASSERT_EQ(p.Height(), c.height) << c.sw << " x " << c.sh;
+    EXPECT_EQ(p.At(c.frameX, c.frameY), kGreen);
+    EXPECT_EQ(p.At(c.frameX + c.w - 1, c.frameY + c.h - 1), kGreen);
+    // No colour is transparent here, and still the rest of the screen is (Qt would fill it with
+    // the background colour).
+    if (c.frameX > 0) {
+      EXPECT_EQ(p.At(0, 0), (Pixel{255, 255, 255, 0}));
+    }
   }
 }
 
-// Another signature and LZW codes above 8 bits once loaded (one as an all-white picture).
-TEST(GifDecoder, RefusesHugeFramesForeignSignaturesWideCodesAndDamage) {
+// Qt's reader refuses images above its own process-wide allocation limit (128 MB by default);
+// a 50-megapixel GIF needs 203 MB in 32 bits and must open like any photo.
+TEST(GifDecoder, FiftyMegapixelPictureOpens) {
+  const Bitmap32 p = DecodeWithQt(
+      GifFileWithData(8200, 6200, 0, 0, 8200, 6200, kGifPalette, 2, LzwUniform(8200 * 6200, 2, 2)),
+      QtFormat::kGif);
+  ASSERT_EQ(p.Width(), 8200);
+  ASSERT_EQ(p.Height(), 6200);
+  EXPECT_EQ(p.At(8199, 6199), kBlue);
+}
+
+// Codes of up to 12 bits are legal, so a minimum code size of 9 to 11 decodes; 12 leaves no room.
+TEST(GifDecoder, MinimumCodeSizesUpToElevenDecode) {
+  for (int codeSize : {2, 8, 9, 11}) {
+    const Bitmap32 p = DecodeWithQt(
+        GifFile(3, 2, 0, 0, 3, 2, kGifPalette, {0, 1, 2, 2, 1, 0}, -1, codeSize), QtFormat::kGif);
+    ASSERT_EQ(p.Width(), 3) << codeSize;
+    EXPECT_EQ(p.At(0, 0), kRed) << codeSize;
+    EXPECT_EQ(p.At(2, 0), kBlue) << codeSize;
+    EXPECT_EQ(p.At(0, 1), kBlue) << codeSize;
+    EXPECT_EQ(p.At(2, 1), kRed) << codeSize;
+  }
+}
+
+// Another signature and a code size of 12 once loaded (one as an all-white picture); frames
+// whose data cannot give their pixels are damaged, however large they say they are.
+TEST(GifDecoder, RefusesForeignSignaturesWideCodesAndFramesTheDataCannotFill) {
   const std::vector<std::uint8_t> good =
       GifFile(3, 3, 0, 0, 3, 3, kGifPalette, std::vector<std::uint8_t>(9, 1), -1);
   std::vector<std::uint8_t> foreign = good, wide = good;
   foreign[4] = '8';  // GIF88a
-  wide[35] = 9;      // the code size byte after the 4-colour table and the frame header
+  wide[35] = 12;     // the code size byte after the 4-colour table and the frame header
   const std::pair<std::vector<std::uint8_t>, const char*> cases[] = {
-      {GifFile(65535, 65535, 65534, 65534, 1, 1, kGifPalette, {1}, -1), "65535 by 65535"},
+      {GifFile(12000, 12000, 0, 0, 12000, 12000, kGifPalette, {1}, -1), "gives 1 of"},
+      {GifFile(65535, 4096, 0, 0, 65535, 4096, kGifPalette, {1, 2, 0}, -1), "gives 3 of"},
+      {GifFile(3, 3, 0, 0, 3, 3, kGifPalette, {1, 2, 0, 1}, -1), "gives 4 of"},
       {foreign, "neither GIF87a nor GIF89a"},
-      {wide, "above 8 bits"},
+      {wide, "12 bits or more"},
       {std::vector<std::uint8_t>(good.begin(), good.begin() + 10), "inside its header"}};
   for (const auto& [bytes, reason] : cases) {
     const std::string error = ErrorOf([&] { DecodeWithQt(bytes, QtFormat::kGif); });

@@ -151,9 +151,11 @@ void LimitAddressSpaceGrowth(std::uint64_t extraBytes) {
   if (::setrlimit(RLIMIT_AS, &limit) != 0) std::abort();
 }
 
-std::vector<std::uint8_t> GifFile(int screenWidth, int screenHeight, int left, int top, int width,
-                                  int height, const std::vector<std::uint8_t>& paletteRgb,
-                                  const std::vector<std::uint8_t>& indices, int transparent) {
+std::vector<std::uint8_t> GifFileWithData(int screenWidth, int screenHeight, int left, int top,
+                                          int width, int height,
+                                          const std::vector<std::uint8_t>& paletteRgb,
+                                          int minCodeSize, const std::vector<std::uint8_t>& lzw,
+                                          int transparent) {
   int sizeBits = 1;
   while ((3u << sizeBits) < paletteRgb.size()) ++sizeBits;
   std::vector<std::uint8_t> palette = paletteRgb;
@@ -165,16 +167,67 @@ std::vector<std::uint8_t> GifFile(int screenWidth, int screenHeight, int left, i
     w.U8(0x21).U8(0xF9).U8(4).U8(1).U16(0).U8(transparent).U8(0);
   }
   w.U8(0x2C).U16(left).U16(top).U16(width).U16(height).U8(0);
-  const int minCodeSize = std::max(2, sizeBits);
   w.U8(minCodeSize);
-  const std::vector<std::uint8_t> data = LzwLiterals(indices, minCodeSize);
-  for (std::size_t at = 0; at < data.size(); at += 255) {
-    const std::size_t n = std::min<std::size_t>(255, data.size() - at);
+  for (std::size_t at = 0; at < lzw.size(); at += 255) {
+    const std::size_t n = std::min<std::size_t>(255, lzw.size() - at);
     w.U8(static_cast<unsigned>(n));
-    w.bytes.insert(w.bytes.end(), data.begin() + at, data.begin() + at + n);
+    w.bytes.insert(w.bytes.end(), lzw.begin() + at, lzw.begin() + at + n);
   }
   w.U8(0).U8(0x3B);
   return w.bytes;
+}
+
+std::vector<std::uint8_t> GifFileWithData(int screenWidth, int screenHeight, int left, int top,
+                                          int width, int height,
+                                          const std::vector<std::uint8_t>& paletteRgb,
+                                          int minCodeSize, const std::vector<std::uint8_t>& lzw) {
+  return GifFileWithData(screenWidth, screenHeight, left, top, width, height, paletteRgb,
+                         minCodeSize, lzw, -1);
+}
+
+std::vector<std::uint8_t> GifFile(int screenWidth, int screenHeight, int left, int top, int width,
+                                  int height, const std::vector<std::uint8_t>& paletteRgb,
+                                  const std::vector<std::uint8_t>& indices, int transparent,
+                                  int minCodeSize) {
+  int sizeBits = 1;
+  while ((3u << sizeBits) < paletteRgb.size()) ++sizeBits;
+  if (minCodeSize == 0) minCodeSize = std::max(2, sizeBits);
+  return GifFileWithData(screenWidth, screenHeight, left, top, width, height, paletteRgb,
+                         minCodeSize, LzwLiterals(indices, minCodeSize), transparent);
+}
+
+std::vector<std::uint8_t> LzwUniform(std::uint64_t count, unsigned index, int minCodeSize) {
+  const unsigned clear = 1u << minCodeSize, end = clear + 1;
+  unsigned width = minCodeSize + 1, next = clear + 2;
+  std::vector<std::uint8_t> out;
+  std::uint64_t accumulator = 0;
+  int bits = 0;
+  const auto emit = [&](unsigned code) {
+    accumulator |= std::uint64_t{code} << bits;
+    bits += static_cast<int>(width);
+    while (bits >= 8) {
+      out.push_back(static_cast<std::uint8_t>(accumulator & 0xFF));
+      accumulator >>= 8;
+      bits -= 8;
+    }
+  };
+  emit(clear);
+  // Entry clear + k (k >= 2) holds k pixels, the literal one.
+  std::uint64_t previous = 0;  // pixels of the last code; 0 before the first
+  while (count > 0) {
+    std::uint64_t length = std::min<std::uint64_t>(previous + 1, count);
+    if (next == 4096) length = std::min<std::uint64_t>(4095 - clear, count);
+    emit(length == 1 ? index : clear + static_cast<unsigned>(length));
+    if (previous > 0 && next < 4096) {
+      ++next;
+      if (next == (1u << width) && width < 12) ++width;
+    }
+    previous = length;
+    count -= length;
+  }
+  emit(end);
+  if (bits > 0) out.push_back(static_cast<std::uint8_t>(accumulator & 0xFF));
+  return out;
 }
 
 }  // namespace quillane::testing

@@ -102,6 +102,15 @@ std::vector<std::uint8_t> BmpInfoHeader(int headerSize, int width, int height, i
 // GIF: a palette of RGB triples, indices row by row; transparent < 0 for none.
 std::vector<std::uint8_t> GifFile(int screenWidth, int screenHeight, int left, int top, int width,
                                   int height, const std::vector<std::uint8_t>& paletteRgb,
-                                  const std::vector<std::uint8_t>& indices, int transparent);
+                                  const std::vector<std::uint8_t>& indices, int transparent,
+                                  int minCodeSize = 0);  // 0: the palette's bits, at least 2
+// The same with the frame's LZW data given as it is.
+std::vector<std::uint8_t> GifFileWithData(int screenWidth, int screenHeight, int left, int top,
+                                          int width, int height,
+                                          const std::vector<std::uint8_t>& paletteRgb,
+                                          int minCodeSize, const std::vector<std::uint8_t>& lzw);
+// LZW data of count pixels of one index, as compact as LZW gets (each code one pixel longer
+// than the one before, up to the full table), so that tens of megapixels take kilobytes.
+std::vector<std::uint8_t> LzwUniform(std::uint64_t count, unsigned index, int minCodeSize);
 
 }  // namespace quillane::testing
