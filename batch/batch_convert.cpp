@@ -357,7 +357,7 @@ class BatchLoop {
   }
 
   // The write of the last converted entry, waited for (or done now, without overlap) and
-  // reported. False when it failed and the loop stops.
+  // reported; one that failed is reported as skipped. Always true: the loop goes on.
   bool FinishWrite(bool now = false) {
     if (!pendingWrite_) return true;
     BatchProgress progress = std::move(*pendingWrite_);
@@ -369,7 +369,12 @@ class BatchLoop {
         write_.get();
       }
     } catch (const std::exception& e) {
-      return Stop("Cannot write " + progress.outputPath + ": " + e.what());
+      // This output only: the next may well go to a name or a place that can be written.
+      writtenFor_.erase(progress.outputPath);
+      progress.reason = NamingTheFile(progress.outputPath, e.what());
+      result_.skipped.push_back({progress.name, progress.reason});
+      Report(progress, BatchProgress::Step::Skipped);
+      return true;
     }
     result_.outputs.push_back(progress.outputPath);
     Report(progress, BatchProgress::Step::Written);

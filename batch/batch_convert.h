@@ -52,7 +52,7 @@ struct BatchProgress {
     Loaded,     // the entry is the document's picture now (repaint)
     Converted,  // the effect has written the working picture (repaint)
     Written,    // outputPath has been written
-    Skipped,    // the entry was not converted; reason says why; nothing was written
+    Skipped,    // the entry was not converted, or its output not written; reason says why
   };
   Step step = Step::Loading;
   int index = 0;           // 1-based position in the list
@@ -118,8 +118,9 @@ struct BatchResult {
 // recorded in skipped; the document keeps the previous picture and no output file is written
 // for it. So is an entry whose output name was already written in this run (the reason names
 // the entry that wrote it) or is one of the listed input files, and one too large for the
-// memory left (the reason says what it needs). Any other effect error or a failed write stops
-// the loop (End::Stopped, error names the file).
+// memory left (the reason says what it needs), and one whose output cannot be written (the
+// reason names the output; any file of that name is left as it was). Any other effect error
+// stops the loop (End::Stopped, error names the file).
 // Throws std::invalid_argument when effect has no routine or no batch output tag.
 BatchResult ConvertBatch(PictureDocument& document, const EffectSpec& effect,
                          const EffectParams& params, const BatchJob& job,

@@ -94,9 +94,13 @@ std::string AtomicFile::HiddenName() const {
   std::random_device seed;
   std::mt19937_64 random(seed());
   char suffix[24];
-  std::snprintf(suffix, sizeof suffix, "%012llx.tmp",
-                static_cast<unsigned long long>(random() & 0xFFFFFFFFFFFFull));
-  return FolderOf(target_) + "/." + NameOf(target_) + "." + suffix;
+  const int suffixLength =
+      std::snprintf(suffix, sizeof suffix, ".%012llx.tmp",
+                    static_cast<unsigned long long>(random() & 0xFFFFFFFFFFFFull));
+  // The target's name is shortened so that the hidden one, a dot and the suffix longer, still
+  // fits where the target itself does: any name the file system takes can be saved.
+  const std::size_t room = NAME_MAX - 1 - static_cast<std::size_t>(suffixLength);
+  return FolderOf(target_) + "/." + NameOf(target_).substr(0, room) + suffix;
 }
 
 AtomicFile::~AtomicFile() {

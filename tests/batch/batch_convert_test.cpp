@@ -211,6 +211,35 @@ TEST_F(BatchFolder, OutputsAlreadyWrittenOrListedAsInputsAreNeverOverwritten) {
   EXPECT_EQ(ReadBytes(In("x-PencilSketch.jpg")), input);
 }
 
+// An output name of 238 to 255 bytes failed for its longer hidden temporary name, and one
+// output that could not be written stopped the whole batch.
+TEST_F(BatchFolder, AnOutputThatCannotBeWrittenIsSkippedAndTheBatchGoesOn) {
+  const std::string longest(238, 'l');  // its output name is 255 bytes, the most there can be
+  const std::string tooLong(251, 'm');  // its output name would be 268 bytes
+  fs::create_directories(Out("c-PencilSketch.jpg"));
+  for (const std::string& stem :
+       {std::string("a"), std::string("c"), longest, tooLong, std::string("z")})
+    SaveJpeg(Picture(6, 5, static_cast<int>(stem.size())), In(stem + ".jpg"));
+  for (const bool overlap : {false, true}) {
+    BatchJob job{in_, out_, ScanBatchFolder(in_)};
+    job.overlapStages = overlap;
+    PictureDocument document;
+    const BatchResult result = ConvertBatch(document, Pencil(), EffectParams(), job);
+    EXPECT_EQ(result.end, BatchResult::End::Completed);
+    EXPECT_EQ(result.outputs, (std::vector<std::string>{Out("a-PencilSketch.jpg"),
+                                                        Out(longest + "-PencilSketch.jpg"),
+                                                        Out("z-PencilSketch.jpg")}));
+    ASSERT_EQ(result.skipped.size(), 2u);
+    EXPECT_EQ(result.skipped[0].name, "c.jpg");
+    EXPECT_NE(result.skipped[0].reason.find(Out("c-PencilSketch.jpg")), std::string::npos);
+    EXPECT_EQ(result.skipped[1].name, tooLong + ".jpg");
+    EXPECT_NE(result.skipped[1].reason.find("File name too long"), std::string::npos)
+        << result.skipped[1].reason;
+    EXPECT_TRUE(fs::is_directory(Out("c-PencilSketch.jpg")));
+    EXPECT_EQ(std::distance(fs::directory_iterator(out_), fs::directory_iterator()), 4);
+  }
+}
+
 TEST_F(BatchFolder, HistoryGrowsPerPictureOnlyForEffectsThatRecordBatchSteps) {
   SaveBitmap24(Picture(10, 7, 7), In("a.bmp"));
   SaveBitmap24(Picture(11, 8, 8), In("b.bmp"));
@@ -242,7 +271,7 @@ TEST_F(BatchFolder, HistoryGrowsPerPictureOnlyForEffectsThatRecordBatchSteps) {
   EXPECT_EQ(loud.Working(), peccilsketch(first, PencilToneMode::Contrast, 45, 128));
 }
 
-// A failed write, an effect error and an output folder in the way of a file stop the loop: the
+// An effect error and an output folder in the way of a file stop the loop: the
 // overlap test compares those runs event by event, the window and command line tests show
 // their messages. A blank output folder is not read as the current one.
 TEST_F(BatchFolder, ABlankOutputFolderStopsBeforeAnyPicture) {

@@ -164,6 +164,19 @@ TEST_F(PictureFiles, SaveKeepsModeLinksAndReadOnlyFilesAndLeavesNoTemporaryFile)
   EXPECT_EQ(Entries(), (std::vector<std::string>{"link.jpg", "locked.jpg", "private.jpg"}));
 }
 
+// The hidden temporary name was 18 bytes longer than the target's, so names of 238 to 255
+// bytes could not be saved.
+TEST_F(PictureFiles, EveryNameTheFileSystemTakesCanBeSaved) {
+  for (const std::size_t length : {238u, 254u, 255u}) {
+    const std::string name = std::string(length - 4, 'n') + ".bmp";
+    SaveBitmap24(PatternPicture(3, 2), Path(name));
+    SaveBitmap24(PatternPicture(4, 2), Path(name));  // over an existing file too
+    EXPECT_EQ(LoadPictureFile(Path(name))->Width(), 4) << length;
+    EXPECT_EQ(Entries(), std::vector<std::string>{name});
+    std::filesystem::remove(Path(name));
+  }
+}
+
 TEST_F(PictureFiles, EmptyPictureIsNotSaved) {
   WriteBytes(Path("keep.bmp"), {1, 2, 3});
   EXPECT_THROW(SaveBitmap24(TBitmap32(), Path("keep.bmp")), PictureFileError);
