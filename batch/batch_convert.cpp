@@ -286,6 +286,11 @@ class BatchLoop {
     if (const auto id = IdOf(progress.outputPath); id && inputs_.count(*id))
       return skip(path + " was not converted: its output " + progress.outputPath +
                   " is one of the pictures being converted");
+    // Anyone who can write to the output folder could point a link there at a file of ours.
+    if (struct stat info{};
+        ::lstat(progress.outputPath.c_str(), &info) == 0 && S_ISLNK(info.st_mode))
+      return skip(path + " was not converted: its output " + progress.outputPath +
+                  " is a symbolic link, which a batch never writes through");
 
     // Loaded into a bitmap of its own first: an entry that cannot be read must leave the
     // document, and with it the previous result, untouched and write no file.
@@ -349,7 +354,7 @@ class BatchLoop {
     if (job_.overlapStages) {
       write_ = std::async(std::launch::async,
                           [picture = document_.SharedWorking(), outputPath = progress.outputPath] {
-                            SaveJpeg(*picture, outputPath, 90);
+                            SaveJpeg(*picture, outputPath, 90, LinkAtTarget::Refuse);
                           });
       return true;
     }
@@ -364,7 +369,7 @@ class BatchLoop {
     pendingWrite_.reset();
     try {
       if (now) {
-        SaveJpeg(document_.Working(), progress.outputPath, 90);
+        SaveJpeg(document_.Working(), progress.outputPath, 90, LinkAtTarget::Refuse);
       } else {
         write_.get();
       }

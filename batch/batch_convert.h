@@ -117,7 +117,8 @@ struct BatchResult {
 // An entry that is missing, of an unrecognised type, empty or undecodable is skipped and
 // recorded in skipped; the document keeps the previous picture and no output file is written
 // for it. So is an entry whose output name was already written in this run (the reason names
-// the entry that wrote it) or is one of the listed input files, and one too large for the
+// the entry that wrote it), is one of the listed input files or is a symbolic link (never
+// written through, even when one is put there meanwhile), and one too large for the
 // memory left (the reason says what it needs), and one whose output cannot be written (the
 // reason names the output; any file of that name is left as it was). Any other effect error
 // stops the loop (End::Stopped, error names the file).

@@ -330,7 +330,7 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
   int status = kExitOk;
   auto write = [&](const TBitmap32& p, const std::string& file) {
     try {
-      SavePng(p, (folder / file).string());
+      SavePng(p, (folder / file).string(), LinkAtTarget::Refuse);
       return true;
     } catch (const std::exception& e) {
       err << "quillane-cli: cannot write " << ShownName((folder / file).string()) << ": "
@@ -375,11 +375,11 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
   }
 
   const std::string index = (folder / "index.html").string();
-  std::ofstream html(index, std::ios::binary | std::ios::trunc);
-  html << GalleryHtml(sourceName, {"Original", "original.png"}, menus, unavailable);
-  html.close();
-  if (!html) {
-    err << "quillane-cli: cannot write " << ShownName(index) << "\n";
+  try {
+    SaveTextFile(GalleryHtml(sourceName, {"Original", "original.png"}, menus, unavailable), index,
+                 LinkAtTarget::Refuse);
+  } catch (const std::exception& e) {
+    err << "quillane-cli: cannot write " << ShownName(index) << ": " << ShownName(e.what()) << "\n";
     return kExitFailed;
   }
   out << "Wrote " << written << (written == 1 ? " effect" : " effects") << " and the original into "

@@ -50,11 +50,20 @@ std::string FollowLinks(std::string path) {
 
 }  // namespace
 
-AtomicFile::AtomicFile(std::string target) {
+AtomicFile::AtomicFile(std::string target, LinkAtTarget links) {
   if (target.empty() || target.back() == '/') throw PictureFileError("no file name given");
-  target_ = FollowLinks(std::move(target));
   struct stat old {};
-  if (::stat(target_.c_str(), &old) == 0) {
+  int found = 0;
+  if (links == LinkAtTarget::Follow) {
+    target_ = FollowLinks(std::move(target));
+    found = ::stat(target_.c_str(), &old);
+  } else {
+    // The rename at the end replaces whatever name stands here by then; it never follows it.
+    target_ = std::move(target);
+    found = ::lstat(target_.c_str(), &old);
+    if (found == 0 && S_ISLNK(old.st_mode)) throw PictureFileError("it is a symbolic link");
+  }
+  if (found == 0) {
     if (!S_ISREG(old.st_mode)) throw PictureFileError("it is not a file");
     // The permission bits, not access(): a read-only file stays read-only for root too.
     if ((old.st_mode & S_IWUSR) == 0 || ::access(target_.c_str(), W_OK) != 0) {

@@ -14,6 +14,8 @@ namespace quillane::codecs {
 // Writes the new content of target, which is either the old file or the complete new one,
 // whatever happens meanwhile:
 // - a symbolic link is followed, and the file it names is the one replaced (the link stays);
+//   with LinkAtTarget::Refuse it is refused instead ("it is a symbolic link"), and a link put
+//   there while the file is written is replaced, never followed;
 // - a target without write permission is refused ("the file is read-only");
 // - the new file takes the old one's permission bits and, where allowed, its group;
 // - the content goes into an unnamed file in the target's folder (O_TMPFILE), given a name only
@@ -23,7 +25,7 @@ namespace quillane::codecs {
 // the file); Commit flushes, syncs and moves the file into place.
 class AtomicFile : public ByteSink {
  public:
-  explicit AtomicFile(std::string target);
+  explicit AtomicFile(std::string target, LinkAtTarget links = LinkAtTarget::Follow);
   ~AtomicFile() override;
   AtomicFile(const AtomicFile&) = delete;
   AtomicFile& operator=(const AtomicFile&) = delete;

@@ -240,6 +240,25 @@ TEST_F(BatchFolder, AnOutputThatCannotBeWrittenIsSkippedAndTheBatchGoesOn) {
   }
 }
 
+// A link planted in a shared output folder turned the file it named into a JPEG.
+TEST_F(BatchFolder, ALinkPlantedAtAnOutputNameIsSkippedAndItsFileLeftAlone) {
+  WriteBytes(root_ / "victim.conf", "secret");
+  fs::create_directory(out_);
+  fs::create_symlink("../victim.conf", Out("a-PencilSketch.jpg"));
+  fs::create_symlink("nowhere.jpg", Out("b-PencilSketch.jpg"));
+  for (const char* name : {"a.jpg", "b.jpg", "c.jpg"}) SaveJpeg(Picture(5, 4, name[0]), In(name));
+  PictureDocument document;
+  const BatchResult result =
+      ConvertBatch(document, Pencil(), EffectParams(), {in_, out_, ScanBatchFolder(in_)});
+  EXPECT_EQ(result.outputs, std::vector<std::string>{Out("c-PencilSketch.jpg")});
+  ASSERT_EQ(result.skipped.size(), 2u);
+  for (const BatchSkipped& s : result.skipped)
+    EXPECT_NE(s.reason.find("is a symbolic link"), std::string::npos) << s.reason;
+  EXPECT_EQ(ReadBytes((root_ / "victim.conf").string()), "secret");
+  EXPECT_TRUE(fs::is_symlink(Out("a-PencilSketch.jpg")));
+  EXPECT_FALSE(fs::exists(out_ + "/nowhere.jpg"));
+}
+
 TEST_F(BatchFolder, HistoryGrowsPerPictureOnlyForEffectsThatRecordBatchSteps) {
   SaveBitmap24(Picture(10, 7, 7), In("a.bmp"));
   SaveBitmap24(Picture(11, 8, 8), In("b.bmp"));

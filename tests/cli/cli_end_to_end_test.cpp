@@ -185,6 +185,27 @@ TEST_F(CliRun, GalleryWritesAPngPerAvailableEffectAndAContactSheet) {
   EXPECT_NE(ReadText(Path("g2/index.html")).find("a&lt;b&gt;.bmp"), std::string::npos);
 }
 
+// index.html was written by a truncating stream: through a planted link, and over a read-only
+// file.
+TEST_F(CliRun, GalleryNeverWritesThroughALinkNorOverAReadOnlyFile) {
+  fs::create_directory(Path("g"));
+  std::ofstream(Path("victim")) << "kept";
+  fs::create_symlink("../victim", Path("g/index.html"));
+  fs::create_symlink("../victim", Path("g/pencil-sketch.png"));
+  EXPECT_EQ(Run("gallery g"), 1);
+  EXPECT_NE(err_.find("g/pencil-sketch.png: Cannot save"), std::string::npos) << err_;
+  EXPECT_NE(err_.find("g/index.html: Cannot save"), std::string::npos) << err_;
+  EXPECT_EQ(ReadText(Path("victim")), "kept");
+  EXPECT_TRUE(fs::is_regular_file(Path("g/pen-sketch.png")));
+
+  fs::remove(Path("g/index.html"));
+  std::ofstream(Path("g/index.html")) << "kept";
+  fs::permissions(Path("g/index.html"), fs::perms::owner_read);
+  EXPECT_EQ(Run("gallery g"), 1);
+  EXPECT_NE(err_.find("index.html\": the file is read-only"), std::string::npos) << err_;
+  EXPECT_EQ(ReadText(Path("g/index.html")), "kept");
+}
+
 TEST_F(CliRun, BatchConvertsTheFolderAndListsSkippedFiles) {
   fs::create_directory(Path("in"));
   SaveJpeg(Picture(20, 15), Path("in/a.jpg"));

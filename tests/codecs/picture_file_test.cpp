@@ -7,6 +7,7 @@
 #include <unistd.h>
 
 #include <filesystem>
+#include <functional>
 
 #include "tests/codecs/test_support.h"
 #include "tests/file_size_limit.h"
@@ -175,6 +176,22 @@ TEST_F(PictureFiles, EveryNameTheFileSystemTakesCanBeSaved) {
     EXPECT_EQ(Entries(), std::vector<std::string>{name});
     std::filesystem::remove(Path(name));
   }
+}
+
+TEST_F(PictureFiles, WritersAskedToRefuseLinksWriteNothingThroughOne) {
+  WriteBytes(Path("victim"), {7});
+  std::filesystem::create_symlink("victim", Path("link.png"));
+  const TBitmap32 picture = PatternPicture(3, 3);
+  const std::function<void()> saves[] = {
+      [&] { SavePng(picture, Path("link.png"), LinkAtTarget::Refuse); },
+      [&] { SaveJpeg(picture, Path("link.png"), 90, LinkAtTarget::Refuse); },
+      [&] { SaveTextFile("<html>", Path("link.png"), LinkAtTarget::Refuse); }};
+  for (const auto& save : saves) EXPECT_TRUE(Contains(ErrorOf(save), "it is a symbolic link"));
+  EXPECT_EQ(ReadBytes(Path("victim")), std::vector<std::uint8_t>{7});
+  SaveTextFile("<html>", Path("page.html"), LinkAtTarget::Refuse);
+  EXPECT_EQ(ReadBytes(Path("page.html")),
+            (std::vector<std::uint8_t>{'<', 'h', 't', 'm', 'l', '>'}));
+  EXPECT_EQ(Entries(), (std::vector<std::string>{"link.png", "page.html", "victim"}));
 }
 
 TEST_F(PictureFiles, EmptyPictureIsNotSaved) {
