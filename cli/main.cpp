@@ -2,6 +2,8 @@
 #include <unistd.h>
 
 #include <QtGlobal>
+#include <algorithm>
+#include <csignal>
 #include <iostream>
 #include <string>
 #include <vector>
@@ -34,5 +36,10 @@ int main(int argc, char** argv) {
     std::cerr << "quillane-cli: " << parsed.error << "\n";
     return parsed.exitCode;
   }
-  return RunCommand(parsed.options, std::cout, std::cerr, isatty(STDERR_FILENO) == 1);
+  // A reader that goes away (| head) shows as a failed write, so that the command can end
+  // quietly with a failure of its own instead of being killed part way.
+  std::signal(SIGPIPE, SIG_IGN);
+  const int code = RunCommand(parsed.options, std::cout, std::cerr, isatty(STDERR_FILENO) == 1);
+  std::cout.flush();
+  return std::cout ? code : std::max<int>(code, kExitFailed);
 }
