@@ -442,7 +442,7 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
     return kExitFailed;
   }
   out << "Wrote " << written << (written == 1 ? " effect" : " effects") << " and the original into "
-      << o.output << "; open " << index << " to see them.\n";
+      << ShownName(o.output) << "; open " << ShownName(index) << " to see them.\n";
   return status;
 }
 

@@ -8,6 +8,7 @@
 #include <string>
 #include <vector>
 
+#include "batch/batch_convert.h"
 #include "cli/cli_commands.h"
 #include "cli/cli_options.h"
 #include "imaging/picture_memory.h"
@@ -33,7 +34,8 @@ int main(int argc, char** argv) {
   const std::vector<std::string> args(argv + 1, argv + argc);
   const ParseResult parsed = ParseCommandLine(args);
   if (!parsed.Ok()) {
-    std::cerr << "quillane-cli: " << parsed.error << "\n";
+    // The error quotes what was typed, which may be any bytes.
+    std::cerr << "quillane-cli: " << quillane::ShownName(parsed.error) << "\n";
     return parsed.exitCode;
   }
   // A reader that goes away (| head) shows as a failed write, so that the command can end

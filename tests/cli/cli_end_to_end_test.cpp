@@ -145,6 +145,15 @@ TEST_F(CliRun, PictureTooLargeForTheMemoryLimitIsAMessageAndTheBatchGoesOn) {
   EXPECT_NE(err_.find("big.jpg: "), std::string::npos) << err_;
 }
 
+// An effect's name with an escape sequence in it set the terminal's title.
+TEST_F(CliRun, NamesAreShownEscapedInEveryMessage) {
+  EXPECT_EQ(Run("apply \"$(printf 'pen\\033]0;TITLE\\007')\" -o o.png"), 2);
+  EXPECT_NE(err_.find("unknown effect 'pen\\x1b]0;TITLE\\x07'"), std::string::npos) << err_;
+  EXPECT_EQ(Run("gallery \"$(printf 'g\\033[2J')\""), 0) << err_;
+  EXPECT_NE(out_.find("into g\\x1b[2J; open g\\x1b[2J/index.html"), std::string::npos) << out_;
+  for (const std::string& text : {out_, err_}) EXPECT_EQ(text.find('\x1b'), std::string::npos);
+}
+
 TEST_F(CliRun, ListShowsEveryEffectWithRangesAndDefaults) {
   ASSERT_EQ(Run("list"), 0);
   EXPECT_NE(out_.find("pencil-sketch"), std::string::npos);
