@@ -3,6 +3,8 @@
 #include <sys/stat.h>
 
 #include <algorithm>
+#include <cerrno>
+#include <cstring>
 #include <exception>
 #include <filesystem>
 #include <future>
@@ -81,24 +83,61 @@ std::string NamingTheFile(const std::string& path, const std::string& message) {
   return path + ": " + message;
 }
 
-std::vector<std::string> ScanBatchFolder(const std::string& folder) {
+namespace {
+
+// What an entry that is not a regular file is, for the list of skipped ones.
+std::string WhatItIs(const std::string& path) {
+  struct stat info {};
+  if (::stat(path.c_str(), &info) != 0) {
+    const int error = errno;
+    if (error == ELOOP) return "a symbolic link loop";
+    if (error == ENOENT && ::lstat(path.c_str(), &info) == 0) return "a symbolic link to nothing";
+    return std::strerror(error);
+  }
+  if (S_ISDIR(info.st_mode)) return "a folder";
+  if (S_ISFIFO(info.st_mode)) return "a FIFO (named pipe)";
+  if (S_ISSOCK(info.st_mode)) return "a socket";
+  if (S_ISCHR(info.st_mode) || S_ISBLK(info.st_mode)) return "a device";
+  return "not a regular file";
+}
+
+}  // namespace
+
+BatchScan ScanBatchFolderTelling(const std::string& folder) {
+  BatchScan scan;
   std::vector<std::string> names;
+  std::vector<std::string> others;
   std::error_code ec;
   fs::directory_iterator it(folder, ec);
-  if (ec) return {};
+  if (ec) {
+    if (ec != std::errc::no_such_file_or_directory && ec != std::errc::not_a_directory)
+      scan.error = "Cannot read the folder " + folder + ": " + ec.message();
+    return scan;
+  }
   for (const fs::directory_iterator end; it != end; it.increment(ec)) {
-    if (ec) break;
+    if (ec) {
+      scan.error = "Cannot read the folder " + folder + ": " + ec.message();
+      break;
+    }
     std::error_code typeError;
-    if (!it->is_regular_file(typeError)) continue;
-    names.push_back(it->path().filename().string());
+    (it->is_regular_file(typeError) ? names : others).push_back(it->path().filename().string());
   }
   std::sort(names.begin(), names.end());
-
-  std::vector<std::string> list;
-  for (std::string_view mask : kBatchMasks)
+  std::sort(others.begin(), others.end());
+  for (std::string_view mask : kBatchMasks) {
     for (const std::string& name : names)
-      if (MatchesMask(name, mask)) list.push_back(name);
-  return list;
+      if (MatchesMask(name, mask)) scan.files.push_back(name);
+    for (const std::string& name : others) {
+      if (!MatchesMask(name, mask)) continue;
+      const std::string path = JoinPath(folder, name);
+      scan.notFiles.emplace_back(name, path + " is not a picture file: it is " + WhatItIs(path));
+    }
+  }
+  return scan;
+}
+
+std::vector<std::string> ScanBatchFolder(const std::string& folder) {
+  return ScanBatchFolderTelling(folder).files;
 }
 
 std::string TrimBlanks(const std::string& text) {

@@ -8,6 +8,7 @@
 #include <functional>
 #include <string>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 #include "document/document.h"
@@ -26,6 +27,19 @@ inline constexpr std::array<std::string_view, 4> kBatchMasks = {"*.jpg", "*.jpeg
 // gives the same list. A name matching two masks would be listed twice; with exact extension
 // matching none does. A missing or unreadable folder gives an empty list.
 std::vector<std::string> ScanBatchFolder(const std::string& folder);
+
+// ScanBatchFolder, telling also what it leaves out.
+struct BatchScan {
+  std::vector<std::string> files;  // as ScanBatchFolder lists them
+  // Entries whose names match the masks but that are not regular files (folders, FIFOs, links
+  // to nothing, link loops), in scan order, each with a sentence naming it and saying what it is.
+  std::vector<std::pair<std::string, std::string>> notFiles;
+  // Why an existing folder could not be listed ("Cannot read the folder X: Permission
+  // denied"), or why the name is no folder when it is not simply missing (a link loop);
+  // empty otherwise.
+  std::string error;
+};
+BatchScan ScanBatchFolderTelling(const std::string& folder);
 
 // The folder name as typed into a batch panel, without leading and trailing blanks (spaces and
 // control characters).

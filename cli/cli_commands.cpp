@@ -1,5 +1,6 @@
 #include "cli/cli_commands.h"
 
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -275,7 +276,12 @@ class ProgressBar {
 
 int BatchCommand(const Options& o, std::ostream& out, std::ostream& err, bool terminal) {
   const std::string inputFolder = TrimBlanks(o.input);
-  BatchJob job{o.input, o.output, ScanBatchFolder(inputFolder)};
+  BatchScan scan = ScanBatchFolderTelling(inputFolder);
+  if (!scan.error.empty()) {
+    err << "quillane-cli: " << ShownName(scan.error) << "\n";
+    return kExitFailed;
+  }
+  BatchJob job{o.input, o.output, std::move(scan.files)};
   PictureDocument document;
   document.RandomState() = o.seed;
   ProgressBar bar(err);
@@ -304,26 +310,34 @@ int BatchCommand(const Options& o, std::ostream& out, std::ostream& err, bool te
   const BatchResult result = ConvertBatch(document, *o.effect, o.params, job, observer);
   bar.Finish();
 
-  if (result.end == BatchResult::End::Refused) return kExitFailed;
-  const std::size_t listed = job.files.size();
+  // Entries named like pictures that are no files are skipped pictures too.
+  std::vector<BatchSkipped> skipped;
+  for (auto& [name, reason] : scan.notFiles) skipped.push_back({name, reason});
+  skipped.insert(skipped.end(), result.skipped.begin(), result.skipped.end());
+  const auto listSkipped = [&] {
+    if (skipped.empty()) return;
+    err << "Skipped " << skipped.size() << (skipped.size() == 1 ? " picture:\n" : " pictures:\n");
+    for (const BatchSkipped& s : skipped)
+      err << "  " << ShownName(s.name) << ": " << ShownName(s.reason) << "\n";
+  };
+  if (result.end == BatchResult::End::Refused) {
+    listSkipped();
+    return kExitFailed;
+  }
+  const std::size_t listed = job.files.size() + scan.notFiles.size();
   if (result.end == BatchResult::End::Stopped)
     err << "quillane-cli: " << ShownName(result.error) << "\n";
   out << "Converted " << result.outputs.size() << " of " << listed
       << (listed == 1 ? " picture" : " pictures") << " into " << ShownName(TrimBlanks(o.output))
       << "\n";
-  if (!result.skipped.empty()) {
-    err << "Skipped " << result.skipped.size()
-        << (result.skipped.size() == 1 ? " picture:\n" : " pictures:\n");
-    for (const BatchSkipped& s : result.skipped)
-      err << "  " << ShownName(s.name) << ": " << ShownName(s.reason) << "\n";
-  }
+  listSkipped();
   if (result.end == BatchResult::End::Stopped) {
-    const std::size_t left = listed - result.outputs.size() - result.skipped.size();
+    const std::size_t left = listed - result.outputs.size() - skipped.size();
     err << "Stopped before the end; " << left
         << (left == 1 ? " picture was not converted.\n" : " pictures were not converted.\n");
     return kExitFailed;
   }
-  if (!result.AllConverted()) return kExitFailed;
+  if (!result.AllConverted() || !skipped.empty()) return kExitFailed;
   out << "The batch convert is successful.\n";
   return kExitOk;
 }
@@ -458,7 +472,14 @@ std::optional<TBitmap32> LoadInputPicture(const std::string& path, std::string& 
                 notices << caption << ": " << text << "\n";
               });
     if (!picture) {
-      error = path + ": no such file";
+      // Not there, or not reachable: a link loop or a folder that may not be entered is no
+      // missing file.
+      struct stat info {};
+      const int why = ::stat(path.c_str(), &info) == 0 ? 0 : errno;
+      error = path + ": " +
+              (why == ELOOP ? "a symbolic link loop (" + std::string(std::strerror(why)) + ")"
+               : why != 0 && why != ENOENT ? std::string(std::strerror(why))
+                                           : std::string("no such file"));
       return std::nullopt;
     }
     if (picture->Width() < 1) {

@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 #include <stdlib.h>
+#include <sys/stat.h>
 
 #include <filesystem>
 #include <fstream>
@@ -108,6 +109,36 @@ TEST_F(BatchFolder, ScanListsEachMaskInTurnIgnoringCaseAndSortedByName) {
             (std::vector<std::string>{"A.JPG", "a.jpg", "b.JPG", "A.Jpeg", "x.jpeg", "c.bmp",
                                       "link.bmp", "d.WMF"}));
   EXPECT_TRUE(ScanBatchFolder(in_ + "/nowhere").empty());
+}
+
+// Entries named like pictures that are no files were left out without a word.
+TEST_F(BatchFolder, ScanTellsWhichMatchingEntriesAreNoFiles) {
+  WriteBytes(In("a.jpg"), "x");
+  fs::create_directory(In("folder.jpg"));
+  fs::create_symlink("missing", In("dangling.jpg"));
+  fs::create_symlink("loop.bmp", In("loop.bmp"));
+  ASSERT_EQ(::mkfifo(In("pipe.wmf").c_str(), 0600), 0);
+  fs::create_directory(In("ignored"));
+  const BatchScan scan = ScanBatchFolderTelling(in_);
+  EXPECT_EQ(scan.files, std::vector<std::string>{"a.jpg"});
+  EXPECT_EQ(scan.error, "");
+  const std::pair<std::string, std::string> want[] = {
+      {"dangling.jpg", "it is a symbolic link to nothing"},
+      {"folder.jpg", "it is a folder"},
+      {"loop.bmp", "it is a symbolic link loop"},
+      {"pipe.wmf", "it is a FIFO"}};
+  ASSERT_EQ(scan.notFiles.size(), std::size(want));
+  for (std::size_t i = 0; i < std::size(want); ++i) {
+    EXPECT_EQ(scan.notFiles[i].first, want[i].first);
+    EXPECT_NE(scan.notFiles[i].second.find(In(want[i].first) +
+                                           " is not a picture file: " + want[i].second),
+              std::string::npos)
+        << scan.notFiles[i].second;
+  }
+  fs::create_symlink("self", In("self"));
+  EXPECT_NE(ScanBatchFolderTelling(In("self")).error.find("Cannot read the folder " + In("self")),
+            std::string::npos);
+  EXPECT_EQ(ScanBatchFolderTelling(In("nowhere")).error, "");  // missing: the Sorry message says it
 }
 
 TEST_F(BatchFolder, ConvertsEveryPictureIntoAJpegNamedAfterItsInput) {

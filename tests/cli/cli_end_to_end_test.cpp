@@ -1,5 +1,7 @@
 // Runs the built quillane-cli and checks what it writes against the routines run here. The
 // parsing itself is cli_options_test's; these check that its results reach the routines.
+#include <unistd.h>
+
 #include <filesystem>
 #include <fstream>
 #include <functional>
@@ -152,6 +154,34 @@ TEST_F(CliRun, NamesAreShownEscapedInEveryMessage) {
   EXPECT_EQ(Run("gallery \"$(printf 'g\\033[2J')\""), 0) << err_;
   EXPECT_NE(out_.find("into g\\x1b[2J; open g\\x1b[2J/index.html"), std::string::npos) << out_;
   for (const std::string& text : {out_, err_}) EXPECT_EQ(text.find('\x1b'), std::string::npos);
+}
+
+// An unreadable folder said there was no picture, a link loop that there was no such file,
+// and entries named like pictures that are no files were left out silently.
+TEST_F(CliRun, MessagesSayWhatIsReallyWrong) {
+  fs::create_directory(Path("in"));
+  SaveJpeg(Picture(6, 5), Path("in/a.jpg"));
+  fs::create_directory(Path("in/x.jpg"));
+  fs::create_symlink("nowhere.jpg", Path("in/gone.jpg"));
+  EXPECT_EQ(Run("batch pencil-sketch --input in --output out"), 1);
+  EXPECT_NE(out_.find("Converted 1 of 3 pictures"), std::string::npos) << out_;
+  EXPECT_NE(err_.find("  gone.jpg: in/gone.jpg is not a picture file: it is a symbolic link to "
+                      "nothing\n  x.jpg: in/x.jpg is not a picture file: it is a folder\n"),
+            std::string::npos)
+      << err_;
+
+  fs::create_symlink("loop.jpg", Path("loop.jpg"));
+  EXPECT_EQ(Run("convert loop.jpg -o o.png"), 1);
+  EXPECT_NE(err_.find("loop.jpg: a symbolic link loop"), std::string::npos) << err_;
+
+  // Read as someone else when run by root, who may read any folder.
+  fs::permissions(dir_, fs::perms::others_exec, fs::perm_options::add);
+  fs::permissions(Path("in"), fs::perms::none);
+  if (::geteuid() == 0) launcher_ = "setpriv --reuid=65534 --regid=65534 --clear-groups ";
+  EXPECT_EQ(Run("batch pencil-sketch --input in --output out"), 1);
+  launcher_.clear();
+  EXPECT_NE(err_.find("Cannot read the folder in: Permission denied"), std::string::npos) << err_;
+  fs::permissions(Path("in"), fs::perms::owner_all);
 }
 
 TEST_F(CliRun, ListShowsEveryEffectWithRangesAndDefaults) {
