@@ -48,6 +48,10 @@ std::string FollowLinks(std::string path) {
   throw PictureFileError(std::strerror(ELOOP));
 }
 
+bool ModesUnsupported(int error) {
+  return error == ENOSYS || error == EPERM || error == ENOTSUP || error == EOPNOTSUPP;
+}
+
 }  // namespace
 
 AtomicFile::AtomicFile(std::string target, LinkAtTarget links) {
@@ -71,6 +75,7 @@ AtomicFile::AtomicFile(std::string target, LinkAtTarget links) {
     }
     replacing_ = true;
     mode_ = old.st_mode & 07777;
+    owner_ = old.st_uid;
     group_ = old.st_gid;
   }
   const std::string folder = FolderOf(target_);
@@ -158,11 +163,14 @@ void AtomicFile::Commit() {
   if (fd_ < 0) throw PictureFileError("the file is closed");
   Flush();
   if (replacing_) {
-    // The group first: changing it may clear the set-group-ID bit that fchmod then restores.
-    if (::fchown(fd_, static_cast<uid_t>(-1), group_) != 0) {
-      // Not a member of that group: the file keeps ours, as any new file would.
+    // Owner and group first: changing them may clear the set-ID bits that fchmod then restores.
+    // Run by root, the file stays its owner's (else its owner could no longer save it).
+    if (::fchown(fd_, owner_, group_) != 0 && ::fchown(fd_, static_cast<uid_t>(-1), group_) != 0) {
+      // Not a member of that group either: the file is ours, as any new file would be.
     }
-    if (::fchmod(fd_, mode_) != 0) Fail(errno);
+    // File systems without Unix modes (FAT sticks, some network shares) refuse them: the file
+    // then has whatever the mount gives every file, which is no reason not to save it.
+    if (::fchmod(fd_, mode_) != 0 && !ModesUnsupported(errno)) Fail(errno);
   }
   if (::fsync(fd_) != 0 && errno != EINVAL) Fail(errno);
   if (unnamed_) {

@@ -194,6 +194,22 @@ TEST_F(PictureFiles, WritersAskedToRefuseLinksWriteNothingThroughOne) {
   EXPECT_EQ(Entries(), (std::vector<std::string>{"link.png", "page.html", "victim"}));
 }
 
+// Run by root, a save over another user's file made root its owner, and then the owner's own
+// saves were refused.
+TEST_F(PictureFiles, SaveByRootKeepsTheFilesOwner) {
+  if (::geteuid() != 0) GTEST_SKIP() << "only root may give a file to another user";
+  WriteBytes(Path("theirs.bmp"), {1});
+  ASSERT_EQ(::chown(Path("theirs.bmp").c_str(), 4321, 4322), 0);
+  ::chmod(Path("theirs.bmp").c_str(), 02640);
+  SaveBitmap24(PatternPicture(2, 2), Path("theirs.bmp"));
+  struct stat info {};
+  ASSERT_EQ(::stat(Path("theirs.bmp").c_str(), &info), 0);
+  EXPECT_EQ(info.st_uid, 4321u);
+  EXPECT_EQ(info.st_gid, 4322u);
+  EXPECT_EQ(info.st_mode & 07777, 02640u);
+  EXPECT_EQ(LoadPictureFile(Path("theirs.bmp"))->Width(), 2);
+}
+
 TEST_F(PictureFiles, EmptyPictureIsNotSaved) {
   WriteBytes(Path("keep.bmp"), {1, 2, 3});
   EXPECT_THROW(SaveBitmap24(TBitmap32(), Path("keep.bmp")), PictureFileError);
