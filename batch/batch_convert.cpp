@@ -302,6 +302,26 @@ class BatchLoop {
     return false;
   }
 
+  // The entry that wrote, in this run, the file path names under another name: on a drive that
+  // ignores case (FAT, exFAT, network shares) "A-Tag.jpg" and "a-Tag.jpg" are one file. Told
+  // by the file's identity; where the file system makes up identities per name (some FUSE
+  // mounts), by a name that reaches a file without being listed in its folder and that is, but
+  // for case, the name of one written.
+  const std::string* WrittenUnderAnotherName(const std::string& path) const {
+    const auto id = IdOf(path);
+    if (!id) return nullptr;
+    if (const auto written = writtenIds_.find(*id); written != writtenIds_.end())
+      return &written->second;
+    const auto folded = writtenFolded_.find(AsciiLower(path));
+    if (folded == writtenFolded_.end()) return nullptr;
+    const fs::path name = fs::path(path).filename();
+    std::error_code ec;
+    for (fs::directory_iterator it(fs::path(path).parent_path(), ec), end; !ec && it != end;
+         it.increment(ec))
+      if (it->path().filename() == name) return nullptr;
+    return ec ? nullptr : &folded->second;
+  }
+
   // Entry i's turn: the document, the observer and the result see it as the one-at-a-time loop
   // has them see it. False when the loop stops.
   bool Convert(int i, Prepared prepared) {
@@ -322,6 +342,9 @@ class BatchLoop {
     if (const auto taken = writtenFor_.find(progress.outputPath); taken != writtenFor_.end())
       return skip(path + " was not converted: its output " + progress.outputPath +
                   " was already written for " + taken->second);
+    if (const std::string* by = WrittenUnderAnotherName(progress.outputPath))
+      return skip(path + " was not converted: its output " + progress.outputPath +
+                  " is the file already written for " + *by);
     if (const auto id = IdOf(progress.outputPath); id && inputs_.count(*id))
       return skip(path + " was not converted: its output " + progress.outputPath +
                   " is one of the pictures being converted");
@@ -420,6 +443,8 @@ class BatchLoop {
       Report(progress, BatchProgress::Step::Skipped);
       return true;
     }
+    if (const auto id = IdOf(progress.outputPath)) writtenIds_.emplace(*id, progress.name);
+    writtenFolded_.emplace(AsciiLower(progress.outputPath), progress.name);
     result_.outputs.push_back(progress.outputPath);
     Report(progress, BatchProgress::Step::Written);
     return true;
@@ -434,7 +459,9 @@ class BatchLoop {
   const std::string outputFolder_;
   const int count_;
   std::set<FileId> inputs_;
-  std::map<std::string, std::string> writtenFor_;  // output path -> the entry that wrote it
+  std::map<std::string, std::string> writtenFor_;     // output path -> the entry that wrote it
+  std::map<FileId, std::string> writtenIds_;          // the files written -> the entries
+  std::map<std::string, std::string> writtenFolded_;  // output paths in lower case -> entries
   BatchResult result_;
   std::optional<BatchProgress> pendingWrite_;
   std::future<void> write_;

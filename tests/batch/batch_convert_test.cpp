@@ -290,6 +290,43 @@ TEST_F(BatchFolder, ALinkPlantedAtAnOutputNameIsSkippedAndItsFileLeftAlone) {
   EXPECT_FALSE(fs::exists(out_ + "/nowhere.jpg"));
 }
 
+// On a FAT stick "a-PencilSketch.jpg" and "A-PencilSketch.jpg" are one file, and the check by
+// name let the second entry overwrite the first's output. The stick is a FAT image mounted
+// through FUSE, once as it comes (the file system makes up an identity per name) and once
+// with the identities it keeps (use_ino). Saving over a file there failed: fchmod is ENOSYS.
+TEST_F(BatchFolder, OutputsThatAreOneFileOnADriveIgnoringCaseAreNotOverwritten) {
+  if (std::system("command -v fusefat mkfs.fat >/dev/null") != 0)
+    GTEST_SKIP() << "fusefat and mkfs.fat are needed (packages fusefat, dosfstools)";
+  SaveJpeg(Picture(6, 5, 1), In("a.jpg"));
+  SaveBitmap24(Picture(7, 5, 2), In("A.bmp"));
+  SaveBitmap24(Picture(8, 5, 3), In("b.bmp"));
+  const std::string image = (root_ / "stick.img").string();
+  fs::create_directory(out_);
+  for (const char* options : {"rw+", "rw+,use_ino"}) {
+    fs::remove(image);
+    ASSERT_EQ(std::system(("mkfs.fat -C '" + image + "' 4096 >/dev/null").c_str()), 0);
+    if (std::system(("fusefat -o " + std::string(options) + " '" + image + "' '" + out_ +
+                     "' >/dev/null 2>&1")
+                        .c_str()) != 0)
+      GTEST_SKIP() << "FUSE cannot mount here";
+    PictureDocument document;
+    const BatchJob job{in_, out_, ScanBatchFolder(in_)};
+    ConvertBatch(document, Pencil(), EffectParams(), job);
+    // Again over the outputs written before, on a file system without Unix modes.
+    const BatchResult result = ConvertBatch(document, Pencil(), EffectParams(), job);
+    const std::string written = ReadBytes(Out("a-PencilSketch.jpg"));
+    EXPECT_EQ(std::system(("umount '" + out_ + "'").c_str()), 0);
+    EXPECT_EQ(result.outputs,
+              (std::vector<std::string>{Out("a-PencilSketch.jpg"), Out("b-PencilSketch.jpg")}))
+        << options;
+    ASSERT_EQ(result.skipped.size(), 1u) << options;
+    EXPECT_EQ(result.skipped[0].name, "A.bmp");
+    EXPECT_NE(result.skipped[0].reason.find("already written for a.jpg"), std::string::npos)
+        << result.skipped[0].reason;
+    EXPECT_EQ(written, ExpectedJpeg(In("a.jpg"), EffectParams(), (root_ / "want.jpg").string()));
+  }
+}
+
 TEST_F(BatchFolder, HistoryGrowsPerPictureOnlyForEffectsThatRecordBatchSteps) {
   SaveBitmap24(Picture(10, 7, 7), In("a.bmp"));
   SaveBitmap24(Picture(11, 8, 8), In("b.bmp"));
