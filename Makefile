@@ -14,7 +14,7 @@ PREFIX ?= /usr/local
 PACKAGES := build-essential cmake pkg-config clang libclang-rt-14-dev clang-format \
 	qt6-base-dev qt6-svg-dev qt6-qpa-plugins libgl-dev fonts-dejavu-core \
 	libjpeg62-turbo-dev libpng-dev libgtest-dev libgmock-dev libbenchmark-dev libwmf-dev libemf2svg-dev \
-	xdg-utils libzstd-dev libexif-dev
+	xdg-utils libzstd-dev libexif-dev fusefat dosfstools
 
 .PHONY: all deps build run install deb test test-asan fuzz bench bench-all format clean
 

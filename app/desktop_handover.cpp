@@ -1,12 +1,20 @@
 #include "app/desktop_handover.h"
 
+#include <QDBusConnection>
+#include <QDBusMessage>
+#include <QDBusObjectPath>
+#include <QDBusPendingCallWatcher>
+#include <QDBusPendingReply>
 #include <QDateTime>
 #include <QDir>
+#include <QEventLoop>
 #include <QFileInfo>
 #include <QProcess>
 #include <QStandardPaths>
+#include <QTimer>
 #include <QUrl>
 #include <filesystem>
+#include <optional>
 #include <system_error>
 
 #include "app/export_rules.h"
@@ -100,15 +108,74 @@ HandOver SetXfceWallpaper(const QString& file) {
   return {true, {}};
 }
 
+constexpr char kPortalService[] = "org.freedesktop.portal.Desktop";
+constexpr char kPortalPath[] = "/org/freedesktop/portal/desktop";
+// The portal may ask the user before it sets the picture.
+constexpr int kPortalResponseMs = 120000;
+
+// The Response the portal sends when one request is settled.
+class PortalRequest : public QObject {
+  Q_OBJECT
+
+ public:
+  std::optional<uint> response;
+  QEventLoop loop;
+
+ public slots:
+  void Response(uint code, const QVariantMap&) {
+    if (!response) response = code;
+    loop.quit();
+  }
+};
+
+// The portal's call only says the request was made; whether the picture was set comes later,
+// in the request's Response signal (0 done, 1 cancelled by the user, 2 refused). That is
+// awaited, with the user's input held back meanwhile, before anything is said to the user.
 HandOver SetPortalWallpaper(const QString& file) {
-  const Run run =
-      RunProgram("gdbus", {"call", "--session", "--dest", "org.freedesktop.portal.Desktop",
-                           "--object-path", "/org/freedesktop/portal/desktop", "--method",
-                           "org.freedesktop.portal.Wallpaper.SetWallpaperURI", "''",
-                           GVariantString(FileUri(file)),
-                           "{'show-preview': <false>, 'set-on': <'background'>}"});
-  if (run.ok) return {true, {}};
-  return {false, "the desktop portal did not take it: " + run.reason};
+  const QString refused = "the desktop portal did not take it: ";
+  // A connection of its own, closed afterwards, so it follows the session bus the environment
+  // names at the time.
+  const QString name = "quillane-wallpaper";
+  struct Closer {
+    QString name;
+    ~Closer() { QDBusConnection::disconnectFromBus(name); }
+  } closer{name};
+  QDBusConnection bus = QDBusConnection::connectToBus(QDBusConnection::SessionBus, name);
+  if (!bus.isConnected())
+    return {false, refused + "there is no session bus (" + bus.lastError().message() + ")"};
+
+  // Listened for before the call, at the path the token gives, so the answer cannot come first.
+  static int requests = 0;
+  const QString token = "quillane" + QString::number(++requests);
+  const QString sender = bus.baseService().mid(1).replace('.', '_');
+  const QString expected = QString(kPortalPath) + "/request/" + sender + "/" + token;
+  PortalRequest request;
+  const auto listen = [&](const QString& path) {
+    bus.connect(kPortalService, path, "org.freedesktop.portal.Request", "Response", &request,
+                SLOT(Response(uint, QVariantMap)));
+  };
+  listen(expected);
+
+  QDBusMessage call = QDBusMessage::createMethodCall(
+      kPortalService, kPortalPath, "org.freedesktop.portal.Wallpaper", "SetWallpaperURI");
+  call << QString() << FileUri(file)
+       << QVariantMap{
+              {"show-preview", false}, {"set-on", QString("background")}, {"handle_token", token}};
+  QDBusPendingCallWatcher watcher(bus.asyncCall(call, kDesktopAnswerMs));
+  QObject::connect(&watcher, &QDBusPendingCallWatcher::finished, &request.loop, &QEventLoop::quit);
+  while (!watcher.isFinished()) request.loop.exec(QEventLoop::ExcludeUserInputEvents);
+  const QDBusPendingReply<QDBusObjectPath> reply = watcher;
+  if (reply.isError()) return {false, refused + reply.error().message()};
+  // Portals older than the token choose the path themselves.
+  if (reply.value().path() != expected) listen(reply.value().path());
+  if (!request.response) {
+    QTimer::singleShot(kPortalResponseMs, &request.loop, &QEventLoop::quit);
+    request.loop.exec(QEventLoop::ExcludeUserInputEvents);
+  }
+  if (!request.response) return {false, refused + "it did not answer"};
+  if (*request.response == 0) return {true, {}};
+  if (*request.response == 1) return {false, refused + "it was cancelled"};
+  return {false, refused + "it refused the picture"};
 }
 
 // A new name for the same bytes: a hard link costs no space; a copy where links are not had.
@@ -193,3 +260,5 @@ HandOver StartMailProgram(const QStringList& arguments, QObject* owner,
 }
 
 }  // namespace quillane
+
+#include "desktop_handover.moc"

@@ -1,6 +1,6 @@
-// Handing files to the running desktop through its own command-line programs, found on PATH:
-// the wallpaper setting and the mail program. Each hand-over says whether the desktop took the
-// file and, when it did not, why.
+// Handing files to the running desktop through its own command-line programs, found on PATH,
+// or its portal on the session bus: the wallpaper setting and the mail program. Each hand-over
+// says whether the desktop took the file and, when it did not, why.
 #pragma once
 
 #include <QString>

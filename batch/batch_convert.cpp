@@ -3,6 +3,8 @@
 #include <sys/stat.h>
 
 #include <algorithm>
+#include <cerrno>
+#include <cstring>
 #include <exception>
 #include <filesystem>
 #include <future>
@@ -81,24 +83,61 @@ std::string NamingTheFile(const std::string& path, const std::string& message) {
   return path + ": " + message;
 }
 
-std::vector<std::string> ScanBatchFolder(const std::string& folder) {
+namespace {
+
+// What an entry that is not a regular file is, for the list of skipped ones.
+std::string WhatItIs(const std::string& path) {
+  struct stat info {};
+  if (::stat(path.c_str(), &info) != 0) {
+    const int error = errno;
+    if (error == ELOOP) return "a symbolic link loop";
+    if (error == ENOENT && ::lstat(path.c_str(), &info) == 0) return "a symbolic link to nothing";
+    return std::strerror(error);
+  }
+  if (S_ISDIR(info.st_mode)) return "a folder";
+  if (S_ISFIFO(info.st_mode)) return "a FIFO (named pipe)";
+  if (S_ISSOCK(info.st_mode)) return "a socket";
+  if (S_ISCHR(info.st_mode) || S_ISBLK(info.st_mode)) return "a device";
+  return "not a regular file";
+}
+
+}  // namespace
+
+BatchScan ScanBatchFolderTelling(const std::string& folder) {
+  BatchScan scan;
   std::vector<std::string> names;
+  std::vector<std::string> others;
   std::error_code ec;
   fs::directory_iterator it(folder, ec);
-  if (ec) return {};
+  if (ec) {
+    if (ec != std::errc::no_such_file_or_directory && ec != std::errc::not_a_directory)
+      scan.error = "Cannot read the folder " + folder + ": " + ec.message();
+    return scan;
+  }
   for (const fs::directory_iterator end; it != end; it.increment(ec)) {
-    if (ec) break;
+    if (ec) {
+      scan.error = "Cannot read the folder " + folder + ": " + ec.message();
+      break;
+    }
     std::error_code typeError;
-    if (!it->is_regular_file(typeError)) continue;
-    names.push_back(it->path().filename().string());
+    (it->is_regular_file(typeError) ? names : others).push_back(it->path().filename().string());
   }
   std::sort(names.begin(), names.end());
-
-  std::vector<std::string> list;
-  for (std::string_view mask : kBatchMasks)
+  std::sort(others.begin(), others.end());
+  for (std::string_view mask : kBatchMasks) {
     for (const std::string& name : names)
-      if (MatchesMask(name, mask)) list.push_back(name);
-  return list;
+      if (MatchesMask(name, mask)) scan.files.push_back(name);
+    for (const std::string& name : others) {
+      if (!MatchesMask(name, mask)) continue;
+      const std::string path = JoinPath(folder, name);
+      scan.notFiles.emplace_back(name, path + " is not a picture file: it is " + WhatItIs(path));
+    }
+  }
+  return scan;
+}
+
+std::vector<std::string> ScanBatchFolder(const std::string& folder) {
+  return ScanBatchFolderTelling(folder).files;
 }
 
 std::string TrimBlanks(const std::string& text) {
@@ -263,6 +302,26 @@ class BatchLoop {
     return false;
   }
 
+  // The entry that wrote, in this run, the file path names under another name: on a drive that
+  // ignores case (FAT, exFAT, network shares) "A-Tag.jpg" and "a-Tag.jpg" are one file. Told
+  // by the file's identity; where the file system makes up identities per name (some FUSE
+  // mounts), by a name that reaches a file without being listed in its folder and that is, but
+  // for case, the name of one written.
+  const std::string* WrittenUnderAnotherName(const std::string& path) const {
+    const auto id = IdOf(path);
+    if (!id) return nullptr;
+    if (const auto written = writtenIds_.find(*id); written != writtenIds_.end())
+      return &written->second;
+    const auto folded = writtenFolded_.find(AsciiLower(path));
+    if (folded == writtenFolded_.end()) return nullptr;
+    const fs::path name = fs::path(path).filename();
+    std::error_code ec;
+    for (fs::directory_iterator it(fs::path(path).parent_path(), ec), end; !ec && it != end;
+         it.increment(ec))
+      if (it->path().filename() == name) return nullptr;
+    return ec ? nullptr : &folded->second;
+  }
+
   // Entry i's turn: the document, the observer and the result see it as the one-at-a-time loop
   // has them see it. False when the loop stops.
   bool Convert(int i, Prepared prepared) {
@@ -283,9 +342,17 @@ class BatchLoop {
     if (const auto taken = writtenFor_.find(progress.outputPath); taken != writtenFor_.end())
       return skip(path + " was not converted: its output " + progress.outputPath +
                   " was already written for " + taken->second);
+    if (const std::string* by = WrittenUnderAnotherName(progress.outputPath))
+      return skip(path + " was not converted: its output " + progress.outputPath +
+                  " is the file already written for " + *by);
     if (const auto id = IdOf(progress.outputPath); id && inputs_.count(*id))
       return skip(path + " was not converted: its output " + progress.outputPath +
                   " is one of the pictures being converted");
+    // Anyone who can write to the output folder could point a link there at a file of ours.
+    if (struct stat info{};
+        ::lstat(progress.outputPath.c_str(), &info) == 0 && S_ISLNK(info.st_mode))
+      return skip(path + " was not converted: its output " + progress.outputPath +
+                  " is a symbolic link, which a batch never writes through");
 
     // Loaded into a bitmap of its own first: an entry that cannot be read must leave the
     // document, and with it the previous result, untouched and write no file.
@@ -349,7 +416,7 @@ class BatchLoop {
     if (job_.overlapStages) {
       write_ = std::async(std::launch::async,
                           [picture = document_.SharedWorking(), outputPath = progress.outputPath] {
-                            SaveJpeg(*picture, outputPath, 90);
+                            SaveJpeg(*picture, outputPath, 90, LinkAtTarget::Refuse);
                           });
       return true;
     }
@@ -357,20 +424,27 @@ class BatchLoop {
   }
 
   // The write of the last converted entry, waited for (or done now, without overlap) and
-  // reported. False when it failed and the loop stops.
+  // reported; one that failed is reported as skipped. Always true: the loop goes on.
   bool FinishWrite(bool now = false) {
     if (!pendingWrite_) return true;
     BatchProgress progress = std::move(*pendingWrite_);
     pendingWrite_.reset();
     try {
       if (now) {
-        SaveJpeg(document_.Working(), progress.outputPath, 90);
+        SaveJpeg(document_.Working(), progress.outputPath, 90, LinkAtTarget::Refuse);
       } else {
         write_.get();
       }
     } catch (const std::exception& e) {
-      return Stop("Cannot write " + progress.outputPath + ": " + e.what());
+      // This output only: the next may well go to a name or a place that can be written.
+      writtenFor_.erase(progress.outputPath);
+      progress.reason = NamingTheFile(progress.outputPath, e.what());
+      result_.skipped.push_back({progress.name, progress.reason});
+      Report(progress, BatchProgress::Step::Skipped);
+      return true;
     }
+    if (const auto id = IdOf(progress.outputPath)) writtenIds_.emplace(*id, progress.name);
+    writtenFolded_.emplace(AsciiLower(progress.outputPath), progress.name);
     result_.outputs.push_back(progress.outputPath);
     Report(progress, BatchProgress::Step::Written);
     return true;
@@ -385,7 +459,9 @@ class BatchLoop {
   const std::string outputFolder_;
   const int count_;
   std::set<FileId> inputs_;
-  std::map<std::string, std::string> writtenFor_;  // output path -> the entry that wrote it
+  std::map<std::string, std::string> writtenFor_;     // output path -> the entry that wrote it
+  std::map<FileId, std::string> writtenIds_;          // the files written -> the entries
+  std::map<std::string, std::string> writtenFolded_;  // output paths in lower case -> entries
   BatchResult result_;
   std::optional<BatchProgress> pendingWrite_;
   std::future<void> write_;

@@ -8,6 +8,7 @@
 #include <functional>
 #include <string>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 #include "document/document.h"
@@ -26,6 +27,19 @@ inline constexpr std::array<std::string_view, 4> kBatchMasks = {"*.jpg", "*.jpeg
 // gives the same list. A name matching two masks would be listed twice; with exact extension
 // matching none does. A missing or unreadable folder gives an empty list.
 std::vector<std::string> ScanBatchFolder(const std::string& folder);
+
+// ScanBatchFolder, telling also what it leaves out.
+struct BatchScan {
+  std::vector<std::string> files;  // as ScanBatchFolder lists them
+  // Entries whose names match the masks but that are not regular files (folders, FIFOs, links
+  // to nothing, link loops), in scan order, each with a sentence naming it and saying what it is.
+  std::vector<std::pair<std::string, std::string>> notFiles;
+  // Why an existing folder could not be listed ("Cannot read the folder X: Permission
+  // denied"), or why the name is no folder when it is not simply missing (a link loop);
+  // empty otherwise.
+  std::string error;
+};
+BatchScan ScanBatchFolderTelling(const std::string& folder);
 
 // The folder name as typed into a batch panel, without leading and trailing blanks (spaces and
 // control characters).
@@ -52,7 +66,7 @@ struct BatchProgress {
     Loaded,     // the entry is the document's picture now (repaint)
     Converted,  // the effect has written the working picture (repaint)
     Written,    // outputPath has been written
-    Skipped,    // the entry was not converted; reason says why; nothing was written
+    Skipped,    // the entry was not converted, or its output not written; reason says why
   };
   Step step = Step::Loading;
   int index = 0;           // 1-based position in the list
@@ -117,9 +131,11 @@ struct BatchResult {
 // An entry that is missing, of an unrecognised type, empty or undecodable is skipped and
 // recorded in skipped; the document keeps the previous picture and no output file is written
 // for it. So is an entry whose output name was already written in this run (the reason names
-// the entry that wrote it) or is one of the listed input files, and one too large for the
-// memory left (the reason says what it needs). Any other effect error or a failed write stops
-// the loop (End::Stopped, error names the file).
+// the entry that wrote it), is one of the listed input files or is a symbolic link (never
+// written through, even when one is put there meanwhile), and one too large for the
+// memory left (the reason says what it needs), and one whose output cannot be written (the
+// reason names the output; any file of that name is left as it was). Any other effect error
+// stops the loop (End::Stopped, error names the file).
 // Throws std::invalid_argument when effect has no routine or no batch output tag.
 BatchResult ConvertBatch(PictureDocument& document, const EffectSpec& effect,
                          const EffectParams& params, const BatchJob& job,

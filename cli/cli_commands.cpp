@@ -1,9 +1,12 @@
 #include "cli/cli_commands.h"
 
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include <algorithm>
+#include <cerrno>
 #include <cstdlib>
+#include <cstring>
 #include <exception>
 #include <filesystem>
 #include <fstream>
@@ -14,6 +17,7 @@
 
 #include "batch/batch_convert.h"
 #include "cli/cli_docs.h"
+#include "codecs/codec_internal.h"
 #include "codecs/picture_file.h"
 #include "data/startup_picture.h"
 #include "document/reshape.h"
@@ -25,40 +29,59 @@ namespace fs = std::filesystem;
 
 namespace {
 
-// A file of our own in the temporary folder, removed when done with.
-class TempFile {
- public:
-  explicit TempFile(const std::string& extension) {
-    std::string pattern = (fs::temp_directory_path() / "quillane-cli-XXXXXX").string() + extension;
-    const int fd = mkstemps(pattern.data(), static_cast<int>(extension.size()));
-    if (fd < 0) throw PictureFileError("cannot create a temporary file: " + pattern);
-    close(fd);
-    path_ = pattern;
+// Standard input is read whole into memory, never into a temporary file: nothing of it is
+// left on disk however the command ends, and a full disk cannot damage it. It is held to what
+// a picture file may be and to the memory this process may still take, checked before the
+// buffer grows; a stream that starts like no picture is refused at its first bytes.
+std::vector<std::uint8_t> ReadStandardInput() {
+  constexpr std::int64_t kMaxInput = std::int64_t{2} << 30;  // as for a picture file
+  constexpr std::size_t kSniffBytes = 64;
+  const auto tooLarge = [] {
+    return PictureFileError("standard input is larger than the " + MemoryAmount(kMaxInput) +
+                            " a picture file may be");
+  };
+  std::vector<std::uint8_t> bytes;
+  bytes.reserve(std::size_t{1} << 20);
+  std::vector<std::uint8_t> chunk(std::size_t{1} << 16);
+  bool sniffed = false;
+  for (;;) {
+    const std::size_t want = sniffed ? chunk.size() : kSniffBytes - bytes.size();
+    const ssize_t got = ::read(STDIN_FILENO, chunk.data(), want);
+    if (got < 0) {
+      if (errno == EINTR) continue;
+      throw PictureFileError(std::string("standard input cannot be read: ") + std::strerror(errno));
+    }
+    const auto size = static_cast<std::int64_t>(bytes.size()) + got;
+    if (size > kMaxInput) throw tooLarge();
+    if (static_cast<std::size_t>(size) > bytes.capacity()) {
+      // Doubled, up to one byte past the largest file: room enough to tell it is larger.
+      const std::int64_t grown =
+          std::min(static_cast<std::int64_t>(bytes.capacity()) * 2, kMaxInput + 1);
+      if (grown > AvailableMemory())
+        throw PictureFileError("standard input is too large for the memory available: it " +
+                               MemoryNeedText(grown));
+      bytes.reserve(static_cast<std::size_t>(grown));
+    }
+    bytes.insert(bytes.end(), chunk.begin(), chunk.begin() + got);
+    if (!sniffed && (got == 0 || bytes.size() == kSniffBytes)) {
+      if (codecs::SniffFamily(codecs::Bytes(bytes)).empty())
+        throw PictureFileError("standard input is not a picture the program reads");
+      sniffed = true;
+    }
+    if (got == 0) return bytes;
   }
-  ~TempFile() {
-    std::error_code ec;
-    fs::remove(path_, ec);
+}
+
+// The picture on standard input, decoded from memory by what its first bytes say it is.
+Bitmap32 DecodeStandardInput(const std::vector<std::uint8_t>& bytes) {
+  try {
+    return codecs::DecodeByContent(codecs::Bytes(bytes));
+  } catch (const std::bad_alloc&) {
+    throw PictureFileError("standard input: there is not enough memory to open the picture (" +
+                           MemoryAmount(AvailableMemory()) + " are available)");
+  } catch (const std::exception& e) {
+    throw PictureFileError(std::string("standard input: ") + e.what());
   }
-  const std::string& Path() const { return path_; }
-
- private:
-  std::string path_;
-};
-
-// The loader goes by the name's ending, so bytes from standard input are named by what their
-// first bytes say they are.
-std::string ExtensionForContent(const std::string& bytes) {
-  auto starts = [&](std::string_view magic) { return bytes.compare(0, magic.size(), magic) == 0; };
-  if (starts("\xFF\xD8")) return ".jpg";
-  if (starts("BM")) return ".bmp";
-  if (starts("GIF8")) return ".gif";
-  if (starts("\x89PNG")) return ".png";
-  if (starts(std::string_view("\0\0\1\0", 4))) return ".ico";
-  if (starts("\xD7\xCD\xC6\x9A") || starts(std::string_view("\1\0\x09\0", 4)) ||
-      starts(std::string_view("\2\0\x09\0", 4)))
-    return ".wmf";
-  if (bytes.size() > 44 && bytes.compare(40, 4, " EMF") == 0) return ".emf";
-  return ".unknown";
 }
 
 // The picture named by --input or INPUT ("-": standard input), or the built-in one when none is
@@ -68,12 +91,14 @@ std::optional<Bitmap32> InputOrBuiltInPicture(const Options& o, std::ostream& er
   std::string error;
   std::optional<Bitmap32> loaded;
   if (o.input == "-") {
-    const std::string bytes{std::istreambuf_iterator<char>(std::cin),
-                            std::istreambuf_iterator<char>()};
-    TempFile copy(ExtensionForContent(bytes));
-    std::ofstream(copy.Path(), std::ios::binary) << bytes;
-    loaded = LoadInputPicture(copy.Path(), error, err);
-    if (!loaded) error = "standard input is not a picture the program reads";
+    try {
+      loaded = DecodeStandardInput(ReadStandardInput());
+    } catch (const std::bad_alloc&) {
+      error = "standard input is too large for the memory available (" +
+              MemoryAmount(AvailableMemory()) + " are available)";
+    } catch (const std::exception& e) {
+      error = e.what();
+    }
   } else {
     loaded = LoadInputPicture(o.input, error, err);
   }
@@ -81,17 +106,42 @@ std::optional<Bitmap32> InputOrBuiltInPicture(const Options& o, std::ostream& er
   return loaded;
 }
 
-// Writes picture to o.output, or as o.format to out when the output is "-".
+// The bytes of picture in the type OutputTypeFor gives name, made in memory.
+std::vector<std::uint8_t> EncodeOutput(const Bitmap32& picture, const std::string& name) {
+  codecs::MemorySink sink;
+  switch (OutputTypeFor(name)) {
+    case OutputType::Jpeg:
+      return codecs::EncodeJpeg(picture, 90);
+    case OutputType::Png:
+      return codecs::EncodePng(picture);
+    case OutputType::Bitmap:
+      codecs::EncodeBitmap24(picture, sink);
+      return std::move(sink.bytes());
+    case OutputType::Metafile:
+      codecs::EncodeEnhancedMetafile(picture, sink);
+      return std::move(sink.bytes());
+    case OutputType::Unknown:
+      break;
+  }
+  throw PictureFileError("unknown output type: " + name);
+}
+
+// Standard output closed by its reader (a pipe into head): the command ends without a word.
+struct OutputClosed {};
+
+// Writes picture to o.output, or as o.format to out when the output is "-". That one is made
+// in memory: no file of it exists at any moment, so none can be left behind.
 void WriteOutput(const Bitmap32& picture, const Options& o, std::ostream& out) {
   if (o.output != "-") {
     SaveOutputPicture(picture, o.output);
     return;
   }
-  TempFile file("." + o.format);
-  SaveOutputPicture(picture, file.Path());
-  std::ifstream in(file.Path(), std::ios::binary);
-  out << in.rdbuf();
+  const std::vector<std::uint8_t> bytes = EncodeOutput(picture, "x." + o.format);
+  errno = 0;
+  out.write(reinterpret_cast<const char*>(bytes.data()),
+            static_cast<std::streamsize>(bytes.size()));
   out.flush();
+  if (!out && errno == EPIPE) throw OutputClosed();
   if (!out) throw PictureFileError("standard output could not be written");
 }
 
@@ -101,6 +151,8 @@ bool WriteOutputOrSay(const Bitmap32& picture, const Options& o, std::ostream& o
   try {
     WriteOutput(picture, o, out);
     return true;
+  } catch (const OutputClosed&) {
+    return false;
   } catch (const std::exception& e) {
     err << "quillane-cli: cannot write "
         << (o.output == "-" ? std::string("to standard output") : ShownName(o.output)) << ": "
@@ -216,7 +268,12 @@ class ProgressBar {
 
 int BatchCommand(const Options& o, std::ostream& out, std::ostream& err, bool terminal) {
   const std::string inputFolder = TrimBlanks(o.input);
-  BatchJob job{o.input, o.output, ScanBatchFolder(inputFolder)};
+  BatchScan scan = ScanBatchFolderTelling(inputFolder);
+  if (!scan.error.empty()) {
+    err << "quillane-cli: " << ShownName(scan.error) << "\n";
+    return kExitFailed;
+  }
+  BatchJob job{o.input, o.output, std::move(scan.files)};
   PictureDocument document;
   document.RandomState() = o.seed;
   ProgressBar bar(err);
@@ -245,26 +302,34 @@ int BatchCommand(const Options& o, std::ostream& out, std::ostream& err, bool te
   const BatchResult result = ConvertBatch(document, *o.effect, o.params, job, observer);
   bar.Finish();
 
-  if (result.end == BatchResult::End::Refused) return kExitFailed;
-  const std::size_t listed = job.files.size();
+  // Entries named like pictures that are no files are skipped pictures too.
+  std::vector<BatchSkipped> skipped;
+  for (auto& [name, reason] : scan.notFiles) skipped.push_back({name, reason});
+  skipped.insert(skipped.end(), result.skipped.begin(), result.skipped.end());
+  const auto listSkipped = [&] {
+    if (skipped.empty()) return;
+    err << "Skipped " << skipped.size() << (skipped.size() == 1 ? " picture:\n" : " pictures:\n");
+    for (const BatchSkipped& s : skipped)
+      err << "  " << ShownName(s.name) << ": " << ShownName(s.reason) << "\n";
+  };
+  if (result.end == BatchResult::End::Refused) {
+    listSkipped();
+    return kExitFailed;
+  }
+  const std::size_t listed = job.files.size() + scan.notFiles.size();
   if (result.end == BatchResult::End::Stopped)
     err << "quillane-cli: " << ShownName(result.error) << "\n";
   out << "Converted " << result.outputs.size() << " of " << listed
       << (listed == 1 ? " picture" : " pictures") << " into " << ShownName(TrimBlanks(o.output))
       << "\n";
-  if (!result.skipped.empty()) {
-    err << "Skipped " << result.skipped.size()
-        << (result.skipped.size() == 1 ? " picture:\n" : " pictures:\n");
-    for (const BatchSkipped& s : result.skipped)
-      err << "  " << ShownName(s.name) << ": " << ShownName(s.reason) << "\n";
-  }
+  listSkipped();
   if (result.end == BatchResult::End::Stopped) {
-    const std::size_t left = listed - result.outputs.size() - result.skipped.size();
+    const std::size_t left = listed - result.outputs.size() - skipped.size();
     err << "Stopped before the end; " << left
         << (left == 1 ? " picture was not converted.\n" : " pictures were not converted.\n");
     return kExitFailed;
   }
-  if (!result.AllConverted()) return kExitFailed;
+  if (!result.AllConverted() || !skipped.empty()) return kExitFailed;
   out << "The batch convert is successful.\n";
   return kExitOk;
 }
@@ -330,7 +395,7 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
   int status = kExitOk;
   auto write = [&](const Bitmap32& p, const std::string& file) {
     try {
-      SavePng(p, (folder / file).string());
+      SavePng(p, (folder / file).string(), LinkAtTarget::Refuse);
       return true;
     } catch (const std::exception& e) {
       err << "quillane-cli: cannot write " << ShownName((folder / file).string()) << ": "
@@ -375,15 +440,15 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
   }
 
   const std::string index = (folder / "index.html").string();
-  std::ofstream html(index, std::ios::binary | std::ios::trunc);
-  html << GalleryHtml(sourceName, {"Original", "original.png"}, menus, unavailable);
-  html.close();
-  if (!html) {
-    err << "quillane-cli: cannot write " << ShownName(index) << "\n";
+  try {
+    SaveTextFile(GalleryHtml(sourceName, {"Original", "original.png"}, menus, unavailable), index,
+                 LinkAtTarget::Refuse);
+  } catch (const std::exception& e) {
+    err << "quillane-cli: cannot write " << ShownName(index) << ": " << ShownName(e.what()) << "\n";
     return kExitFailed;
   }
   out << "Wrote " << written << (written == 1 ? " effect" : " effects") << " and the original into "
-      << o.output << "; open " << index << " to see them.\n";
+      << ShownName(o.output) << "; open " << ShownName(index) << " to see them.\n";
   return status;
 }
 
@@ -399,7 +464,14 @@ std::optional<Bitmap32> LoadInputPicture(const std::string& path, std::string& e
                 notices << caption << ": " << text << "\n";
               });
     if (!picture) {
-      error = path + ": no such file";
+      // Not there, or not reachable: a link loop or a folder that may not be entered is no
+      // missing file.
+      struct stat info {};
+      const int why = ::stat(path.c_str(), &info) == 0 ? 0 : errno;
+      error = path + ": " +
+              (why == ELOOP ? "a symbolic link loop (" + std::string(std::strerror(why)) + ")"
+               : why != 0 && why != ENOENT ? std::string(std::strerror(why))
+                                           : std::string("no such file"));
       return std::nullopt;
     }
     if (picture->Width() < 1) {

@@ -288,7 +288,9 @@ ParseResult ParseEffectCommand(Command command, const std::vector<std::string>& 
     try {
       o.params.SetList(name, ParseParamText(*param, *value));
     } catch (const ParamError& e) {
-      return Fail(e.what());
+      const std::string message = e.what();
+      if (message.find("--" + name) != std::string::npos) return Fail(message);
+      return Fail("--" + name + ": " + message);
     }
   }
 
@@ -308,25 +310,30 @@ ParseResult ParseGallery(const std::vector<std::string>& args) {
   o.command = Command::Gallery;
   bool haveFolder = false;
   bool haveInput = false;
+  bool optionsEnded = false;
   ArgumentWalker walker(args, 1);
   while (!walker.Done()) {
-    const std::string arg = walker.Take();
-    if (arg == "--input") {
+    const std::string arg = optionsEnded ? walker.TakeRaw() : walker.Take();
+    if (!optionsEnded && arg == "--") {
+      optionsEnded = true;
+      continue;
+    }
+    if (!optionsEnded && arg == "--input") {
       const std::optional<std::string> value = walker.TakeValue();
       if (!value || value->empty()) return Fail("--input needs a file name");
       if (haveInput) return Fail("--input given twice");
       o.input = *value;
       haveInput = true;
-    } else if (IsOption(arg) && arg != "-") {
-      return Fail("unknown option " + arg + " for gallery (quillane-cli --help shows the usage)");
-    } else if (haveFolder) {
-      return Fail("gallery: only one folder, but also got '" + arg + "'");
-    } else {
-      o.output = arg;
-      haveFolder = true;
+      continue;
     }
+    if (!optionsEnded && IsOption(arg) && arg != "-")
+      return Fail("unknown option " + arg + " for gallery (quillane-cli --help shows the usage)");
+    if (haveFolder) return Fail("gallery: only one folder, but also got '" + arg + "'");
+    o.output = arg;
+    haveFolder = true;
   }
   if (!haveFolder) return Fail("gallery: name the folder to write into");
+  if (o.output.empty()) return Fail("gallery: the folder's name is empty");
   return result;
 }
 
@@ -381,9 +388,23 @@ OutputType OutputTypeFor(const std::string& path) {
   return OutputType::Unknown;
 }
 
+// Whether -h or --help stands where an option may: not after "--", and not as the value of an
+// option (every "--name" but --version takes one, as does -o), so "-o -h" and "-- --help" are
+// names of files.
+bool AsksForHelp(const std::vector<std::string>& args) {
+  for (std::size_t i = 0; i < args.size(); ++i) {
+    const std::string& arg = args[i];
+    if (arg == "--") return false;
+    if (arg == "-h" || arg == "--help" || arg.rfind("--help=", 0) == 0) return true;
+    if (arg == "-o" ||
+        (arg.rfind("--", 0) == 0 && arg.find('=') == std::string::npos && arg != "--version"))
+      ++i;
+  }
+  return false;
+}
+
 ParseResult ParseCommandLine(const std::vector<std::string>& args) {
-  for (const std::string& arg : args)
-    if (arg == "--help" || arg == "-h") return Plain(Command::Help);
+  if (AsksForHelp(args)) return Plain(Command::Help);
   if (args.empty()) return Fail("no command given (quillane-cli --help shows the usage)");
 
   const std::string& verb = args[0];

@@ -2,10 +2,13 @@
 #include <unistd.h>
 
 #include <QtGlobal>
+#include <algorithm>
+#include <csignal>
 #include <iostream>
 #include <string>
 #include <vector>
 
+#include "batch/batch_convert.h"
 #include "cli/cli_commands.h"
 #include "cli/cli_options.h"
 #include "codecs/picture_file.h"
@@ -32,9 +35,15 @@ int main(int argc, char** argv) {
   const std::vector<std::string> args(argv + 1, argv + argc);
   const ParseResult parsed = ParseCommandLine(args);
   if (!parsed.Ok()) {
-    std::cerr << "quillane-cli: " << parsed.error << "\n";
+    // The error quotes what was typed, which may be any bytes.
+    std::cerr << "quillane-cli: " << quillane::ShownName(parsed.error) << "\n";
     return parsed.exitCode;
   }
   if (parsed.options.maxPixels > 0) quillane::SetMaxPicturePixels(parsed.options.maxPixels);
-  return RunCommand(parsed.options, std::cout, std::cerr, isatty(STDERR_FILENO) == 1);
+  // A reader that goes away (| head) shows as a failed write, so that the command can end
+  // quietly with a failure of its own instead of being killed part way.
+  std::signal(SIGPIPE, SIG_IGN);
+  const int code = RunCommand(parsed.options, std::cout, std::cerr, isatty(STDERR_FILENO) == 1);
+  std::cout.flush();
+  return std::cout ? code : std::max<int>(code, kExitFailed);
 }

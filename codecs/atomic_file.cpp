@@ -48,13 +48,26 @@ std::string FollowLinks(std::string path) {
   throw PictureFileError(std::strerror(ELOOP));
 }
 
+bool ModesUnsupported(int error) {
+  return error == ENOSYS || error == EPERM || error == ENOTSUP || error == EOPNOTSUPP;
+}
+
 }  // namespace
 
-AtomicFile::AtomicFile(std::string target) {
+AtomicFile::AtomicFile(std::string target, LinkAtTarget links) {
   if (target.empty() || target.back() == '/') throw PictureFileError("no file name given");
-  target_ = FollowLinks(std::move(target));
   struct stat old {};
-  if (::stat(target_.c_str(), &old) == 0) {
+  int found = 0;
+  if (links == LinkAtTarget::Follow) {
+    target_ = FollowLinks(std::move(target));
+    found = ::stat(target_.c_str(), &old);
+  } else {
+    // The rename at the end replaces whatever name stands here by then; it never follows it.
+    target_ = std::move(target);
+    found = ::lstat(target_.c_str(), &old);
+    if (found == 0 && S_ISLNK(old.st_mode)) throw PictureFileError("it is a symbolic link");
+  }
+  if (found == 0) {
     if (!S_ISREG(old.st_mode)) throw PictureFileError("it is not a file");
     // The permission bits, not access(): a read-only file stays read-only for root too.
     if ((old.st_mode & S_IWUSR) == 0 || ::access(target_.c_str(), W_OK) != 0) {
@@ -62,6 +75,7 @@ AtomicFile::AtomicFile(std::string target) {
     }
     replacing_ = true;
     mode_ = old.st_mode & 07777;
+    owner_ = old.st_uid;
     group_ = old.st_gid;
   }
   const std::string folder = FolderOf(target_);
@@ -94,9 +108,13 @@ std::string AtomicFile::HiddenName() const {
   std::random_device seed;
   std::mt19937_64 random(seed());
   char suffix[24];
-  std::snprintf(suffix, sizeof suffix, "%012llx.tmp",
-                static_cast<unsigned long long>(random() & 0xFFFFFFFFFFFFull));
-  return FolderOf(target_) + "/." + NameOf(target_) + "." + suffix;
+  const int suffixLength =
+      std::snprintf(suffix, sizeof suffix, ".%012llx.tmp",
+                    static_cast<unsigned long long>(random() & 0xFFFFFFFFFFFFull));
+  // The target's name is shortened so that the hidden one, a dot and the suffix longer, still
+  // fits where the target itself does: any name the file system takes can be saved.
+  const std::size_t room = NAME_MAX - 1 - static_cast<std::size_t>(suffixLength);
+  return FolderOf(target_) + "/." + NameOf(target_).substr(0, room) + suffix;
 }
 
 AtomicFile::~AtomicFile() {
@@ -145,11 +163,14 @@ void AtomicFile::Commit() {
   if (fd_ < 0) throw PictureFileError("the file is closed");
   Flush();
   if (replacing_) {
-    // The group first: changing it may clear the set-group-ID bit that fchmod then restores.
-    if (::fchown(fd_, static_cast<uid_t>(-1), group_) != 0) {
-      // Not a member of that group: the file keeps ours, as any new file would.
+    // Owner and group first: changing them may clear the set-ID bits that fchmod then restores.
+    // Run by root, the file stays its owner's (else its owner could no longer save it).
+    if (::fchown(fd_, owner_, group_) != 0 && ::fchown(fd_, static_cast<uid_t>(-1), group_) != 0) {
+      // Not a member of that group either: the file is ours, as any new file would be.
     }
-    if (::fchmod(fd_, mode_) != 0) Fail(errno);
+    // File systems without Unix modes (FAT sticks, some network shares) refuse them: the file
+    // then has whatever the mount gives every file, which is no reason not to save it.
+    if (::fchmod(fd_, mode_) != 0 && !ModesUnsupported(errno)) Fail(errno);
   }
   if (::fsync(fd_) != 0 && errno != EINVAL) Fail(errno);
   if (unnamed_) {

@@ -14,8 +14,11 @@ namespace quillane::codecs {
 // Writes the new content of target, which is either the old file or the complete new one,
 // whatever happens meanwhile:
 // - a symbolic link is followed, and the file it names is the one replaced (the link stays);
+//   with LinkAtTarget::Refuse it is refused instead ("it is a symbolic link"), and a link put
+//   there while the file is written is replaced, never followed;
 // - a target without write permission is refused ("the file is read-only");
-// - the new file takes the old one's permission bits and, where allowed, its group;
+// - the new file takes the old one's permission bits (where the file system has them) and,
+//   where allowed, its owner (run by root) and group;
 // - the content goes into an unnamed file in the target's folder (O_TMPFILE), given a name only
 //   when complete, so an interrupted save (a signal, a crash) leaves nothing behind. On file
 //   systems without unnamed files a hidden, randomly named one is used and removed on failure.
@@ -23,7 +26,7 @@ namespace quillane::codecs {
 // the file); Commit flushes, syncs and moves the file into place.
 class AtomicFile : public ByteSink {
  public:
-  explicit AtomicFile(std::string target);
+  explicit AtomicFile(std::string target, LinkAtTarget links = LinkAtTarget::Follow);
   ~AtomicFile() override;
   AtomicFile(const AtomicFile&) = delete;
   AtomicFile& operator=(const AtomicFile&) = delete;
@@ -41,8 +44,9 @@ class AtomicFile : public ByteSink {
   int fd_ = -1;
   bool unnamed_ = false;
   bool committed_ = false;
-  bool replacing_ = false;  // a file exists at target_; its mode and group are kept
+  bool replacing_ = false;  // a file exists at target_; its mode, owner and group are kept
   mode_t mode_ = 0;
+  uid_t owner_ = 0;
   gid_t group_ = 0;
   std::vector<char> buffer_;
 };

@@ -242,11 +242,12 @@ std::optional<Bitmap32> Decode(const std::string& path, const char* family, Deco
 }
 
 template <typename Encoder>
-void SaveAtomically(const Bitmap32& picture, const std::string& path, Encoder encode) {
+void SaveAtomically(const Bitmap32& picture, const std::string& path, Encoder encode,
+                    LinkAtTarget links = LinkAtTarget::Follow) {
   const std::string prefix = "Cannot save \"" + path + "\": ";
   if (picture.Empty()) throw PictureFileError(prefix + "there is no picture to save");
   try {
-    codecs::AtomicFile file(path);
+    codecs::AtomicFile file(path, links);
     encode(file);
     file.Commit();
   } catch (const PictureFileError& error) {
@@ -295,6 +296,36 @@ void SaveJpeg(const Bitmap32& picture, const std::string& path, int quality) {
     const std::vector<std::uint8_t> bytes = codecs::EncodeJpeg(picture, quality);
     sink.Write(bytes.data(), bytes.size());
   });
+}
+
+void SaveJpeg(const Bitmap32& picture, const std::string& path, int quality, LinkAtTarget links) {
+  SaveAtomically(
+      picture, path,
+      [&](codecs::ByteSink& sink) {
+        const std::vector<std::uint8_t> bytes = codecs::EncodeJpeg(picture, quality);
+        sink.Write(bytes.data(), bytes.size());
+      },
+      links);
+}
+
+void SavePng(const Bitmap32& picture, const std::string& path, LinkAtTarget links) {
+  SaveAtomically(
+      picture, path,
+      [&](codecs::ByteSink& sink) {
+        const std::vector<std::uint8_t> bytes = codecs::EncodePng(picture);
+        sink.Write(bytes.data(), bytes.size());
+      },
+      links);
+}
+
+void SaveTextFile(const std::string& text, const std::string& path, LinkAtTarget links) {
+  try {
+    codecs::AtomicFile file(path, links);
+    file.Write(text.data(), text.size());
+    file.Commit();
+  } catch (const PictureFileError& error) {
+    throw PictureFileError("Cannot save \"" + path + "\": " + error.what());
+  }
 }
 
 void SaveBitmap24(const Bitmap32& picture, const std::string& path) {

@@ -63,6 +63,17 @@ void SaveBitmap32(const Bitmap32& picture, const std::string& path);  // B, G, R
 void SaveMetafile(const Bitmap32& picture, const std::string& path);
 void SavePng(const Bitmap32& picture, const std::string& path);  // keeps the alpha byte
 
+// What a writer does with a symbolic link standing at the target's name.
+enum class LinkAtTarget {
+  Follow,  // the file it names is replaced and the link stays, as an explicit save does
+  Refuse,  // PictureFileError "it is a symbolic link", nothing written: for outputs whose names
+           // the program makes up in a folder others may write to (batch, gallery)
+};
+void SaveJpeg(const Bitmap32& picture, const std::string& path, int quality, LinkAtTarget links);
+void SavePng(const Bitmap32& picture, const std::string& path, LinkAtTarget links);
+// Any bytes, saved as the pictures are.
+void SaveTextFile(const std::string& text, const std::string& path, LinkAtTarget links);
+
 // If the name's last ".", "\" or "/" or ":" is a ".", everything from that dot on is replaced
 // by extension (given with its dot); otherwise extension is appended.
 std::string ReplaceExtension(const std::string& name, const std::string& extension);

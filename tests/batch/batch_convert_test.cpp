@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 #include <stdlib.h>
+#include <sys/stat.h>
 
 #include <filesystem>
 #include <fstream>
@@ -110,6 +111,36 @@ TEST_F(BatchFolder, ScanListsEachMaskInTurnIgnoringCaseAndSortedByName) {
   EXPECT_TRUE(ScanBatchFolder(in_ + "/nowhere").empty());
 }
 
+// Entries named like pictures that are no files were left out without a word.
+TEST_F(BatchFolder, ScanTellsWhichMatchingEntriesAreNoFiles) {
+  WriteBytes(In("a.jpg"), "x");
+  fs::create_directory(In("folder.jpg"));
+  fs::create_symlink("missing", In("dangling.jpg"));
+  fs::create_symlink("loop.bmp", In("loop.bmp"));
+  ASSERT_EQ(::mkfifo(In("pipe.wmf").c_str(), 0600), 0);
+  fs::create_directory(In("ignored"));
+  const BatchScan scan = ScanBatchFolderTelling(in_);
+  EXPECT_EQ(scan.files, std::vector<std::string>{"a.jpg"});
+  EXPECT_EQ(scan.error, "");
+  const std::pair<std::string, std::string> want[] = {
+      {"dangling.jpg", "it is a symbolic link to nothing"},
+      {"folder.jpg", "it is a folder"},
+      {"loop.bmp", "it is a symbolic link loop"},
+      {"pipe.wmf", "it is a FIFO"}};
+  ASSERT_EQ(scan.notFiles.size(), std::size(want));
+  for (std::size_t i = 0; i < std::size(want); ++i) {
+    EXPECT_EQ(scan.notFiles[i].first, want[i].first);
+    EXPECT_NE(scan.notFiles[i].second.find(In(want[i].first) +
+                                           " is not a picture file: " + want[i].second),
+              std::string::npos)
+        << scan.notFiles[i].second;
+  }
+  fs::create_symlink("self", In("self"));
+  EXPECT_NE(ScanBatchFolderTelling(In("self")).error.find("Cannot read the folder " + In("self")),
+            std::string::npos);
+  EXPECT_EQ(ScanBatchFolderTelling(In("nowhere")).error, "");  // missing: the Sorry message says it
+}
+
 TEST_F(BatchFolder, ConvertsEveryPictureIntoAJpegNamedAfterItsInput) {
   SaveJpeg(Picture(23, 17, 1), In("a.jpg"));
   SaveBitmap24(Picture(19, 11, 2), In("b.bmp"));
@@ -211,6 +242,91 @@ TEST_F(BatchFolder, OutputsAlreadyWrittenOrListedAsInputsAreNeverOverwritten) {
   EXPECT_EQ(ReadBytes(In("x-PencilSketch.jpg")), input);
 }
 
+// An output name of 238 to 255 bytes failed for its longer hidden temporary name, and one
+// output that could not be written stopped the whole batch.
+TEST_F(BatchFolder, AnOutputThatCannotBeWrittenIsSkippedAndTheBatchGoesOn) {
+  const std::string longest(238, 'l');  // its output name is 255 bytes, the most there can be
+  const std::string tooLong(251, 'm');  // its output name would be 268 bytes
+  fs::create_directories(Out("c-PencilSketch.jpg"));
+  for (const std::string& stem :
+       {std::string("a"), std::string("c"), longest, tooLong, std::string("z")})
+    SaveJpeg(Picture(6, 5, static_cast<int>(stem.size())), In(stem + ".jpg"));
+  for (const bool overlap : {false, true}) {
+    BatchJob job{in_, out_, ScanBatchFolder(in_)};
+    job.overlapStages = overlap;
+    PictureDocument document;
+    const BatchResult result = ConvertBatch(document, Pencil(), EffectParams(), job);
+    EXPECT_EQ(result.end, BatchResult::End::Completed);
+    EXPECT_EQ(result.outputs, (std::vector<std::string>{Out("a-PencilSketch.jpg"),
+                                                        Out(longest + "-PencilSketch.jpg"),
+                                                        Out("z-PencilSketch.jpg")}));
+    ASSERT_EQ(result.skipped.size(), 2u);
+    EXPECT_EQ(result.skipped[0].name, "c.jpg");
+    EXPECT_NE(result.skipped[0].reason.find(Out("c-PencilSketch.jpg")), std::string::npos);
+    EXPECT_EQ(result.skipped[1].name, tooLong + ".jpg");
+    EXPECT_NE(result.skipped[1].reason.find("File name too long"), std::string::npos)
+        << result.skipped[1].reason;
+    EXPECT_TRUE(fs::is_directory(Out("c-PencilSketch.jpg")));
+    EXPECT_EQ(std::distance(fs::directory_iterator(out_), fs::directory_iterator()), 4);
+  }
+}
+
+// A link planted in a shared output folder turned the file it named into a JPEG.
+TEST_F(BatchFolder, ALinkPlantedAtAnOutputNameIsSkippedAndItsFileLeftAlone) {
+  WriteBytes(root_ / "victim.conf", "secret");
+  fs::create_directory(out_);
+  fs::create_symlink("../victim.conf", Out("a-PencilSketch.jpg"));
+  fs::create_symlink("nowhere.jpg", Out("b-PencilSketch.jpg"));
+  for (const char* name : {"a.jpg", "b.jpg", "c.jpg"}) SaveJpeg(Picture(5, 4, name[0]), In(name));
+  PictureDocument document;
+  const BatchResult result =
+      ConvertBatch(document, Pencil(), EffectParams(), {in_, out_, ScanBatchFolder(in_)});
+  EXPECT_EQ(result.outputs, std::vector<std::string>{Out("c-PencilSketch.jpg")});
+  ASSERT_EQ(result.skipped.size(), 2u);
+  for (const BatchSkipped& s : result.skipped)
+    EXPECT_NE(s.reason.find("is a symbolic link"), std::string::npos) << s.reason;
+  EXPECT_EQ(ReadBytes((root_ / "victim.conf").string()), "secret");
+  EXPECT_TRUE(fs::is_symlink(Out("a-PencilSketch.jpg")));
+  EXPECT_FALSE(fs::exists(out_ + "/nowhere.jpg"));
+}
+
+// On a FAT stick "a-PencilSketch.jpg" and "A-PencilSketch.jpg" are one file, and the check by
+// name let the second entry overwrite the first's output. The stick is a FAT image mounted
+// through FUSE, once as it comes (the file system makes up an identity per name) and once
+// with the identities it keeps (use_ino). Saving over a file there failed: fchmod is ENOSYS.
+TEST_F(BatchFolder, OutputsThatAreOneFileOnADriveIgnoringCaseAreNotOverwritten) {
+  if (std::system("command -v fusefat mkfs.fat >/dev/null") != 0)
+    GTEST_SKIP() << "fusefat and mkfs.fat are needed (packages fusefat, dosfstools)";
+  SaveJpeg(Picture(6, 5, 1), In("a.jpg"));
+  SaveBitmap24(Picture(7, 5, 2), In("A.bmp"));
+  SaveBitmap24(Picture(8, 5, 3), In("b.bmp"));
+  const std::string image = (root_ / "stick.img").string();
+  fs::create_directory(out_);
+  for (const char* options : {"rw+", "rw+,use_ino"}) {
+    fs::remove(image);
+    ASSERT_EQ(std::system(("mkfs.fat -C '" + image + "' 4096 >/dev/null").c_str()), 0);
+    if (std::system(("fusefat -o " + std::string(options) + " '" + image + "' '" + out_ +
+                     "' >/dev/null 2>&1")
+                        .c_str()) != 0)
+      GTEST_SKIP() << "FUSE cannot mount here";
+    PictureDocument document;
+    const BatchJob job{in_, out_, ScanBatchFolder(in_)};
+    ConvertBatch(document, Pencil(), EffectParams(), job);
+    // Again over the outputs written before, on a file system without Unix modes.
+    const BatchResult result = ConvertBatch(document, Pencil(), EffectParams(), job);
+    const std::string written = ReadBytes(Out("a-PencilSketch.jpg"));
+    EXPECT_EQ(std::system(("umount '" + out_ + "'").c_str()), 0);
+    EXPECT_EQ(result.outputs,
+              (std::vector<std::string>{Out("a-PencilSketch.jpg"), Out("b-PencilSketch.jpg")}))
+        << options;
+    ASSERT_EQ(result.skipped.size(), 1u) << options;
+    EXPECT_EQ(result.skipped[0].name, "A.bmp");
+    EXPECT_NE(result.skipped[0].reason.find("already written for a.jpg"), std::string::npos)
+        << result.skipped[0].reason;
+    EXPECT_EQ(written, ExpectedJpeg(In("a.jpg"), EffectParams(), (root_ / "want.jpg").string()));
+  }
+}
+
 TEST_F(BatchFolder, HistoryGrowsPerPictureOnlyForEffectsThatRecordBatchSteps) {
   SaveBitmap24(Picture(10, 7, 7), In("a.bmp"));
   SaveBitmap24(Picture(11, 8, 8), In("b.bmp"));
@@ -242,7 +358,7 @@ TEST_F(BatchFolder, HistoryGrowsPerPictureOnlyForEffectsThatRecordBatchSteps) {
   EXPECT_EQ(loud.Working(), PencilSketch(first, PencilToneMode::Contrast, 45, 128));
 }
 
-// A failed write, an effect error and an output folder in the way of a file stop the loop: the
+// An effect error and an output folder in the way of a file stop the loop: the
 // overlap test compares those runs event by event, the window and command line tests show
 // their messages. A blank output folder is not read as the current one.
 TEST_F(BatchFolder, ABlankOutputFolderStopsBeforeAnyPicture) {

@@ -1,5 +1,7 @@
 // Runs the built quillane-cli and checks what it writes against the routines run here. The
 // parsing itself is cli_options_test's; these check that its results reach the routines.
+#include <unistd.h>
+
 #include <filesystem>
 #include <fstream>
 #include <functional>
@@ -146,6 +148,43 @@ TEST_F(CliRun, PictureTooLargeForTheMemoryLimitIsAMessageAndTheBatchGoesOn) {
   EXPECT_NE(err_.find("big.jpg: "), std::string::npos) << err_;
 }
 
+// An effect's name with an escape sequence in it set the terminal's title.
+TEST_F(CliRun, NamesAreShownEscapedInEveryMessage) {
+  EXPECT_EQ(Run("apply \"$(printf 'pen\\033]0;TITLE\\007')\" -o o.png"), 2);
+  EXPECT_NE(err_.find("unknown effect 'pen\\x1b]0;TITLE\\x07'"), std::string::npos) << err_;
+  EXPECT_EQ(Run("gallery \"$(printf 'g\\033[2J')\""), 0) << err_;
+  EXPECT_NE(out_.find("into g\\x1b[2J; open g\\x1b[2J/index.html"), std::string::npos) << out_;
+  for (const std::string& text : {out_, err_}) EXPECT_EQ(text.find('\x1b'), std::string::npos);
+}
+
+// An unreadable folder said there was no picture, a link loop that there was no such file,
+// and entries named like pictures that are no files were left out silently.
+TEST_F(CliRun, MessagesSayWhatIsReallyWrong) {
+  fs::create_directory(Path("in"));
+  SaveJpeg(Picture(6, 5), Path("in/a.jpg"));
+  fs::create_directory(Path("in/x.jpg"));
+  fs::create_symlink("nowhere.jpg", Path("in/gone.jpg"));
+  EXPECT_EQ(Run("batch pencil-sketch --input in --output out"), 1);
+  EXPECT_NE(out_.find("Converted 1 of 3 pictures"), std::string::npos) << out_;
+  EXPECT_NE(err_.find("  gone.jpg: in/gone.jpg is not a picture file: it is a symbolic link to "
+                      "nothing\n  x.jpg: in/x.jpg is not a picture file: it is a folder\n"),
+            std::string::npos)
+      << err_;
+
+  fs::create_symlink("loop.jpg", Path("loop.jpg"));
+  EXPECT_EQ(Run("convert loop.jpg -o o.png"), 1);
+  EXPECT_NE(err_.find("loop.jpg: a symbolic link loop"), std::string::npos) << err_;
+
+  // Read as someone else when run by root, who may read any folder.
+  fs::permissions(dir_, fs::perms::others_exec, fs::perm_options::add);
+  fs::permissions(Path("in"), fs::perms::none);
+  if (::geteuid() == 0) launcher_ = "setpriv --reuid=65534 --regid=65534 --clear-groups ";
+  EXPECT_EQ(Run("batch pencil-sketch --input in --output out"), 1);
+  launcher_.clear();
+  EXPECT_NE(err_.find("Cannot read the folder in: Permission denied"), std::string::npos) << err_;
+  fs::permissions(Path("in"), fs::perms::owner_all);
+}
+
 TEST_F(CliRun, ListShowsEveryEffectWithRangesAndDefaults) {
   ASSERT_EQ(Run("list"), 0);
   EXPECT_NE(out_.find("pencil-sketch"), std::string::npos);
@@ -186,6 +225,27 @@ TEST_F(CliRun, GalleryWritesAPngPerAvailableEffectAndAContactSheet) {
   EXPECT_NE(ReadText(Path("g2/index.html")).find("a&lt;b&gt;.bmp"), std::string::npos);
 }
 
+// index.html was written by a truncating stream: through a planted link, and over a read-only
+// file.
+TEST_F(CliRun, GalleryNeverWritesThroughALinkNorOverAReadOnlyFile) {
+  fs::create_directory(Path("g"));
+  std::ofstream(Path("victim")) << "kept";
+  fs::create_symlink("../victim", Path("g/index.html"));
+  fs::create_symlink("../victim", Path("g/pencil-sketch.png"));
+  EXPECT_EQ(Run("gallery g"), 1);
+  EXPECT_NE(err_.find("g/pencil-sketch.png: Cannot save"), std::string::npos) << err_;
+  EXPECT_NE(err_.find("g/index.html: Cannot save"), std::string::npos) << err_;
+  EXPECT_EQ(ReadText(Path("victim")), "kept");
+  EXPECT_TRUE(fs::is_regular_file(Path("g/pen-sketch.png")));
+
+  fs::remove(Path("g/index.html"));
+  std::ofstream(Path("g/index.html")) << "kept";
+  fs::permissions(Path("g/index.html"), fs::perms::owner_read);
+  EXPECT_EQ(Run("gallery g"), 1);
+  EXPECT_NE(err_.find("index.html\": the file is read-only"), std::string::npos) << err_;
+  EXPECT_EQ(ReadText(Path("g/index.html")), "kept");
+}
+
 TEST_F(CliRun, BatchConvertsTheFolderAndListsSkippedFiles) {
   fs::create_directory(Path("in"));
   SaveJpeg(Picture(20, 15), Path("in/a.jpg"));
@@ -212,8 +272,10 @@ TEST_F(CliRun, BatchConvertsTheFolderAndListsSkippedFiles) {
   fs::remove(out + "/b-PencilSketch.jpg");
   fs::create_directory(out + "/b-PencilSketch.jpg");
   EXPECT_EQ(Run("batch pencil-sketch --input '" + Path("in") + "' --output '" + out + "'"), 1);
-  EXPECT_NE(err_.find("Stopped before the end; 1 picture was not converted."), std::string::npos)
+  // An output that cannot be written is one skipped picture; the others are still converted.
+  EXPECT_NE(err_.find("  b.BMP: Cannot save \"" + out + "/b-PencilSketch.jpg\""), std::string::npos)
       << err_;
+  EXPECT_NE(out_.find("Converted 1 of 3 pictures"), std::string::npos) << out_;
 
   EXPECT_EQ(batch("", "nowhere"), 1);
   EXPECT_NE(err_.find("Sorry: Input Director in not exist."), std::string::npos) << err_;

@@ -80,6 +80,11 @@ TEST(ParseCommandLineTest, WrongCommandLinesAreUsageErrors) {
        "--seed must be an integer from 0 to 4294967295"},
       {{"batch", "pencil-sketch", "--input", "in"}, ""},
       {{"gallery"}, ""},
+      {{"gallery", ""}, "the folder's name is empty"},
+      {{"gallery", "--", "a", "b"}, "only one folder"},
+      {{"apply", "realism", "--kernel", "1,2", "-o", "o.png"}, "--kernel must be"},
+      {{"apply", "realism", "--kernel=1,2,1,0,x,0,-1,-1,-1", "-o", "o.png"},
+       "--kernel: 'x' is not a valid integer"},
   };
   for (const auto& [args, says] : wrong) {
     const ParseResult r = Parse(args);
@@ -114,9 +119,30 @@ TEST(ParseCommandLineTest, EffectsWithoutARoutineOrBatchPanelAreRefused) {
   }
 }
 
+// "-h" and "--help" were help wherever they stood, even as the names of files.
+TEST(ParseCommandLineTest, HelpOnlyWhereAnOptionMayStand) {
+  using Args = std::vector<std::string>;
+  for (const Args& args : {Args{"--help"}, Args{"-h", "apply"}, Args{"apply", "nothing", "-h"},
+                           Args{"convert", "a.png", "--help", "-o", "b.png"},
+                           Args{"gallery", "--help=me"}, Args{"list", "-h"}})
+    EXPECT_EQ(Parse(args).options.command, Command::Help) << args.back();
+  EXPECT_EQ(Parse({"convert", "--", "--help", "-o", "out.png"}).exitCode, kExitUsage);
+  const ParseResult named = Parse({"convert", "-o", "out.png", "--", "--help"});
+  ASSERT_TRUE(named.Ok()) << named.error;
+  EXPECT_EQ(named.options.input, "--help");
+  const ParseResult output = Parse({"convert", "-o", "-h", "--", "-h"});
+  EXPECT_FALSE(output.Ok());  // the output "-h" has no type; help is not what was asked
+  EXPECT_NE(output.error.find("'-h'"), std::string::npos) << output.error;
+  const ParseResult input = Parse({"batch", "pencil-sketch", "--input", "--help", "--output", "o"});
+  ASSERT_TRUE(input.Ok()) << input.error;
+  EXPECT_EQ(input.options.input, "--help");
+  const ParseResult folder = Parse({"gallery", "--", "-h"});
+  ASSERT_TRUE(folder.Ok()) << folder.error;
+  EXPECT_EQ(folder.options.output, "-h");
+}
+
 TEST(ParseCommandLineTest, HelpVersionListAndGallery) {
   EXPECT_EQ(Parse({"--help"}).options.command, Command::Help);
-  EXPECT_EQ(Parse({"apply", "nothing", "-h"}).options.command, Command::Help);
   EXPECT_EQ(Parse({"--version"}).options.command, Command::Version);
   EXPECT_EQ(Parse({"list"}).options.command, Command::List);
   const ParseResult g = Parse({"gallery", "out dir", "--input", "p.png"});

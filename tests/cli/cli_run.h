@@ -39,8 +39,8 @@ class CliRun : public ::testing::Test {
   // Runs quillane-cli in the test's folder with arguments (already quoted as the shell needs);
   // its exit code, with out_ and err_ holding what it printed.
   int Run(const std::string& arguments, const std::string& shellPrefix = "") {
-    const std::string command = shellPrefix + "cd '" + dir_ + "' && '" + QUILLANE_CLI_PATH + "' " +
-                                arguments + " >stdout.txt 2>stderr.txt";
+    const std::string command = shellPrefix + "cd '" + dir_ + "' && " + launcher_ + "'" +
+                                QUILLANE_CLI_PATH + "' " + arguments + " >stdout.txt 2>stderr.txt";
     const int status = std::system(command.c_str());
     out_ = ReadText(Path("stdout.txt"));
     err_ = ReadText(Path("stderr.txt"));
@@ -48,6 +48,7 @@ class CliRun : public ::testing::Test {
   }
 
   std::string dir_;
+  std::string launcher_;  // a command that runs the program ("setpriv ..."), or nothing
   std::string out_;
   std::string err_;
 };

@@ -7,6 +7,7 @@
 #include <unistd.h>
 
 #include <filesystem>
+#include <functional>
 
 #include "tests/codecs/test_support.h"
 #include "tests/file_size_limit.h"
@@ -175,6 +176,51 @@ TEST_F(PictureFiles, SaveKeepsModeLinksAndReadOnlyFilesAndLeavesNoTemporaryFile)
   ASSERT_EQ(::waitpid(child, &status, 0), child);
   EXPECT_TRUE(WIFSIGNALED(status));
   EXPECT_EQ(Entries(), (std::vector<std::string>{"link.jpg", "locked.jpg", "private.jpg"}));
+}
+
+// The hidden temporary name was 18 bytes longer than the target's, so names of 238 to 255
+// bytes could not be saved.
+TEST_F(PictureFiles, EveryNameTheFileSystemTakesCanBeSaved) {
+  for (const std::size_t length : {238u, 254u, 255u}) {
+    const std::string name = std::string(length - 4, 'n') + ".bmp";
+    SaveBitmap24(PatternPicture(3, 2), Path(name));
+    SaveBitmap24(PatternPicture(4, 2), Path(name));  // over an existing file too
+    EXPECT_EQ(LoadPictureFile(Path(name))->Width(), 4) << length;
+    EXPECT_EQ(Entries(), std::vector<std::string>{name});
+    std::filesystem::remove(Path(name));
+  }
+}
+
+TEST_F(PictureFiles, WritersAskedToRefuseLinksWriteNothingThroughOne) {
+  WriteBytes(Path("victim"), {7});
+  std::filesystem::create_symlink("victim", Path("link.png"));
+  const Bitmap32 picture = PatternPicture(3, 3);
+  const std::function<void()> saves[] = {
+      [&] { SavePng(picture, Path("link.png"), LinkAtTarget::Refuse); },
+      [&] { SaveJpeg(picture, Path("link.png"), 90, LinkAtTarget::Refuse); },
+      [&] { SaveTextFile("<html>", Path("link.png"), LinkAtTarget::Refuse); }};
+  for (const auto& save : saves) EXPECT_TRUE(Contains(ErrorOf(save), "it is a symbolic link"));
+  EXPECT_EQ(ReadBytes(Path("victim")), std::vector<std::uint8_t>{7});
+  SaveTextFile("<html>", Path("page.html"), LinkAtTarget::Refuse);
+  EXPECT_EQ(ReadBytes(Path("page.html")),
+            (std::vector<std::uint8_t>{'<', 'h', 't', 'm', 'l', '>'}));
+  EXPECT_EQ(Entries(), (std::vector<std::string>{"link.png", "page.html", "victim"}));
+}
+
+// Run by root, a save over another user's file made root its owner, and then the owner's own
+// saves were refused.
+TEST_F(PictureFiles, SaveByRootKeepsTheFilesOwner) {
+  if (::geteuid() != 0) GTEST_SKIP() << "only root may give a file to another user";
+  WriteBytes(Path("theirs.bmp"), {1});
+  ASSERT_EQ(::chown(Path("theirs.bmp").c_str(), 4321, 4322), 0);
+  ::chmod(Path("theirs.bmp").c_str(), 02640);
+  SaveBitmap24(PatternPicture(2, 2), Path("theirs.bmp"));
+  struct stat info {};
+  ASSERT_EQ(::stat(Path("theirs.bmp").c_str(), &info), 0);
+  EXPECT_EQ(info.st_uid, 4321u);
+  EXPECT_EQ(info.st_gid, 4322u);
+  EXPECT_EQ(info.st_mode & 07777, 02640u);
+  EXPECT_EQ(LoadPictureFile(Path("theirs.bmp"))->Width(), 2);
 }
 
 TEST_F(PictureFiles, EmptyPictureIsNotSaved) {

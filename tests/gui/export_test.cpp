@@ -1,6 +1,11 @@
 // Print, wallpaper, mail and Help. The desktop's programs are stand-in scripts put first on
 // PATH that record their arguments and answer as told; the print goes into a real PDF.
 #include <QAction>
+#include <QDBusConnection>
+#include <QDBusMessage>
+#include <QDBusMetaType>
+#include <QDBusObjectPath>
+#include <QDBusVirtualObject>
 #include <QDir>
 #include <QPrinter>
 #include <QProcess>
@@ -150,8 +155,6 @@ TEST_F(Export, EachDesktopIsToldInItsOwnWayAndAFailureSaysWhyAndWhere) {
       {"XFCE", "xfconf-query", 0, 3,
        "/backdrop/screen0/monitor0/workspace0/last-image\\n/a/b\\n"
        "/backdrop/screen0/monitorHDMI-1/workspace1/last-image\\n"},
-      {"", "gdbus", 1, 1, "", "Error: no portal",
-       "the desktop portal did not take it: gdbus ended with code 1 (Error: no portal)"},
   };
   for (const Case& c : cases) {
     SCOPED_TRACE(c.program);
@@ -171,6 +174,78 @@ TEST_F(Export, EachDesktopIsToldInItsOwnWayAndAFailureSaysWhyAndWhere) {
     // Only the name a desktop took last stays; one refused is not left behind.
     EXPECT_EQ(QDir(DataFile("")).entryList({"wallpaper-*"}, QDir::Files).size(), 1);
   }
+}
+
+// The desktop portal on a bus of the test's own: it answers the call with the request's path,
+// then settles the request with answer in the request's Response signal.
+class StandInPortal : public QDBusVirtualObject {
+ public:
+  uint answer = 0;
+  std::vector<QVariantList> calls;
+
+  QString introspect(const QString&) const override { return {}; }
+  bool handleMessage(const QDBusMessage& message, const QDBusConnection& connection) override {
+    if (message.member() != "SetWallpaperURI") return false;
+    calls.push_back(message.arguments());
+    const QVariantMap options = qdbus_cast<QVariantMap>(message.arguments().value(2));
+    const QString handle = "/org/freedesktop/portal/desktop/request/" +
+                           message.service().mid(1).replace('.', '_') + "/" +
+                           options.value("handle_token").toString();
+    QDBusConnection bus(connection);
+    bus.send(message.createReply(QVariant::fromValue(QDBusObjectPath(handle))));
+    QDBusMessage response =
+        QDBusMessage::createSignal(handle, "org.freedesktop.portal.Request", "Response");
+    response << answer << QVariantMap();
+    bus.send(response);
+    return true;
+  }
+};
+
+// Success was shown as soon as the portal took the request, before it said whether the
+// picture was set.
+TEST_F(Export, ThePortalsAnswerIsAwaitedBeforeSuccessIsShown) {
+  if (QStandardPaths::findExecutable("dbus-daemon").isEmpty())
+    GTEST_SKIP() << "dbus-daemon is needed for a bus of the test's own";
+  QProcess daemon;
+  daemon.start("dbus-daemon", {"--session", "--nofork", "--print-address"});
+  ASSERT_TRUE(daemon.waitForReadyRead(10000));
+  const QByteArray address = daemon.readLine().trimmed();
+  saved_.push_back({"DBUS_SESSION_BUS_ADDRESS", qgetenv("DBUS_SESSION_BUS_ADDRESS")});
+  qputenv("DBUS_SESSION_BUS_ADDRESS", address);
+  qputenv("XDG_CURRENT_DESKTOP", "");
+  const QString sorry = "The wallpaper could not be set: the desktop portal did not take it: ";
+  const QString where = ".\nThe picture was saved as " + DataFile("wallpaper.bmp");
+
+  Click("SpeedButton9");  // nobody there to answer
+  ASSERT_EQ(platform_.messages.size(), 1u);
+  EXPECT_TRUE(platform_.messages[0].text.startsWith(sorry))
+      << platform_.messages[0].text.toStdString();
+  EXPECT_TRUE(platform_.messages[0].text.endsWith(where));
+
+  StandInPortal portal;
+  QDBusConnection bus = QDBusConnection::connectToBus(QString::fromLatin1(address), "portal");
+  ASSERT_TRUE(bus.registerVirtualObject("/org/freedesktop/portal/desktop", &portal));
+  ASSERT_TRUE(bus.registerService("org.freedesktop.portal.Desktop"));
+  const std::pair<uint, Message> answers[] = {
+      {0, {"ok!", "Set as wallpaper successful!"}},
+      {2, {"Sorry", sorry + "it refused the picture" + where}},
+      {1, {"Sorry", sorry + "it was cancelled" + where}}};
+  for (const auto& [answer, message] : answers) {
+    platform_.messages.clear();
+    portal.answer = answer;
+    Click("SpeedButton9");
+    EXPECT_EQ(platform_.messages, std::vector<Message>{message}) << answer;
+  }
+  QDBusConnection::disconnectFromBus("portal");
+  daemon.kill();
+  daemon.waitForFinished();
+
+  ASSERT_EQ(portal.calls.size(), 3u);
+  const QString uri = portal.calls[0].value(1).toString();
+  EXPECT_TRUE(uri.startsWith("file://") && uri.contains("/wallpaper-")) << uri.toStdString();
+  const QVariantMap options = qdbus_cast<QVariantMap>(portal.calls[0].value(2));
+  EXPECT_EQ(options.value("show-preview"), QVariant(false));
+  EXPECT_EQ(options.value("set-on"), QVariant("background"));
 }
 
 TEST_F(Export, MailHandsThePictureToTheMailProgramOrSaysWhereItIs) {
