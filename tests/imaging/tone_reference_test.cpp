@@ -6,6 +6,7 @@
 #include "imaging/numeric.h"
 #include "imaging/tone.h"
 #include "tests/imaging/random_picture.h"
+#include "tests/reference/imaging_reference.h"
 
 namespace quillane {
 namespace {
