@@ -11,6 +11,7 @@
 #include "imaging/tone.h"
 #include "tests/imaging/fast_path_support.h"
 #include "tests/reference/imaging_reference.h"
+#include "tests/reference/paint_reference.h"
 #include "tests/reference/surface_reference.h"
 
 namespace quillane {
