@@ -9,6 +9,7 @@
 #include "effects/surface/stria.h"
 #include "tests/imaging/fast_path_support.h"
 #include "tests/reference/adjust_reference.h"
+#include "tests/reference/surface_reference.h"
 
 namespace quillane {
 namespace {

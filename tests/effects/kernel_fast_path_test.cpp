@@ -11,6 +11,7 @@
 #include "effects/surface/emboss.h"
 #include "imaging/numeric.h"
 #include "tests/imaging/fast_path_support.h"
+#include "tests/reference/surface_reference.h"
 
 namespace quillane {
 namespace {
