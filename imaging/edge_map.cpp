@@ -124,43 +124,4 @@ void InvertedSobelEdges(Bitmap32& bitmap) {
   }
 }
 
-Bitmap32 InvertedSobelEdgesReference(const Bitmap32& input) {
-  const int w = input.Width();
-  const int h = input.Height();
-  const Bitmap32 snapshot = input;
-  Bitmap32 work = input;
-  const int lineKernel[3][3] = {{-1, -1, -1}, {0, 6, 0}, {-1, -1, -1}};
-  const int gradientKernel[3][3] = {{1, 0, -1}, {1, 0, -1}, {1, 0, -1}};
-  std::uint8_t Pixel::*const channels[] = {&Pixel::r, &Pixel::g, &Pixel::b};
-  for (int y = 1; y <= h - 2; ++y)
-    for (int x = 1; x <= w - 2; ++x)
-      for (auto channel : channels) {
-        int line = 0;
-        int gradient = 0;
-        for (int j = -1; j <= 1; ++j)
-          for (int i = -1; i <= 1; ++i) {
-            const int v = snapshot.At(x + i, y + j).*channel;
-            line += lineKernel[j + 1][i + 1] * v;
-            gradient += gradientKernel[j + 1][i + 1] * v;
-          }
-        line = std::clamp(line, 0, 255);
-        gradient = std::clamp(gradient, 0, 255);
-        work.At(x, y).*channel = static_cast<std::uint8_t>(std::max(line, gradient));
-      }
-  for (int y = 1; y <= h - 2; ++y) {
-    CopyColour(work.At(0, y), work.At(1, y));
-    CopyColour(work.At(w - 1, y), work.At(w - 2, y));
-  }
-  for (int x = 0; x < w; ++x) CopyColour(work.At(x, 0), work.At(x, 1));
-  for (int x = 0; x < w; ++x) CopyColour(work.At(x, h - 1), work.At(x, h - 2));
-  for (int y = 0; y < h; ++y)
-    for (int x = 0; x < w; ++x) {
-      Pixel& p = work.At(x, y);
-      p.b = static_cast<std::uint8_t>(255 - p.b);
-      p.g = static_cast<std::uint8_t>(255 - p.g);
-      p.r = static_cast<std::uint8_t>(255 - p.r);
-    }
-  return work;
-}
-
 }  // namespace quillane

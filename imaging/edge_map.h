@@ -37,10 +37,4 @@ void GrayEdgeCells(const Bitmap32& source, int y, int level, std::uint8_t* cells
 // them beside the picture itself. For sources of at least 3 by 3; any thread, any order of rows.
 void GrayEdgeRow(const Bitmap32& source, int y, std::uint8_t* gray);
 
-// The same edge map computed the plain way, pixel by pixel and channel by channel from a
-// snapshot, border columns, border rows, then the inversion. InvertedSobelEdges must equal it byte
-// for byte, alpha included; it is kept as the oracle for the banded, threaded fast path. For
-// pictures of at least 3 by 3.
-Bitmap32 InvertedSobelEdgesReference(const Bitmap32& input);
-
 }  // namespace quillane

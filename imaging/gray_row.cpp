@@ -91,10 +91,4 @@ void GrayRowInto(const Pixel* in, Pixel* out, int width, std::uint32_t set) {
   PlainGrayRow(in, out, width, set);
 }
 
-void GrayRowIntoReference(const Pixel* in, Pixel* out, int width, std::uint32_t set) {
-  for (int x = 0; x < width; ++x)
-    out[x] =
-        std::bit_cast<Pixel>(GrayValue(in[x].r, in[x].g, in[x].b) * 0x010101u | set | 0xFF000000u);
-}
-
 }  // namespace quillane

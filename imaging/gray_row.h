@@ -13,7 +13,4 @@ namespace quillane {
 // for this processor is chosen once per call.
 void GrayRowInto(const Pixel* in, Pixel* out, int width, std::uint32_t set);
 
-// The same through GrayValue, pixel by pixel: what the faster variants must equal.
-void GrayRowIntoReference(const Pixel* in, Pixel* out, int width, std::uint32_t set);
-
 }  // namespace quillane

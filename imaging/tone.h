@@ -61,12 +61,6 @@ struct HslFractions {
 };
 HslFractions HslFractionsOf(int red, int green, int blue);
 
-// The two conversions written straight from the formulas above, one branch per case. The
-// table- and integer-based RgbToHsl and HslToRgb must equal them for every input; they are
-// kept as the oracles for those fast paths.
-Hsl RgbToHslReference(int r, int g, int b);
-Rgb HslToRgbReference(int h, int s, int l);
-
 // The lightness contrast curve for L (0..100) and the contrast position c (0..89):
 // L1 = L - c + 45, k = tan(c pi / 180); L' = Round(k (L1 - 50)) + 50 for c >= 45 and
 // Round(k (L1 - P)) + P with P = 100 - c below; limited to 0..100. Extended precision.
@@ -85,10 +79,6 @@ std::array<std::uint8_t, 256> PencilContrastGrayLevels(int c);
 // What PencilLightingPass makes of each gray value: the value plus 2 (v - 128), limited to
 // 0..255.
 std::array<std::uint8_t, 256> PencilLightingLevels(int v);
-
-// PencilContrastPass pixel by pixel through the reference conversions and LightnessContrast;
-// the oracle that the fast pass must equal.
-Bitmap32 PencilContrastPassReference(const Bitmap32& input, int c);
 
 // Every pixel becomes its gray value plus 2 (v - 128), limited to 0..255, in B, G and R;
 // alpha 255. The input is not changed.

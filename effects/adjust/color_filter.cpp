@@ -10,10 +10,8 @@
 #include "imaging/tone.h"
 
 namespace quillane {
-namespace {
 
-// The channels a filter raises to 255, as a 0xAARRGGBB word.
-std::uint32_t Raised(ColorFilterKind kind) {
+std::uint32_t ColorFilterRaisedChannels(ColorFilterKind kind) {
   const int k = static_cast<int>(kind);
   const bool red = k == 1 || k == 4 || k == 6;
   const bool green = k == 2 || k == 4 || k == 5;
@@ -21,25 +19,10 @@ std::uint32_t Raised(ColorFilterKind kind) {
   return (red ? 0x00FF0000u : 0u) | (green ? 0x0000FF00u : 0u) | (blue ? 0x000000FFu : 0u);
 }
 
-}  // namespace
-
 Bitmap32 ColorFilter(const Bitmap32& base, ColorFilterKind kind) {
-  const std::uint32_t set = Raised(kind);
+  const std::uint32_t set = ColorFilterRaisedChannels(kind);
   return MapRows(base, 1,
                  [set](const Pixel* in, Pixel* out, int w, int) { GrayRowInto(in, out, w, set); });
-}
-
-Bitmap32 FilterReference(const Bitmap32& base, ColorFilterKind kind) {
-  const std::uint32_t set = Raised(kind);
-  Bitmap32 out = base;
-  const int w = out.Width();
-  for (int y = 0; y < out.Height(); ++y) {
-    Pixel* row = out.ScanLine(y);
-    ConvertRowToGray(row, w);
-    for (int x = 0; x < w; ++x)
-      row[x] = std::bit_cast<Pixel>(std::bit_cast<std::uint32_t>(row[x]) | set);
-  }
-  return out;
 }
 
 const EffectSpec& ColorFilterEffect() {

@@ -1,6 +1,8 @@
 // Colour filter: a gray picture seen through a strong colour filter.
 #pragma once
 
+#include <cstdint>
+
 #include "imaging/bitmap32.h"
 
 namespace quillane {
@@ -13,7 +15,7 @@ enum class ColorFilterKind { Red = 1, Green, Blue, Yellow, Cyan, Purple };
 // become 255: red; green; blue; red and green; green and blue; red and blue. Alpha 255.
 Bitmap32 ColorFilter(const Bitmap32& base, ColorFilterKind kind);
 
-// The same made the plain way, row by row in place on a copy: what filter must equal.
-Bitmap32 FilterReference(const Bitmap32& base, ColorFilterKind kind);
+// The channels that filter kind raises to 255, as a 0xAARRGGBB word (alpha not among them).
+std::uint32_t ColorFilterRaisedChannels(ColorFilterKind kind);
 
 }  // namespace quillane

@@ -53,28 +53,12 @@ inline Pixel Tinted(Pixel p, const Tint& t) {
 // The zone layouts: row 0 and column 0 are copied, every other pixel of row y takes the tint
 // tints[zone(x)], where zone = rowZones(y, cuts) is the row's zone function. The zone changes
 // only at the x that rowZones adds to cuts (when cuts is given), so the fast pass tints whole
-// runs between them; the plain one asks the zone of every pixel.
+// runs between them; the plain form asks the zone of every pixel (ColorPanelZone).
 struct Cuts {
   std::int64_t at[8] = {};
   int count = 0;
   void Add(std::int64_t x) { at[count++] = x; }
 };
-
-template <typename RowZones>
-Bitmap32 ZonedReference(const Bitmap32& source, const Tint* tints, RowZones rowZones) {
-  const int w = source.Width(), h = source.Height();
-  Bitmap32 out(w, h);
-  if (h > 0)
-    std::memcpy(out.ScanLine(0), source.ScanLine(0), sizeof(Pixel) * static_cast<std::size_t>(w));
-  for (int y = 1; y < h; ++y) {
-    const Pixel* in = source.ScanLine(y);
-    Pixel* row = out.ScanLine(y);
-    row[0] = in[0];
-    const auto zone = rowZones(y, nullptr);
-    for (int x = 1; x < w; ++x) row[x] = Tinted(in[x], tints[zone(x)]);
-  }
-  return out;
-}
 
 template <std::size_t kZones, typename RowZones>
 Bitmap32 Zoned(const Bitmap32& source, const Tint (&tints)[kZones], RowZones rowZones) {
@@ -120,29 +104,6 @@ std::int64_t FirstTrue(std::int64_t estimate, Pred pred) {
 
 std::int64_t Floor(Extended v) {
   return static_cast<std::int64_t>(std::floor(v));
-}
-
-Bitmap32 Panel2x2Reference(const Bitmap32& source) {
-  Bitmap32 base = source;
-  Bitmap32 small = source;
-  ResampleNearest(small, 0.5L, 0.5L);
-  const int w = small.Width(), h = small.Height();
-  const auto put = [](Pixel& target, Pixel p, const Tint& t) {
-    const Pixel q = Tinted(p, t);
-    target = Pixel{q.b, q.g, q.r, target.a};
-  };
-  for (int y = 1; y < h; ++y) {
-    const Pixel* s = small.ScanLine(y);
-    Pixel* top = base.ScanLine(y);
-    Pixel* bottom = base.ScanLine(h + y);
-    for (int x = 1; x < w; ++x) {
-      put(top[x], s[x], kFloodA);
-      put(top[w + x], s[x], kFloodB);
-      put(bottom[x], s[x], kFloodC);
-      put(bottom[w + x], s[x], kFloodD);
-    }
-  }
-  return base;
 }
 
 // The half-size copy is w = W div 2 by h = H div 2, and its pixel (x, y) is the source's
@@ -195,25 +156,6 @@ constexpr Tint kTiles[3][3] = {
      {.addG = 80, .addB = 80, .clear = kRed},
      {.addR = 80, .addG = 80, .clear = kBlue}},
 };
-
-Bitmap32 Panel3x3Reference(const Bitmap32& source) {
-  Bitmap32 small = source;
-  ResampleNearest(small, 1.0L / 3, 1.0L / 3);
-  if (small.Empty()) return Bitmap32();
-  const int w = small.Width(), h = small.Height();
-  Bitmap32 out(3 * w, 3 * h);
-  for (int y = 0; y < 3 * h; ++y) {
-    const Pixel* s = small.ScanLine(y % h);
-    Pixel* row = out.ScanLine(y);
-    for (int c = 0; c < 3; ++c)
-      for (int x = 0; x < w; ++x) {
-        Pixel p = Tinted(s[x], kTiles[y / h][c]);
-        p.a = 0;
-        row[c * w + x] = p;
-      }
-  }
-  return out;
-}
 
 // The third-size copy is not made: each of its rows is picked from the source row it comes
 // from, as ResampleNearest would, into a buffer that the nine tiles' rows are tinted from.
@@ -292,7 +234,7 @@ auto Pane3x3Zones(int w, int h) {
 }
 
 // Zone numbers of the catercorner triangles: bit 1 lower-left of the main diagonal, bit 0
-// right of the anti-diagonal.
+// right of the anti-diagonal. Panel2x2's quadrants take the same floods in the same order.
 constexpr Tint kTriangles[4] = {kFloodA, kFloodB, kFloodC, kFloodD};
 
 auto Catercorner4Zones(int w, int h) {
@@ -349,6 +291,40 @@ auto Catercorner16Zones(int w, int h) {
 
 }  // namespace
 
+Pixel ColorPanelTinted(Pixel p, PanelLayout layout, int tile) {
+  const bool nine = layout == PanelLayout::Panel3x3 || layout == PanelLayout::Pane3x3;
+  if (tile < 0 || tile >= (nine ? 9 : 4)) return p;
+  const auto at = static_cast<std::size_t>(tile);
+  switch (layout) {
+    case PanelLayout::Panel2x2:
+    case PanelLayout::Catercorner4:
+    case PanelLayout::Catercorner16:
+      return Tinted(p, kTriangles[at]);
+    case PanelLayout::Panel3x3:
+      return Tinted(p, kTiles[at / 3][at % 3]);
+    case PanelLayout::Pane2x2:
+      return Tinted(p, kPane2x2[at]);
+    case PanelLayout::Pane3x3:
+      return Tinted(p, kPane3x3[at]);
+  }
+  return p;
+}
+
+int ColorPanelZone(PanelLayout layout, int w, int h, int x, int y) {
+  switch (layout) {
+    case PanelLayout::Pane2x2:
+      return Pane2x2Zones(w, h)(y, nullptr)(x);
+    case PanelLayout::Pane3x3:
+      return Pane3x3Zones(w, h)(y, nullptr)(x);
+    case PanelLayout::Catercorner4:
+      return Catercorner4Zones(w, h)(y, nullptr)(x);
+    case PanelLayout::Catercorner16:
+      return Catercorner16Zones(w, h)(y, nullptr)(x);
+    default:
+      return 0;
+  }
+}
+
 Bitmap32 ColorPanel(const Bitmap32& source, PanelLayout layout) {
   const int w = source.Width(), h = source.Height();
   switch (layout) {
@@ -364,25 +340,6 @@ Bitmap32 ColorPanel(const Bitmap32& source, PanelLayout layout) {
       return Zoned(source, kTriangles, Catercorner4Zones(w, h));
     case PanelLayout::Catercorner16:
       return Zoned(source, kTriangles, Catercorner16Zones(w, h));
-  }
-  return source;
-}
-
-Bitmap32 ColorPanelReference(const Bitmap32& source, PanelLayout layout) {
-  const int w = source.Width(), h = source.Height();
-  switch (layout) {
-    case PanelLayout::Panel2x2:
-      return Panel2x2Reference(source);
-    case PanelLayout::Panel3x3:
-      return Panel3x3Reference(source);
-    case PanelLayout::Pane2x2:
-      return ZonedReference(source, kPane2x2, Pane2x2Zones(w, h));
-    case PanelLayout::Pane3x3:
-      return ZonedReference(source, kPane3x3, Pane3x3Zones(w, h));
-    case PanelLayout::Catercorner4:
-      return ZonedReference(source, kTriangles, Catercorner4Zones(w, h));
-    case PanelLayout::Catercorner16:
-      return ZonedReference(source, kTriangles, Catercorner16Zones(w, h));
   }
   return source;
 }

@@ -33,8 +33,14 @@ enum class PanelLayout {
 // Every layout but Panel3x3 keeps row 0 and column 0 of the source.
 Bitmap32 ColorPanel(const Bitmap32& source, PanelLayout layout);
 
-// The same made the plain way, pixel by pixel through the half- and third-size copies: what
-// ColorPanel must equal.
-Bitmap32 ColorPanelReference(const Bitmap32& source, PanelLayout layout);
+// What tile (or zone) number tile of layout makes of a pixel: channels raised or lowered
+// (limited to 0..255), then cleared to 0 and set to 255; alpha kept. Panel2x2 numbers its
+// quadrants 0..3 for the floods A..D, Panel3x3 its tiles 0..8 by row then column, and the other
+// layouts their zones as ColorPanelZone gives them. A number outside the layout's leaves p.
+Pixel ColorPanelTinted(Pixel p, PanelLayout layout, int tile);
+
+// The zone that pixel (x, y) (each from 1) of a w x h source lies in, for Pane2x2 (0..3),
+// Pane3x3 (0..8) and the catercorner layouts (0..3); 0 for the others.
+int ColorPanelZone(PanelLayout layout, int w, int h, int x, int y);
 
 }  // namespace quillane

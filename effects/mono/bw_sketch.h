@@ -16,9 +16,4 @@ enum class PencilToneMode { Contrast = 0, Lighting = 1 };
 // The position of the mode not chosen is ignored. Alpha of the result is 255.
 Bitmap32 PencilSketch(const Bitmap32& source, PencilToneMode mode, int contrast, int lighting);
 
-// The same, step by step and pixel by pixel through the plain edge map, gray value and tone
-// pass; the oracle that PencilSketch must equal. For pictures of at least 3 by 3.
-Bitmap32 PencilSketchReference(const Bitmap32& source, PencilToneMode mode, int contrast,
-                               int lighting);
-
 }  // namespace quillane

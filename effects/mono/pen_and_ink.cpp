@@ -149,40 +149,6 @@ void InkThresholdCells(const Pixel* in, int count, int threshold, std::uint8_t* 
   ChooseInkCells()(in, count, std::clamp(threshold, -1, 255), cells);
 }
 
-void PictureTwoValue(Bitmap32& bitmap, int threshold) {
-  Pixel* p = bitmap.Data();
-  const std::size_t n = bitmap.PixelCount();
-  for (std::size_t i = 0; i < n; ++i)
-    p[i] = InkGrayValue(p[i].r, p[i].g, p[i].b) > threshold ? kPaper : kInk;
-}
-
-Bitmap32 OutlineDarkAreas(const Bitmap32& thresholded) {
-  const Bitmap32 snapshot = thresholded;
-  Bitmap32 outline = thresholded;
-  const auto ink = [&](int x, int y) {
-    const Pixel& p = snapshot.At(x, y);
-    return p.b == 0 && p.g == 0 && p.r == 0;
-  };
-  for (int y = 1; y <= thresholded.Height() - 2; ++y)
-    for (int x = 1; x <= thresholded.Width() - 2; ++x) {
-      bool inside = true;
-      for (int j = -1; j <= 1; ++j)
-        for (int i = -1; i <= 1; ++i) inside = inside && ink(x + i, y + j);
-      if (inside) outline.At(x, y) = kPaper;
-    }
-  return outline;
-}
-
-void ColorValue(Bitmap32& outline, const Bitmap32& source) {
-  for (int y = 0; y < outline.Height(); ++y)
-    for (int x = 0; x < outline.Width(); ++x) {
-      Pixel& p = outline.At(x, y);
-      if (p.r != 0) continue;
-      const Pixel& s = source.At(x, y);
-      p = Pixel{s.b, s.g, s.r, 255};
-    }
-}
-
 Bitmap32 PenAndInk(const Bitmap32& source, int threshold, bool colorInk) {
   const int w = source.Width(), h = source.Height();
   Bitmap32 result = ScratchPicture(w, h);
@@ -261,14 +227,6 @@ const EffectSpec& PenAndInkEffect() {
           },
   };
   return entry;
-}
-
-Bitmap32 PenAndInkReference(const Bitmap32& source, int threshold, bool colorInk) {
-  Bitmap32 thresholded = source;
-  PictureTwoValue(thresholded, threshold);
-  Bitmap32 outline = OutlineDarkAreas(thresholded);
-  if (colorInk) ColorValue(outline, source);
-  return outline;
 }
 
 }  // namespace quillane

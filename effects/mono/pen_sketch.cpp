@@ -88,15 +88,4 @@ const EffectSpec& PenSketchEffect() {
   return entry;
 }
 
-Bitmap32 PenSketchReference(const Bitmap32& source, int pressure) {
-  Bitmap32 drawing = source;
-  InvertedSobelEdges(drawing);
-  for (int y = 0; y < drawing.Height(); ++y)
-    for (int x = 0; x < drawing.Width(); ++x) {
-      Pixel& p = drawing.At(x, y);
-      p = GrayValue(p.r, p.g, p.b) > pressure ? kPaper : kInk;
-    }
-  return drawing;
-}
-
 }  // namespace quillane

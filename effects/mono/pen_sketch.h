@@ -14,8 +14,4 @@ void ThresholdToInk(Bitmap32& bitmap, int level);
 // by row from the gray values of the edge map, without the edge map as a picture.
 Bitmap32 PenSketch(const Bitmap32& source, int pressure);
 
-// The pen sketch the plain way, pixel by pixel through GrayValue; the oracle that PenSketch's
-// row-wise gray levels must equal.
-Bitmap32 PenSketchReference(const Bitmap32& source, int pressure);
-
 }  // namespace quillane

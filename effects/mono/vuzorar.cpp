@@ -14,13 +14,8 @@
 #include "imaging/vector_dispatch.h"
 
 namespace quillane {
-namespace {
 
-struct Offsets {
-  int dx1, dy1, dx2, dy2;
-};
-
-Offsets NeighboursOf(HatchDirection direction) {
+HatchNeighbours HatchNeighboursOf(HatchDirection direction) {
   switch (direction) {
     case HatchDirection::Rising:
       return {-1, 1, 1, -1};
@@ -34,15 +29,13 @@ Offsets NeighboursOf(HatchDirection direction) {
   throw std::invalid_argument("no such hatching direction");
 }
 
-bool IsInk(const Pixel& p) {
-  return p.b == 0 && p.g == 0 && p.r == 0;
-}
+namespace {
 
 // One dilation pass over an interior row, from the rows above, at and below it before the
 // pass (ink 0, paper 0xFF: ink spreads by AND). Compiled for any x86-64 and for AVX2.
 [[gnu::always_inline]] inline void DilateLoop(const std::uint8_t* const rows[3],
                                               std::uint8_t* __restrict out, int w,
-                                              const Offsets& n) {
+                                              const HatchNeighbours& n) {
   const std::uint8_t* __restrict self = rows[1];
   const std::uint8_t* __restrict first = rows[1 + n.dy1];
   const std::uint8_t* __restrict second = rows[1 + n.dy2];
@@ -51,18 +44,19 @@ bool IsInk(const Pixel& p) {
   out[w - 1] = self[w - 1];
 }
 
-void PlainDilate(const std::uint8_t* const rows[3], std::uint8_t* out, int w, const Offsets& n) {
+void PlainDilate(const std::uint8_t* const rows[3], std::uint8_t* out, int w,
+                 const HatchNeighbours& n) {
   DilateLoop(rows, out, w, n);
 }
 
 #if defined(__x86_64__) && defined(__GNUC__)
 [[gnu::target("avx2")]] void Avx2Dilate(const std::uint8_t* const rows[3], std::uint8_t* out, int w,
-                                        const Offsets& n) {
+                                        const HatchNeighbours& n) {
   DilateLoop(rows, out, w, n);
 }
 #endif
 
-using Dilate = void (*)(const std::uint8_t* const[3], std::uint8_t*, int, const Offsets&);
+using Dilate = void (*)(const std::uint8_t* const[3], std::uint8_t*, int, const HatchNeighbours&);
 
 Dilate ChooseDilate() {
 #if defined(__x86_64__) && defined(__GNUC__)
@@ -76,7 +70,7 @@ Dilate ChooseDilate() {
 // and every pass stay in cache; the source is read and the drawing written once, whatever the
 // scope. A band writes rows y0 to y1 - 1 and thresholds the scope rows beyond them itself.
 void HatchBand(const Bitmap32& source, Bitmap32& drawing, int y0, int y1, int pressure, int scope,
-               const Offsets& n, Dilate dilate) {
+               const HatchNeighbours& n, Dilate dilate) {
   const int w = drawing.Width(), h = drawing.Height();
   const auto lo = [&](int k) { return std::max(0, y0 - (scope - k)); };
   const auto hi = [&](int k) { return std::min(h - 1, y1 - 1 + (scope - k)); };
@@ -109,23 +103,8 @@ void HatchBand(const Bitmap32& source, Bitmap32& drawing, int y0, int y1, int pr
 
 }  // namespace
 
-void BitmapDilate(Bitmap32& bitmap, HatchDirection direction) {
-  const Offsets n = NeighboursOf(direction);
-  const int w = bitmap.Width(), h = bitmap.Height();
-  if (h - 2 < 1) return;
-  const Bitmap32 snapshot = bitmap;
-  for (int y = 1; y <= h - 2; ++y)
-    for (int x = 1; x <= w - 2; ++x) {
-      Pixel& p = bitmap.At(x, y);
-      if (IsInk(p)) continue;
-      if (IsInk(snapshot.At(x + n.dx1, y + n.dy1)) || IsInk(snapshot.At(x + n.dx2, y + n.dy2))) {
-        p.b = p.g = p.r = 0;
-      }
-    }
-}
-
 Bitmap32 Vuzorar(const Bitmap32& source, int pressure, int scope, HatchDirection direction) {
-  const Offsets n = NeighboursOf(direction);
+  const HatchNeighbours n = HatchNeighboursOf(direction);
   const int w = source.Width(), h = source.Height();
   if (h < 3 || w < 3 || scope < 1) return PenSketch(source, pressure);
   Bitmap32 drawing = ScratchPicture(w, h);
@@ -199,13 +178,6 @@ const EffectSpec& VuzorarEffect() {
           },
   };
   return entry;
-}
-
-Bitmap32 VuzorarReference(const Bitmap32& source, int pressure, int scope,
-                          HatchDirection direction) {
-  Bitmap32 drawing = PenSketchReference(source, pressure);
-  for (int i = 0; i < scope; ++i) BitmapDilate(drawing, direction);
-  return drawing;
 }
 
 }  // namespace quillane

@@ -13,20 +13,17 @@ enum class HatchDirection {
   Horizontal = 4,  // left and right
 };
 
-// One pass of directional ink dilation, in place: every interior pixel (rows and columns 1 to
-// size - 2) that is not ink (some of B, G, R non-zero) becomes ink (B, G, R = 0, alpha kept)
-// when either of its two neighbours in direction was ink before the pass. Border rows and
-// columns never change; pictures under 3 rows or columns are left as they are.
+// The two neighbours that a dilation pass in a direction looks at, as offsets from the pixel.
 // std::invalid_argument for a direction outside 1..4.
-void BitmapDilate(Bitmap32& bitmap, HatchDirection direction);
+struct HatchNeighbours {
+  int dx1, dy1, dx2, dy2;
+};
+HatchNeighbours HatchNeighboursOf(HatchDirection direction);
 
 // The pen sketch of source at pressure (0..255), then scope (1..10) dilation passes in
-// direction. Identical to thresholding the edge map and calling BitmapDilate scope times.
+// direction. In each pass every interior pixel (rows and columns 1 to size - 2) that is not ink
+// (some of B, G, R non-zero) becomes ink (B, G, R = 0, alpha kept) when either of its two
+// neighbours in direction was ink before the pass; border rows and columns never change.
 Bitmap32 Vuzorar(const Bitmap32& source, int pressure, int scope, HatchDirection direction);
-
-// Those steps themselves: PenSketchReference, then BitmapDilate scope times. The oracle that
-// the fused, banded Vuzorar must equal.
-Bitmap32 VuzorarReference(const Bitmap32& source, int pressure, int scope,
-                          HatchDirection direction);
 
 }  // namespace quillane

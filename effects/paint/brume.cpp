@@ -192,30 +192,6 @@ void BrumeInto(const Bitmap32& source, int scope, std::uint32_t& seed, Bitmap32&
   seed = RandomJump(start, perRow * static_cast<std::uint64_t>(h - 1));
 }
 
-Bitmap32 BrumeReference(const Bitmap32& source, int scope, std::uint32_t& seed) {
-  Bitmap32 a = source;
-  const Bitmap32 s = source;
-  const int w = source.Width();
-  const int h = source.Height();
-  const auto range = static_cast<std::uint32_t>(scope + 3);
-  for (int y = 1; y <= h - 1; ++y)
-    for (int x = 1; x <= w - 1; ++x) {
-      int ry = static_cast<int>(RandomDraw(seed, range)) + y - scope;
-      int rx = static_cast<int>(RandomDraw(seed, range)) + x - scope;
-      if (ry >= h)
-        ry = h - 1;
-      else if (ry < 0)
-        ry = 0;
-      if (rx >= w)
-        rx = w - 1;
-      else if (rx < 0)
-        rx = 0;
-      const Pixel p = s.At(rx, ry);
-      a.At(x, y) = Pixel{p.b, p.g, p.r, 255};
-    }
-  return a;
-}
-
 const EffectSpec& BrumeEffect() {
   static const EffectSpec entry{
       .menu = EffectMenu::Color,

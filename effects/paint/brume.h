@@ -28,7 +28,4 @@ Bitmap32 Brume(const Bitmap32& source, int scope, std::uint32_t& seed);
 // The same into out, which must already have source's size.
 void BrumeInto(const Bitmap32& source, int scope, std::uint32_t& seed, Bitmap32& out);
 
-// The same one pixel and one draw after another: the reference for Brume.
-Bitmap32 BrumeReference(const Bitmap32& source, int scope, std::uint32_t& seed);
-
 }  // namespace quillane

@@ -13,17 +13,14 @@
 #include "imaging/tone.h"
 
 namespace quillane {
-namespace {
 
-int NewLightness(int e, int l) {
+int ColorPencilLightness(int e, int l) {
   return Round(static_cast<Extended>(e) / 100 * (100 - l)) + l;
 }
 
-int EdgeTone(int gray, int pressure) {
+int ColorPencilEdgeTone(int gray, int pressure) {
   return LightnessContrast(RgbToHsl(gray, gray, gray).l, pressure);
 }
-
-}  // namespace
 
 Bitmap32 ColorPencil(const Bitmap32& source, int pressure) {
   Bitmap32 out = ScratchPicture(source.Width(), source.Height());
@@ -41,13 +38,13 @@ void ColorSketchInto(const Bitmap32& source, int pressure, Bitmap32& out) {
     for (int e = 0; e <= 100; ++e)
       for (int l = 0; l <= 100; ++l)
         t[static_cast<std::size_t>(e)][static_cast<std::size_t>(l)] =
-            static_cast<std::uint8_t>(NewLightness(e, l));
+            static_cast<std::uint8_t>(ColorPencilLightness(e, l));
     return t;
   }();
   LightnessByLevel lightness;
   for (int g = 0; g < 256; ++g)
     std::memcpy(&lightness.at[static_cast<std::size_t>(g * 101)],
-                byTone[static_cast<std::size_t>(EdgeTone(g, pressure))].data(), 101);
+                byTone[static_cast<std::size_t>(ColorPencilEdgeTone(g, pressure))].data(), 101);
   const HslRowChanger changer(HslChange{});
 
   if (w < 3 || h < 3) {
@@ -71,24 +68,6 @@ void ColorSketchInto(const Bitmap32& source, int pressure, Bitmap32& out) {
       changer.RowWithLevels(source.ScanLine(y), out.ScanLine(y), w, gray.data(), lightness);
     }
   });
-}
-
-Bitmap32 ColorSketchReference(const Bitmap32& source, int pressure) {
-  Bitmap32 edges = source;
-  InvertedSobelEdges(edges);
-  Bitmap32 out = source;
-  for (int y = 0; y < out.Height(); ++y) {
-    for (int x = 0; x < out.Width(); ++x) {
-      const Pixel ep = edges.At(x, y);
-      const int e = EdgeTone(GrayValue(ep.r, ep.g, ep.b), pressure);
-      Pixel& p = out.At(x, y);
-      const Hsl hsl = RgbToHsl(p.r, p.g, p.b);
-      const Rgb rgb = HslToRgb(hsl.h, hsl.s, NewLightness(e, hsl.l));
-      p = Pixel{static_cast<std::uint8_t>(rgb.b), static_cast<std::uint8_t>(rgb.g),
-                static_cast<std::uint8_t>(rgb.r), 255};
-    }
-  }
-  return out;
 }
 
 const EffectSpec& ColorPencilEffect() {

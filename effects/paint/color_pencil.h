@@ -20,8 +20,9 @@ Bitmap32 ColorPencil(const Bitmap32& source, int pressure);
 // again and again reuses one picture).
 void ColorSketchInto(const Bitmap32& source, int pressure, Bitmap32& out);
 
-// The same, step by step as written above with no tables, no shortcuts and one thread: the
-// reference the fast version is checked against.
-Bitmap32 ColorSketchReference(const Bitmap32& source, int pressure);
+// The steps above that the tables are built from: e from an edge-map gray value g, and L' from
+// e and L.
+int ColorPencilEdgeTone(int gray, int pressure);
+int ColorPencilLightness(int e, int l);
 
 }  // namespace quillane

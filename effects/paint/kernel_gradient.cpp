@@ -35,7 +35,7 @@ void CopyColour(Pixel& to, const Pixel& from) {
 
 }  // namespace
 
-Bitmap32 KernelGradientReference(const Bitmap32& picture, const Kernel& k, Gradient gradient) {
+Bitmap32 KernelGradientPlain(const Bitmap32& picture, const Kernel& k, Gradient gradient) {
   const Kernel g = GradientKernel(gradient);
   Bitmap32 a = picture;
   const int w = picture.Width();
@@ -73,7 +73,7 @@ void KernelGradientFilterInto(const Bitmap32& picture, const Kernel& k, Gradient
   const auto pass = KernelRowPass::Make(
       k, gradient == Gradient::LeftMinusRight ? ColumnGradient{1, 1} : ColumnGradient{2, -1});
   if (!pass || w < 3 || h < 3) {
-    out = KernelGradientReference(picture, k, gradient);
+    out = KernelGradientPlain(picture, k, gradient);
     return;
   }
   // One pass over bands of rows; the frame repeats the rows and pixels just made.

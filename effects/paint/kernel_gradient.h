@@ -30,7 +30,9 @@ Bitmap32 KernelGradientFilter(const Bitmap32& picture, const Kernel& k, Gradient
 void KernelGradientFilterInto(const Bitmap32& picture, const Kernel& k, Gradient gradient,
                               Bitmap32& out);
 
-// The same step by step, pixel by pixel in 64-bit sums: the reference for the two above.
-Bitmap32 KernelGradientReference(const Bitmap32& picture, const Kernel& k, Gradient gradient);
+// The same step by step, pixel by pixel in 64-bit sums: what the two above fall back on for
+// kernels the row pass cannot sum and for pictures under 3 by 3, and the reference the tests
+// compare the row pass with.
+Bitmap32 KernelGradientPlain(const Bitmap32& picture, const Kernel& k, Gradient gradient);
 
 }  // namespace quillane

@@ -17,7 +17,7 @@ std::uint8_t ClampWide(std::int64_t v) {
 
 }  // namespace
 
-Bitmap32 ConvolveReference(const Bitmap32& picture, const Kernel& k, std::uint16_t divisor) {
+Bitmap32 ConvolvePlain(const Bitmap32& picture, const Kernel& k, std::uint16_t divisor) {
   Bitmap32 out = picture;
   const std::int64_t d = divisor == 0 ? 1 : divisor;
   for (int y = 1; y < picture.Height() - 1; ++y) {
@@ -47,7 +47,7 @@ void ConvolveInto(const Bitmap32& picture, const Kernel& k, std::uint16_t diviso
   // plain way.
   const auto pass = divisor > 1 ? std::nullopt : KernelRowPass::Make(k, std::nullopt);
   if (!pass) {
-    out = ConvolveReference(picture, k, divisor);
+    out = ConvolvePlain(picture, k, divisor);
     return;
   }
   if (w == 0 || h == 0) return;

@@ -21,8 +21,10 @@ Bitmap32 Convolve(const Bitmap32& picture, const Kernel& k, std::uint16_t diviso
 // The same into out, which must already have picture's size.
 void ConvolveInto(const Bitmap32& picture, const Kernel& k, std::uint16_t divisor, Bitmap32& out);
 
-// The same pixel by pixel in 64-bit sums on one thread: the reference for Convolve.
-Bitmap32 ConvolveReference(const Bitmap32& picture, const Kernel& k, std::uint16_t divisor);
+// The same pixel by pixel in 64-bit sums on one thread: what Convolve falls back on for
+// kernels the row pass cannot sum and for divisors above 1, and the reference the tests compare
+// the row pass with.
+Bitmap32 ConvolvePlain(const Bitmap32& picture, const Kernel& k, std::uint16_t divisor);
 
 // Realism: Convolve of the source picture with divisor 1.
 Bitmap32 realism(const Bitmap32& source, const Kernel& k);

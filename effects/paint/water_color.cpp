@@ -248,48 +248,7 @@ void PassesOnTile(const RowKernels& kernels, const Bitmap32& source, int passes,
     }
 }
 
-Bitmap32 CopyOf(const Bitmap32& b) {
-  return b;
-}
-
-// The passes as first written: whole copies, the channels of every pixel one by one.
-void sharpen(Bitmap32& p) {
-  Bitmap32 a = CopyOf(p);
-  const Bitmap32 b = CopyOf(a);
-  for (int y = 1; y < p.Height() - 1; ++y)
-    for (int x = 1; x < p.Width() - 1; ++x)
-      for (Byte Pixel::*c : {&Pixel::r, &Pixel::g, &Pixel::b}) {
-        const int v = 5 * b.At(x, y).*c - b.At(x, y - 1).*c - b.At(x - 1, y).*c -
-                      b.At(x + 1, y).*c - b.At(x, y + 1).*c;
-        a.At(x, y).*c = static_cast<Byte>(ClampByte(v / 1));
-      }
-  p = a;
-}
-
-void soften(Bitmap32& p) {
-  Bitmap32 a = CopyOf(p);
-  const Bitmap32 b = CopyOf(p);
-  int work[3][9];
-  for (int y = 1; y < p.Height() - 1; ++y)
-    for (int x = 1; x < p.Width() - 1; ++x) {
-      int channel = 0;
-      for (Byte Pixel::*c : {&Pixel::r, &Pixel::g, &Pixel::b}) {
-        int* values = work[channel++];
-        for (int i = 0; i < 9; ++i) values[i] = b.At(x + i % 3 - 1, y + i / 3 - 1).*c;
-        SelectionSort(values, 8);
-        a.At(x, y).*c = static_cast<Byte>(values[4]);
-      }
-    }
-  p = a;
-}
-
 }  // namespace
-
-void SelectionSort(int* a, int last) {
-  for (int i = 0; i < last; ++i)
-    for (int j = last; j > i; --j)
-      if (a[j] < a[i]) std::swap(a[i], a[j]);
-}
 
 void SharpenPass(const Bitmap32& in, Bitmap32& out) {
   InteriorPass(in, out, 6, ChooseKernels().sharpen);
@@ -339,16 +298,6 @@ void WaterColorInto(const Bitmap32& source, int cycles, Bitmap32& out) {
                  if (y1 == h - 1)
                    std::memcpy(out.ScanLine(h - 1), source.ScanLine(h - 1), rowBytes);
                });
-}
-
-Bitmap32 WaterColorReference(const Bitmap32& source, int cycles) {
-  Bitmap32 p = source;
-  for (int i = 0; i < cycles; ++i) {
-    sharpen(p);
-    soften(p);
-    soften(p);
-  }
-  return p;
 }
 
 const EffectSpec& WaterColorEffect() {

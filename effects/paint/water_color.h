@@ -28,12 +28,4 @@ void SharpenPass(const Bitmap32& in, Bitmap32& out);
 // written and the alpha of its interior becomes in's.
 void MedianPass(const Bitmap32& in, Bitmap32& out);
 
-// The same effect as written out first: full copies per pass, nine values per channel gathered
-// and sorted with SelectionSort, entry 4 taken. The reference for WaterColor.
-Bitmap32 WaterColorReference(const Bitmap32& source, int cycles);
-
-// Ascending sort of a[0..last]: for i from 0 to last-1, for j from last down to i+1, a[j] and
-// a[i] swap when a[j] < a[i].
-void SelectionSort(int* a, int last);
-
 }  // namespace quillane

@@ -144,21 +144,6 @@ ReliefRow ChooseReliefRow(int lift) {
 
 }  // namespace
 
-Bitmap32 EmbossReference(const Bitmap32& source, int lighting, int depth) {
-  Bitmap32 out = source;
-  for (int y = 0; y < source.Height() - depth; ++y)
-    for (int x = 0; x < source.Width() - depth; ++x) {
-      const Pixel p = source.At(x, y);
-      const Pixel q = source.At(x + depth, y + depth);
-      const auto v = [&](int pc, int qc) {
-        return std::min(255, std::abs(pc - qc + lighting + 50));
-      };
-      const std::uint8_t g = GrayValue(v(p.r, q.r), v(p.g, q.g), v(p.b, q.b));
-      out.At(x, y) = Pixel{g, g, g, 255};
-    }
-  return out;
-}
-
 Bitmap32 emboss(const Bitmap32& source, int lighting, int depth) {
   const int width = source.Width();
   const int height = source.Height();

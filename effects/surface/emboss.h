@@ -12,7 +12,4 @@ namespace quillane {
 // and alpha. lighting 0..200, depth 1..5 (any depth >= 1 works).
 Bitmap32 emboss(const Bitmap32& source, int lighting, int depth);
 
-// The same pixel by pixel on one thread, straight from the formula: the reference for emboss.
-Bitmap32 EmbossReference(const Bitmap32& source, int lighting, int depth);
-
 }  // namespace quillane

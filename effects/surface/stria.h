@@ -19,10 +19,8 @@ enum class StriaDirection { Vertical = 1, Horizontal = 2 };
 Bitmap32 stria(const Bitmap32& base, int layerWidth, int layerHeight, StriaDirection direction,
                int thickness, int space, int transparency, std::uint32_t colour);
 
-// The same made the plain way, in place on a copy through tables of the colour: what stria must
-// equal.
-Bitmap32 StriaReference(const Bitmap32& base, int layerWidth, int layerHeight,
-                        StriaDirection direction, int thickness, int space, int transparency,
-                        std::uint32_t colour);
+// The stripes' pixel: colour (0x00BBGGRR) with alpha 255 - transparency, transparency limited
+// to 0..255.
+Pixel StripeColour(std::uint32_t colour, int transparency);
 
 }  // namespace quillane

@@ -15,13 +15,14 @@
 #include "imaging/tone.h"
 
 namespace quillane {
-namespace {
 
 // Beyond 100 points either way every lightness ends at a limit, so the shift is kept there;
 // that keeps it in 16 bits for any pressure.
-int Shift(int tileLightness, int pressure) {
+int TextureLightnessShift(int tileLightness, int pressure) {
   return std::clamp(Round(static_cast<Extended>(tileLightness - 70) * pressure / 50), -100, 100);
 }
+
+namespace {
 
 std::vector<ParamOption> TileOptions() {
   std::vector<ParamOption> options;
@@ -41,7 +42,8 @@ Bitmap32 texture(const Bitmap32& base, const Bitmap32& tile, int pressure) {
   const int rows = std::min(th, h);
   std::array<std::int16_t, 101> shiftOf{};  // by the tile's lightness
   for (int l = 0; l <= 100; ++l)
-    shiftOf[static_cast<std::size_t>(l)] = static_cast<std::int16_t>(Shift(l, pressure));
+    shiftOf[static_cast<std::size_t>(l)] =
+        static_cast<std::int16_t>(TextureLightnessShift(l, pressure));
   std::vector<std::int16_t> shifts(static_cast<std::size_t>(rows) * static_cast<std::size_t>(w));
   for (int ty = 0; ty < rows && !plain; ++ty) {
     std::int16_t* row = &shifts[static_cast<std::size_t>(ty) * static_cast<std::size_t>(w)];
@@ -56,23 +58,6 @@ Bitmap32 texture(const Bitmap32& base, const Bitmap32& tile, int pressure) {
     changer.Row(in, out, width,
                 &shifts[static_cast<std::size_t>(y % rows) * static_cast<std::size_t>(width)]);
   });
-}
-
-Bitmap32 TextureReference(const Bitmap32& base, const Bitmap32& tile, int pressure) {
-  Bitmap32 out(base.Width(), base.Height());
-  const bool plain = tile.Width() == 0 || tile.Height() == 0;
-  for (int y = 0; y < base.Height(); ++y)
-    for (int x = 0; x < base.Width(); ++x) {
-      const Pixel b = base.At(x, y);
-      const Hsl hsl = RgbToHslReference(b.r, b.g, b.b);
-      const Pixel t = plain ? Pixel{} : tile.At(x % tile.Width(), y % tile.Height());
-      const Hsl lt = RgbToHslReference(t.r, t.g, t.b);
-      const int shift = plain ? 0 : Shift(lt.l, pressure);
-      const Rgb c = HslToRgbReference(hsl.h, hsl.s, std::clamp(hsl.l + shift, 0, 100));
-      out.At(x, y) = Pixel{static_cast<std::uint8_t>(c.b), static_cast<std::uint8_t>(c.g),
-                           static_cast<std::uint8_t>(c.r), 255};
-    }
-  return out;
 }
 
 const EffectSpec& TextureEffect() {

@@ -11,7 +11,8 @@ namespace quillane {
 // to RGB with alpha 255. pressure 0..100. An empty tile leaves the lightness as it is.
 Bitmap32 texture(const Bitmap32& base, const Bitmap32& tile, int pressure);
 
-// The same, pixel by pixel through the reference conversions: the oracle for texture.
-Bitmap32 TextureReference(const Bitmap32& base, const Bitmap32& tile, int pressure);
+// What a tile pixel of lightness tileLightness (0..100) adds to the picture's lightness:
+// Round((tileLightness - 70) pressure / 50), kept within -100..100 (no lightness moves further).
+int TextureLightnessShift(int tileLightness, int pressure);
 
 }  // namespace quillane

@@ -8,6 +8,8 @@
 #include "effects/adjust/color_panel.h"
 #include "effects/surface/stria.h"
 #include "tests/imaging/fast_path_support.h"
+#include "tests/reference/adjust_reference.h"
+#include "tests/reference/surface_reference.h"
 
 namespace quillane {
 namespace {

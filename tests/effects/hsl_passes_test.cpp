@@ -10,6 +10,9 @@
 #include "effects/surface/texture.h"
 #include "imaging/tone.h"
 #include "tests/imaging/fast_path_support.h"
+#include "tests/reference/imaging_reference.h"
+#include "tests/reference/paint_reference.h"
+#include "tests/reference/surface_reference.h"
 
 namespace quillane {
 namespace {

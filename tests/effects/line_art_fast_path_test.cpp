@@ -11,6 +11,7 @@
 #include "imaging/edge_map.h"
 #include "imaging/numeric.h"
 #include "tests/imaging/fast_path_support.h"
+#include "tests/reference/mono_reference.h"
 
 namespace quillane {
 namespace {

@@ -6,6 +6,7 @@
 #include "effects/mono/pen_sketch.h"
 #include "effects/mono/vuzorar.h"
 #include "tests/imaging/random_picture.h"
+#include "tests/reference/mono_reference.h"
 
 namespace quillane {
 namespace {

@@ -8,6 +8,7 @@
 #include "effects/paint/brume.h"
 #include "effects/paint/water_color.h"
 #include "tests/imaging/fast_path_support.h"
+#include "tests/reference/paint_reference.h"
 
 namespace quillane {
 namespace {

@@ -5,6 +5,7 @@
 #include "imaging/edge_map.h"
 #include "imaging/tone.h"
 #include "tests/imaging/fast_path_support.h"
+#include "tests/reference/mono_reference.h"
 
 namespace quillane {
 namespace {

@@ -11,6 +11,7 @@
 #include "imaging/numeric.h"
 #include "imaging/tone.h"
 #include "tests/imaging/random_picture.h"
+#include "tests/reference/surface_reference.h"
 
 namespace quillane {
 namespace {

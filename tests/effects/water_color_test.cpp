@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include "tests/imaging/random_picture.h"
+#include "tests/reference/paint_reference.h"
 
 namespace quillane {
 namespace {

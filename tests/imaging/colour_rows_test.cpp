@@ -11,6 +11,7 @@
 #include "imaging/gray_row.h"
 #include "imaging/numeric.h"
 #include "tests/imaging/fast_path_support.h"
+#include "tests/reference/imaging_reference.h"
 
 namespace quillane {
 namespace {

@@ -5,6 +5,7 @@
 #include <algorithm>
 
 #include "tests/imaging/random_picture.h"
+#include "tests/reference/imaging_reference.h"
 
 namespace quillane {
 namespace {

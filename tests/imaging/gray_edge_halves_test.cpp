@@ -8,6 +8,7 @@
 #include "imaging/edge_map.h"
 #include "imaging/numeric.h"
 #include "imaging/vector_dispatch.h"
+#include "tests/reference/imaging_reference.h"
 
 namespace quillane {
 namespace {

@@ -9,6 +9,7 @@
 
 #include "imaging/tone.h"
 #include "imaging/vector_dispatch.h"
+#include "tests/reference/imaging_reference.h"
 
 namespace quillane {
 namespace {

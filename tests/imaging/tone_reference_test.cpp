@@ -1,11 +1,12 @@
 // The colour model, the gray value and the tone passes take fast paths (integer arithmetic,
-// tables, threads). These tests compare them with the library's plain references on every
+// tables, threads). These tests compare them with the plain references on every
 // input that exists, or large random pictures where the input is a whole picture.
 #include <gtest/gtest.h>
 
 #include "imaging/numeric.h"
 #include "imaging/tone.h"
 #include "tests/imaging/random_picture.h"
+#include "tests/reference/imaging_reference.h"
 
 namespace quillane {
 namespace {
