@@ -13,6 +13,7 @@
 #include <functional>
 #include <vector>
 
+#include "batch/batch_convert.h"
 #include "document/document.h"
 #include "effects/registry.h"
 #include "imaging/rotate.h"
@@ -38,7 +39,6 @@ class AboutBox;
 class BatchDoneDialog;
 class ImageSizeDialog;
 class ToolWindow;
-struct BatchResult;
 
 class MainWindow : public QMainWindow, public ToolHost {
   Q_OBJECT
@@ -233,6 +233,9 @@ class MainWindow : public QMainWindow, public ToolHost {
   QToolButton* downArrow_ = nullptr;
   QToolButton* upArrow_ = nullptr;
   QListWidget* batchFileList_ = nullptr;
+  // Entries of the browsed input folder named like pictures that are no files (folders, FIFOs,
+  // links to nothing): told as skipped after each batch.
+  std::vector<BatchSkipped> batchNotFiles_;
   BatchDoneDialog* batchDone_ = nullptr;
   AboutBox* aboutBox_ = nullptr;
   ImageSizeDialog* imageSize_ = nullptr;

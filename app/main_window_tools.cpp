@@ -56,8 +56,13 @@ void MainWindow::ChooseInputFolder() {
   if (!folder) return;
   inputFolder_ = *folder;
   batchFileList_->clear();
+  batchNotFiles_.clear();
+  const BatchScan scan = ScanBatchFolderTelling(LocalPath(inputFolder_));
+  if (!scan.error.empty())
+    platform_.ShowMessage("Sorry", QString::fromStdString(ShownName(scan.error)));
+  for (const auto& [name, reason] : scan.notFiles) batchNotFiles_.push_back({name, reason});
   // A name is any bytes: the list shows it readably and keeps the bytes themselves to load.
-  for (const std::string& name : ScanBatchFolder(LocalPath(inputFolder_))) {
+  for (const std::string& name : scan.files) {
     auto* item = new QListWidgetItem(QString::fromStdString(ShownName(name)), batchFileList_);
     item->setData(Qt::UserRole, QByteArray::fromStdString(name));
   }
@@ -131,9 +136,12 @@ BatchResult MainWindow::ConvertBatchFolder(const EffectSpec& effect, const Effec
   // The output folder is taken from its field only once the input has been accepted.
   if (result.end != BatchResult::End::Refused) outputFolder_ = FromLocalPath(job.outputFolder);
 
-  if (!result.skipped.empty()) {
+  std::vector<BatchSkipped> skippedAll;
+  if (result.end != BatchResult::End::Refused) skippedAll = batchNotFiles_;
+  skippedAll.insert(skippedAll.end(), result.skipped.begin(), result.skipped.end());
+  if (!skippedAll.empty()) {
     QString text = "These pictures were skipped and have no output file:";
-    for (const BatchSkipped& skipped : result.skipped)
+    for (const BatchSkipped& skipped : skippedAll)
       text += "\n" + QString::fromStdString(ShownName(skipped.reason));
     platform_.ShowMessage("Sorry", text);
   }

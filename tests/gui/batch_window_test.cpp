@@ -66,6 +66,14 @@ TEST_F(BatchWindow, BrowseListsThePicturesOfTheChosenFolder) {
   SaveBitmap24(TestPicture(), LocalPath("other/Z.BMP"));
   BrowseInput(Path("other"));
   EXPECT_EQ(Items(ListView1()), QStringList{"Z.BMP"});
+
+  // A link loop is no folder: the user is told why at once, and nothing is listed.
+  std::filesystem::create_symlink("loop", LocalPath("loop"));
+  BrowseInput(Path("loop"));
+  EXPECT_TRUE(Items(ListView1()).empty());
+  ASSERT_EQ(platform_.messages.size(), 1u);
+  EXPECT_TRUE(platform_.messages[0].text.contains("loop"))
+      << platform_.messages[0].text.toStdString();
 }
 
 TEST_F(BatchWindow, ConvertWritesOnePencilSketchPerPicture) {
@@ -77,7 +85,12 @@ TEST_F(BatchWindow, ConvertWritesOnePencilSketchPerPicture) {
   // The output folder does not exist yet, several levels deep; blanks around the names go.
   Convert("  " + Path("in") + " ", Path("out/deeper/still") + "  ");
 
-  EXPECT_TRUE(platform_.messages.empty() && platform_.errors.empty());
+  // The folder named like a picture is told as skipped, with what it is.
+  EXPECT_TRUE(platform_.errors.empty());
+  ASSERT_EQ(platform_.messages.size(), 1u);
+  EXPECT_EQ(platform_.messages[0].text, "These pictures were skipped and have no output file:\n" +
+                                            Path("in/d.jpg") +
+                                            " is not a picture file: it is a folder");
   EXPECT_EQ(Entries("out/deeper/still"),
             (std::vector<std::string>{"a-PencilSketch.jpg", "b-PencilSketch.jpg",
                                       "c.-PencilSketch.jpg"}));
@@ -134,10 +147,11 @@ TEST_F(BatchWindow, PicturesThatCannotBeLoadedAreSkippedAndListedAfterwards) {
   Convert(Path("in"), Path("out"));
   ASSERT_EQ(platform_.messages.size(), 1u);
   const QStringList lines = platform_.messages[0].text.split('\n');
-  ASSERT_EQ(lines.size(), 3);
+  ASSERT_EQ(lines.size(), 4);
   EXPECT_EQ(lines[0], "These pictures were skipped and have no output file:");
-  EXPECT_TRUE(lines[1].startsWith("\"" + Path("in/bad.jpg") + "\": ")) << lines[1].toStdString();
-  EXPECT_EQ(lines[2], Path("in/gone.bmp") + " is not a valid format");
+  EXPECT_EQ(lines[1], Path("in/d.jpg") + " is not a picture file: it is a folder");
+  EXPECT_TRUE(lines[2].startsWith("\"" + Path("in/bad.jpg") + "\": ")) << lines[2].toStdString();
+  EXPECT_EQ(lines[3], Path("in/gone.bmp") + " is not a valid format");
   // The rest converted, so the loop ran to its end.
   EXPECT_TRUE(Completion().isVisible());
 }
