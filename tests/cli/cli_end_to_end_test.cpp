@@ -136,16 +136,11 @@ TEST_F(CliRun, PictureTooLargeForTheMemoryLimitIsAMessageAndTheBatchGoesOn) {
   big.replace(frame + 5, 4, "\x1B\x58\x1B\x58");
   big.insert(big.size() - 2, 100'000, '\0');  // as much coded data as so many blocks need
   std::ofstream(Path("in/big.jpg"), std::ios::binary) << big;
-  const std::string limit = "ulimit -v 600000; ";
-  EXPECT_EQ(
-      Run("apply pencil-sketch '" + Path("in/big.jpg") + "' -o '" + Path("o.png") + "'", limit), 1);
-  EXPECT_NE(err_.find(Path("in/big.jpg")), std::string::npos) << err_;
-  EXPECT_NE(err_.find("7000 by 7000 pixels needs 748 MB; "), std::string::npos) << err_;
-  EXPECT_EQ(
-      Run("batch pencil-sketch --input '" + Path("in") + "' --output '" + Path("out") + "'", limit),
-      1);
+  // The message itself is jpeg_test's.
+  EXPECT_EQ(Run("batch pencil-sketch --input in --output out", "ulimit -v 600000; "), 1);
   EXPECT_NE(out_.find("Converted 1 of 2 pictures"), std::string::npos) << out_;
   EXPECT_NE(err_.find("big.jpg: "), std::string::npos) << err_;
+  EXPECT_NE(err_.find("7000 by 7000 pixels needs 748 MB; "), std::string::npos) << err_;
 }
 
 // An effect's name with an escape sequence in it set the terminal's title.
@@ -258,24 +253,15 @@ TEST_F(CliRun, BatchConvertsTheFolderAndListsSkippedFiles) {
 
   ASSERT_EQ(batch("--lighting 100", "in"), 0) << err_;
   EXPECT_NE(out_.find("The batch convert is successful."), std::string::npos) << out_;
-  // Not a terminal: one plain line per picture.
+  // Not a terminal: one plain line per picture. The pictures' bytes are the batch loop's tests.
   EXPECT_NE(err_.find("picture 1 of 2: a.jpg -> " + out + "/a-PencilSketch.jpg"), std::string::npos)
       << err_;
-  // The pictures' bytes are the batch loop's own tests.
-  EXPECT_TRUE(fs::is_regular_file(out + "/b-PencilSketch.jpg"));
 
   // A name that is not UTF-8 and holds an escape sequence is shown escaped, never raw.
   std::ofstream(Path("in/x\x1b[2J\xff.jpg"), std::ios::binary) << "not a picture";
   EXPECT_EQ(Run("batch pencil-sketch --input '" + Path("in") + "' --output '" + out + "'"), 1);
   EXPECT_NE(err_.find("Skipped 1 picture:\n  x\\x1b[2J\\xff.jpg: "), std::string::npos) << err_;
   EXPECT_EQ(err_.find('\x1b'), std::string::npos);
-  fs::remove(out + "/b-PencilSketch.jpg");
-  fs::create_directory(out + "/b-PencilSketch.jpg");
-  EXPECT_EQ(Run("batch pencil-sketch --input '" + Path("in") + "' --output '" + out + "'"), 1);
-  // An output that cannot be written is one skipped picture; the others are still converted.
-  EXPECT_NE(err_.find("  b.BMP: Cannot save \"" + out + "/b-PencilSketch.jpg\""), std::string::npos)
-      << err_;
-  EXPECT_NE(out_.find("Converted 1 of 3 pictures"), std::string::npos) << out_;
 
   EXPECT_EQ(batch("", "nowhere"), 1);
   EXPECT_NE(err_.find("Sorry: Input Director in not exist."), std::string::npos) << err_;

@@ -141,8 +141,7 @@ TEST(ParseCommandLineTest, HelpOnlyWhereAnOptionMayStand) {
   EXPECT_EQ(folder.options.output, "-h");
 }
 
-TEST(ParseCommandLineTest, HelpVersionListAndGallery) {
-  EXPECT_EQ(Parse({"--help"}).options.command, Command::Help);
+TEST(ParseCommandLineTest, VersionListAndGallery) {
   EXPECT_EQ(Parse({"--version"}).options.command, Command::Version);
   EXPECT_EQ(Parse({"list"}).options.command, Command::List);
   const ParseResult g = Parse({"gallery", "out dir", "--input", "p.png"});

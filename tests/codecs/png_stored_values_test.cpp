@@ -25,19 +25,16 @@ struct PngChunks {
 // The smallest profile libpng accepts: a display profile header in RGB, no tags.
 std::vector<std::uint8_t> EmptyRgbProfile() {
   std::vector<std::uint8_t> p(132, 0);
-  auto be32 = [&](std::size_t at, std::uint32_t v) {
-    for (int i = 0; i < 4; ++i) p[at + i] = static_cast<std::uint8_t>(v >> (24 - 8 * i));
+  const auto put = [&](std::size_t at, const char* bytes, std::size_t n = 4) {
+    std::memcpy(&p[at], bytes, n);
   };
-  auto text = [&](std::size_t at, const char* four) { std::memcpy(&p[at], four, 4); };
-  be32(0, 132);
-  be32(8, 0x02100000);
-  text(12, "mntr");
-  text(16, "RGB ");
-  text(20, "XYZ ");
-  text(36, "acsp");
-  be32(68, 0x0000F6D6);  // the D50 white point
-  be32(72, 0x00010000);
-  be32(76, 0x0000D32D);
+  put(0, "\0\0\0\x84");  // size 132
+  put(8, "\x02\x10\0\0");
+  put(12, "mntr");
+  put(16, "RGB ");
+  put(20, "XYZ ");
+  put(36, "acsp");
+  put(68, "\0\0\xF6\xD6\0\x01\0\0\0\0\xD3\x2D", 12);  // the D50 white point
   return p;
 }
 
@@ -72,24 +69,15 @@ std::vector<std::uint8_t> WritePng(int width, int height, int colourType, int bi
     png_set_tRNS(png, info, opacity.data(), static_cast<int>(opacity.size()), nullptr);
   }
   png_write_info(png, info);
-  if (bitDepth == 16) png_set_swap(png);  // samples are given in the machine's byte order
-  const int channels = png_get_channels(png, info);
-  const std::size_t perRow = static_cast<std::size_t>(width) * channels;
-  std::vector<std::vector<std::uint8_t>> rowBytes(height);
-  std::vector<png_bytep> rows;
-  for (int y = 0; y < height; ++y) {
-    auto& row = rowBytes[y];
-    for (std::size_t i = 0; i < perRow; ++i) {
-      const std::uint16_t v = samples[y * perRow + i];
-      if (bitDepth == 16) {
-        row.push_back(static_cast<std::uint8_t>(v));
-        row.push_back(static_cast<std::uint8_t>(v >> 8));
-      } else {
-        row.push_back(static_cast<std::uint8_t>(v));
-      }
-    }
-    rows.push_back(row.data());
+  if (bitDepth == 16) png_set_swap(png);
+  // Samples in the machine's byte order (png_set_swap above), rows one after another.
+  std::vector<std::uint8_t> bytes;
+  for (std::uint16_t v : samples) {
+    bytes.push_back(static_cast<std::uint8_t>(v));
+    if (bitDepth == 16) bytes.push_back(static_cast<std::uint8_t>(v >> 8));
   }
+  std::vector<png_bytep> rows;
+  for (int y = 0; y < height; ++y) rows.push_back(&bytes[y * bytes.size() / height]);
   png_write_image(png, rows.data());
   png_write_end(png, info);
   png_destroy_write_struct(&png, &info);
@@ -119,11 +107,8 @@ TEST(PngStoredValues, ColourChunksChangeNoSample) {
     bool interlaced;
   };
   const Case cases[] = {
-      {"rgb8 gamma 1.0 + cHRM",
-       PNG_COLOR_TYPE_RGB,
-       8,
-       {.gamma = 1.0, .chromaticities = true},
-       false},
+      // clang-format off
+      {"rgb8 gamma 1.0 + cHRM", PNG_COLOR_TYPE_RGB, 8, {.gamma = 1.0, .chromaticities = true}, false},
       {"rgb8 gamma 0.2 interlaced", PNG_COLOR_TYPE_RGB, 8, {.gamma = 0.2}, true},
       {"rgb8 ICC profile", PNG_COLOR_TYPE_RGB, 8, {.iccProfile = true}, false},
       {"gray8 gamma 2.0", PNG_COLOR_TYPE_GRAY, 8, {.gamma = 2.0}, false},
@@ -131,13 +116,12 @@ TEST(PngStoredValues, ColourChunksChangeNoSample) {
       {"rgba16 sRGB", PNG_COLOR_TYPE_RGBA, 16, {.srgb = true}, false},
       {"rgb16 gamma 1.0 interlaced", PNG_COLOR_TYPE_RGB, 16, {.gamma = 1.0}, true},
       {"gray+alpha16 gamma 0.3", PNG_COLOR_TYPE_GRAY_ALPHA, 16, {.gamma = 0.3}, false},
+      // clang-format on
   };
   constexpr int w = 13, h = 9;
   for (const Case& c : cases) {
-    const int channels = c.colourType == PNG_COLOR_TYPE_GRAY         ? 1
-                         : c.colourType == PNG_COLOR_TYPE_GRAY_ALPHA ? 2
-                         : c.colourType == PNG_COLOR_TYPE_RGB        ? 3
-                                                                     : 4;
+    const int channels = 1 + (c.colourType & PNG_COLOR_MASK_COLOR ? 2 : 0) +
+                         (c.colourType & PNG_COLOR_MASK_ALPHA ? 1 : 0);
     const auto samples = Samples(std::size_t{w} * h * channels, c.bitDepth, w * channels);
     const std::vector<std::uint8_t> file =
         WritePng(w, h, c.colourType, c.bitDepth, samples, c.chunks, c.interlaced);

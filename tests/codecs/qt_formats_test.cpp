@@ -224,7 +224,7 @@ TEST(GifDecoder, MinimumCodeSizesUpToElevenDecode) {
 }
 
 // Another signature and a code size of 12 once loaded (one as an all-white picture); frames
-// whose data cannot give their pixels are damaged, however large they say they are.
+// whose data cannot give their pixels are damaged (huge ones: crafted_size_test).
 TEST(GifDecoder, RefusesForeignSignaturesWideCodesAndFramesTheDataCannotFill) {
   const std::vector<std::uint8_t> good =
       GifFile(3, 3, 0, 0, 3, 3, kGifPalette, std::vector<std::uint8_t>(9, 1), -1);
@@ -232,8 +232,6 @@ TEST(GifDecoder, RefusesForeignSignaturesWideCodesAndFramesTheDataCannotFill) {
   foreign[4] = '8';  // GIF88a
   wide[35] = 12;     // the code size byte after the 4-colour table and the frame header
   const std::pair<std::vector<std::uint8_t>, const char*> cases[] = {
-      {GifFile(12000, 12000, 0, 0, 12000, 12000, kGifPalette, {1}, -1), "gives 1 of"},
-      {GifFile(65535, 4096, 0, 0, 65535, 4096, kGifPalette, {1, 2, 0}, -1), "gives 3 of"},
       {GifFile(3, 3, 0, 0, 3, 3, kGifPalette, {1, 2, 0, 1}, -1), "gives 4 of"},
       {foreign, "neither GIF87a nor GIF89a"},
       {wide, "12 bits or more"},

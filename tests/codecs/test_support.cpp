@@ -112,31 +112,34 @@ std::vector<std::uint8_t> BmpInfoHeader(int headerSize, int width, int height, i
 
 namespace {
 
+// LZW codes packed least significant bit first, as GIF stores them.
+struct CodeWriter {
+  std::vector<std::uint8_t> out;
+  std::uint64_t accumulator = 0;
+  int bits = 0;
+  void Emit(unsigned code, int width) {
+    accumulator |= std::uint64_t{code} << bits;
+    for (bits += width; bits >= 8; bits -= 8, accumulator >>= 8)
+      out.push_back(static_cast<std::uint8_t>(accumulator & 0xFF));
+  }
+  std::vector<std::uint8_t> Finish(unsigned end, int width) {
+    Emit(end, width);
+    if (bits > 0) out.push_back(static_cast<std::uint8_t>(accumulator & 0xFF));
+    return out;
+  }
+};
+
 // LZW without compression: only literal codes, with a clear code often enough that the code
 // width never grows. Every decoder reads this.
 std::vector<std::uint8_t> LzwLiterals(const std::vector<std::uint8_t>& indices, int minCodeSize) {
-  const unsigned clear = 1u << minCodeSize, end = clear + 1;
+  const unsigned clear = 1u << minCodeSize;
   const int width = minCodeSize + 1;
-  std::vector<std::uint8_t> out;
-  std::uint32_t accumulator = 0;
-  int bits = 0;
-  const auto emit = [&](unsigned code) {
-    accumulator |= code << bits;
-    bits += width;
-    while (bits >= 8) {
-      out.push_back(static_cast<std::uint8_t>(accumulator & 0xFF));
-      accumulator >>= 8;
-      bits -= 8;
-    }
-  };
-  const std::size_t run = clear - 2;
+  CodeWriter w;
   for (std::size_t i = 0; i < indices.size(); ++i) {
-    if (i % run == 0) emit(clear);
-    emit(indices[i]);
+    if (i % (clear - 2) == 0) w.Emit(clear, width);
+    w.Emit(indices[i], width);
   }
-  emit(end);
-  if (bits > 0) out.push_back(static_cast<std::uint8_t>(accumulator & 0xFF));
-  return out;
+  return w.Finish(clear + 1, width);
 }
 
 }  // namespace
@@ -177,14 +180,6 @@ std::vector<std::uint8_t> GifFileWithData(int screenWidth, int screenHeight, int
   return w.bytes;
 }
 
-std::vector<std::uint8_t> GifFileWithData(int screenWidth, int screenHeight, int left, int top,
-                                          int width, int height,
-                                          const std::vector<std::uint8_t>& paletteRgb,
-                                          int minCodeSize, const std::vector<std::uint8_t>& lzw) {
-  return GifFileWithData(screenWidth, screenHeight, left, top, width, height, paletteRgb,
-                         minCodeSize, lzw, -1);
-}
-
 std::vector<std::uint8_t> GifFile(int screenWidth, int screenHeight, int left, int top, int width,
                                   int height, const std::vector<std::uint8_t>& paletteRgb,
                                   const std::vector<std::uint8_t>& indices, int transparent,
@@ -197,27 +192,17 @@ std::vector<std::uint8_t> GifFile(int screenWidth, int screenHeight, int left, i
 }
 
 std::vector<std::uint8_t> LzwUniform(std::uint64_t count, unsigned index, int minCodeSize) {
-  const unsigned clear = 1u << minCodeSize, end = clear + 1;
-  unsigned width = minCodeSize + 1, next = clear + 2;
-  std::vector<std::uint8_t> out;
-  std::uint64_t accumulator = 0;
-  int bits = 0;
-  const auto emit = [&](unsigned code) {
-    accumulator |= std::uint64_t{code} << bits;
-    bits += static_cast<int>(width);
-    while (bits >= 8) {
-      out.push_back(static_cast<std::uint8_t>(accumulator & 0xFF));
-      accumulator >>= 8;
-      bits -= 8;
-    }
-  };
-  emit(clear);
+  const unsigned clear = 1u << minCodeSize;
+  unsigned next = clear + 2;
+  int width = minCodeSize + 1;
+  CodeWriter w;
+  w.Emit(clear, width);
   // Entry clear + k (k >= 2) holds k pixels, the literal one.
   std::uint64_t previous = 0;  // pixels of the last code; 0 before the first
   while (count > 0) {
     std::uint64_t length = std::min<std::uint64_t>(previous + 1, count);
     if (next == 4096) length = std::min<std::uint64_t>(4095 - clear, count);
-    emit(length == 1 ? index : clear + static_cast<unsigned>(length));
+    w.Emit(length == 1 ? index : clear + static_cast<unsigned>(length), width);
     if (previous > 0 && next < 4096) {
       ++next;
       if (next == (1u << width) && width < 12) ++width;
@@ -225,9 +210,7 @@ std::vector<std::uint8_t> LzwUniform(std::uint64_t count, unsigned index, int mi
     previous = length;
     count -= length;
   }
-  emit(end);
-  if (bits > 0) out.push_back(static_cast<std::uint8_t>(accumulator & 0xFF));
-  return out;
+  return w.Finish(clear + 1, width);
 }
 
 }  // namespace quillane::testing

@@ -108,7 +108,8 @@ std::vector<std::uint8_t> GifFile(int screenWidth, int screenHeight, int left, i
 std::vector<std::uint8_t> GifFileWithData(int screenWidth, int screenHeight, int left, int top,
                                           int width, int height,
                                           const std::vector<std::uint8_t>& paletteRgb,
-                                          int minCodeSize, const std::vector<std::uint8_t>& lzw);
+                                          int minCodeSize, const std::vector<std::uint8_t>& lzw,
+                                          int transparent = -1);
 // LZW data of count pixels of one index, as compact as LZW gets (each code one pixel longer
 // than the one before, up to the full table), so that tens of megapixels take kilobytes.
 std::vector<std::uint8_t> LzwUniform(std::uint64_t count, unsigned index, int minCodeSize);
