@@ -154,6 +154,9 @@ ControlPanelWindow::ControlPanelWindow(PaintingState& state, ToolHost& host,
   addButton("Button2", "Cancel", nullptr, 1, 1, &ControlPanelWindow::OnCancel);
   grid->addLayout(buttons, 3, 0, 1, 3);
   grid->setRowStretch(4, 1);
+
+  // After a click on a tool or Thin the focus is here, and Ctrl+Z must still take back a step.
+  addAction(workArea_.UndoStrokeAction());
 }
 
 // --- Opening and closing -----------------------------------------------------------------------
