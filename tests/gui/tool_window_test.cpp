@@ -52,6 +52,34 @@ TEST_F(ToolWindows, ChoosingTheOpenWindowAgainShowsItAfresh) {
   EXPECT_FALSE(colorUp->isEnabled());
 }
 
+// The size a window has when its show event arrives.
+class SizeWhenShown : public QObject {
+ public:
+  QSize size;
+  bool eventFilter(QObject* watched, QEvent* event) override {
+    if (event->type() == QEvent::Show) size = static_cast<QWidget*>(watched)->size();
+    return false;
+  }
+};
+
+// Color Filter and Color variety grew while first being shown, which on a desktop took the
+// position for the window's inside and opened them a title bar higher than placed.
+TEST_F(ToolWindows, EveryWindowHasItsSizeAndPlaceBeforeItIsFirstShown) {
+  for (const EffectSpec* spec : Effects()) {
+    SCOPED_TRACE(spec->windowObjectName);
+    ToolWindow& window = Tool(spec->toolNumber);
+    SizeWhenShown shown;
+    window.installEventFilter(&shown);
+    Main().OpenTool(spec->toolNumber);
+    window.removeEventFilter(&shown);
+    EXPECT_EQ(window.size(), shown.size);
+    EXPECT_GE(window.height(), window.minimumSizeHint().height()) << "nothing cut off";
+    const QRect main = Main().frameGeometry();
+    EXPECT_EQ(window.frameGeometry().topLeft(),
+              QPoint(main.right() + 1 - window.frameGeometry().width() - 25, main.top() + 84));
+  }
+}
+
 TEST_F(ToolWindows, FoldersAreSharedBetweenWindows) {
   MenuAction("Emboss1")->trigger();
   platform_.folderAnswers.push_back(QString("/photos/in"));
