@@ -205,8 +205,9 @@ class MainWindow : public QMainWindow, public ToolHost {
   void PictureMouseUp(QMouseEvent* event);
   void Rotate(QuarterTurn turn);
   // Runs work on a thread of its own while this thread keeps the windows painted, with a busy
-  // cursor and what runs in the status bar; input to the windows is ignored until it ends.
-  void RunWhileWindowsWait(const QString& what, const std::function<void()>& work);
+  // cursor; input to the windows is ignored until it ends. The status bar stays empty: the
+  // status line above it already says what was done last.
+  void RunWhileWindowsWait(const std::function<void()>& work);
 
   PlatformServices& platform_;
   PictureDocument document_;
