@@ -64,6 +64,28 @@ TEST_F(Desktop, StandardShortcutsRunTheirCommands) {
   }
 }
 
+// Alt+V opened Veins, and the View menu had no letter at all.
+TEST_F(Desktop, EveryMenuHasAnAltLetterOfItsOwn) {
+  QMap<QKeySequence, QString> menus;
+  for (QAction* menu : Main().menuBar()->actions()) {
+    const QKeySequence alt = QKeySequence::mnemonic(menu->text());
+    EXPECT_FALSE(alt.isEmpty()) << menu->text().toStdString();
+    EXPECT_FALSE(menus.contains(alt))
+        << menu->text().toStdString() << " and " << menus.value(alt).toStdString();
+    menus.insert(alt, menu->menu()->objectName());
+  }
+  EXPECT_EQ(menus.size(), 8);
+  const std::pair<QKeyCombination, const char*> cases[] = {{Qt::ALT | Qt::Key_V, "View1"},
+                                                           {Qt::ALT | Qt::Key_I, "Veins1"}};
+  for (const auto& [keys, name] : cases) {
+    EXPECT_EQ(menus.value(QKeySequence(keys)), name);
+    QTest::keyClick(&Main(), keys.key(), keys.keyboardModifiers());
+    auto* menu = Main().menuBar()->findChild<QMenu*>(name);
+    EXPECT_TRUE(menu->isVisible()) << name;
+    menu->close();
+  }
+}
+
 TEST_F(Desktop, ADroppedPictureFileOpensAsFileOpenDoes) {
   const QString picture = Picture("dropped.bmp", 7);
   Main().OpenTool(15);
