@@ -215,6 +215,9 @@ class MainWindow : public QMainWindow, public ToolHost {
   int activeTool_ = 0;
   QString inputFolder_;
   QString outputFolder_;
+  // Where Save starts: the folder of the picture opened, until the first save of the run.
+  QString saveStartFolder_;
+  bool savedOnce_ = false;
   bool lineArt_ = false;
   bool effectRunning_ = false;
   std::vector<ToolWindow*> toolWindows_;  // owned as child widgets
