@@ -213,7 +213,10 @@ std::optional<QString> QtPlatformServices::BrowseFolder(const QString& title,
 std::optional<std::uint32_t> QtPlatformServices::ChooseColor(std::uint32_t initial) {
   const QColor start(static_cast<int>(initial & 0xFF), static_cast<int>((initial >> 8) & 0xFF),
                      static_cast<int>((initial >> 16) & 0xFF));
-  const QColor chosen = QColorDialog::getColor(start, DialogOwner());
+  // The toolkit's own dialog, whose custom colours are always shown; a desktop's portal dialog
+  // (GNOME's) opens without them.
+  const QColor chosen =
+      QColorDialog::getColor(start, DialogOwner(), QString(), QColorDialog::DontUseNativeDialog);
   if (!chosen.isValid()) return std::nullopt;
   return static_cast<std::uint32_t>(chosen.red()) |
          (static_cast<std::uint32_t>(chosen.green()) << 8) |

@@ -1,5 +1,6 @@
 // The main window as a desktop program: keyboard, menus, drag and drop, the recent list, the
 // place of its tool windows, and the boxes and dialogs of the real platform.
+#include <QColorDialog>
 #include <QFileDialog>
 #include <QFileInfo>
 #include <QHeaderView>
@@ -228,6 +229,22 @@ TEST_F(Desktop, PictureDialogsShowTheirColumnsWhole) {
           dialog->reject();
         });
   }
+}
+
+// Under GNOME the portal's colour dialog opened, without the custom colours.
+TEST_F(Desktop, TheColourDialogIsTheToolkitsOwnWithItsCustomColours) {
+  QtPlatformServices real;
+  std::optional<std::uint32_t> chosen;
+  WhileModal([&] { chosen = real.ChooseColor(0x0000FF); },
+             [&](QDialog* d) {
+               auto* dialog = qobject_cast<QColorDialog*>(d);
+               ASSERT_NE(dialog, nullptr);
+               EXPECT_TRUE(dialog->testOption(QColorDialog::DontUseNativeDialog));
+               EXPECT_EQ(dialog->currentColor(), QColor(255, 0, 0));
+               dialog->setCurrentColor(QColor(1, 2, 3));
+               dialog->accept();
+             });
+  EXPECT_EQ(chosen, std::optional<std::uint32_t>(0x030201));
 }
 
 TEST(QtMessages, AMessageRepeatedAThousandTimesIsWrittenAFewTimes) {
