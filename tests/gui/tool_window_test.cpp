@@ -1,5 +1,6 @@
 #include <QLineEdit>
 #include <QPushButton>
+#include <QSlider>
 #include <QToolButton>
 
 #include "tests/gui/gui_fixture.h"
@@ -78,6 +79,26 @@ TEST_F(ToolWindows, EveryWindowHasItsSizeAndPlaceBeforeItIsFirstShown) {
     EXPECT_EQ(window.frameGeometry().topLeft(),
               QPoint(main.right() + 1 - window.frameGeometry().width() - 25, main.top() + 84));
   }
+}
+
+// In Vuzorar, HSL adjust and Stria each slider started where its own caption ended.
+TEST_F(ToolWindows, TheSlidersOfAWindowLineUp) {
+  int windowsWithSeveral = 0;
+  for (const EffectSpec* spec : Effects()) {
+    SCOPED_TRACE(spec->windowObjectName);
+    ToolWindow& window = Tool(spec->toolNumber);
+    Main().OpenTool(spec->toolNumber);
+    const QList<QSlider*> sliders = window.findChildren<QSlider*>();
+    if (sliders.size() < 2) continue;
+    ++windowsWithSeveral;
+    const QRect first(sliders[0]->mapTo(&window, QPoint()), sliders[0]->size());
+    for (QSlider* slider : sliders) {
+      EXPECT_EQ(slider->mapTo(&window, QPoint()).x(), first.x())
+          << slider->objectName().toStdString();
+      EXPECT_EQ(slider->width(), first.width()) << slider->objectName().toStdString();
+    }
+  }
+  EXPECT_GE(windowsWithSeveral, 4);
 }
 
 TEST_F(ToolWindows, FoldersAreSharedBetweenWindows) {
