@@ -177,6 +177,20 @@ TEST_F(FreehandWindows, CtrlZTakesBackOneStepWhicheverWindowHasTheFocus) {
   }
 }
 
+// "Rubber" was cut on both sides: the five tool buttons were narrower than their captions.
+TEST_F(FreehandWindows, EveryToolButtonShowsItsWholeCaption) {
+  Painting().ColorUp();
+  int right = 0;
+  for (const char* name :
+       {"SpeedButton14", "SpeedButton12", "SpeedButton1", "SpeedButton15", "SpeedButton11"}) {
+    auto* button = Control<QToolButton>(name);
+    EXPECT_GE(button->width(), button->fontMetrics().horizontalAdvance(button->text()) + 4) << name;
+    EXPECT_GT(button->x(), right) << name << " in its place in the row";
+    right = button->geometry().right();
+  }
+  EXPECT_LE(right, Control<QWidget>("Panel1")->width()) << "the row fits its panel";
+}
+
 TEST_F(FreehandWindows, NoPictureNoPainting) {
   Main().SetWorkingPicture(Bitmap32(), false);
   Painting().ColorUp();
