@@ -14,6 +14,7 @@
 #include "effects/mono/bw_sketch.h"
 #include "tests/gui/window_helpers.h"
 #include "ui/batch_done_dialog.h"
+#include "ui/path_field.h"
 #include "ui/picture_view.h"
 
 namespace quillane {
@@ -115,6 +116,22 @@ TEST_F(BatchWindow, ConvertWritesOnePencilSketchPerPicture) {
   EXPECT_FALSE(Completion().isModal());
   Completion().findChild<QToolButton*>("SpeedButton1")->click();
   EXPECT_FALSE(Completion().isVisible());
+}
+
+// The fields showed only the end of a long folder ("orpus/batch").
+TEST_F(BatchWindow, ALongFolderShowsItsStartAndItsEnd) {
+  const QString folder = "/home/somebody/Pictures/holidays 2026/corpus/batch";
+  auto* field = Child<PathField>(1, "Edit1");
+  field->setText(folder);
+  // The start of the path, then the folder's own name whole.
+  const QString shown = field->ShownText();
+  const qsizetype gap = shown.indexOf(QChar(0x2026));
+  EXPECT_GT(gap, 1) << shown.toStdString();
+  EXPECT_TRUE(folder.startsWith(shown.left(gap))) << shown.toStdString();
+  EXPECT_EQ(shown.mid(gap + 1), "/batch");
+  EXPECT_EQ(field->text(), folder) << "the field keeps the whole path";
+  field->setText("/in");
+  EXPECT_EQ(field->ShownText(), "/in");
 }
 
 // The loop's refusals and stops are its own tests; the window shows them and changes nothing.
