@@ -205,8 +205,9 @@ class MainWindow : public QMainWindow, public ToolHost {
   void PictureMouseUp(QMouseEvent* event);
   void Rotate(QuarterTurn turn);
   // Runs work on a thread of its own while this thread keeps the windows painted, with a busy
-  // cursor and what runs in the status bar; input to the windows is ignored until it ends.
-  void RunWhileWindowsWait(const QString& what, const std::function<void()>& work);
+  // cursor; input to the windows is ignored until it ends. The status bar stays empty: the
+  // status line above it already says what was done last.
+  void RunWhileWindowsWait(const std::function<void()>& work);
 
   PlatformServices& platform_;
   PictureDocument document_;
@@ -214,6 +215,9 @@ class MainWindow : public QMainWindow, public ToolHost {
   int activeTool_ = 0;
   QString inputFolder_;
   QString outputFolder_;
+  // Where Save starts: the folder of the picture opened, until the first save of the run.
+  QString saveStartFolder_;
+  bool savedOnce_ = false;
   bool lineArt_ = false;
   bool effectRunning_ = false;
   std::vector<ToolWindow*> toolWindows_;  // owned as child widgets

@@ -59,9 +59,10 @@ void MainWindow::AddDesktopActions() {
     const char* menu;
     char letter;
   };
-  // Color and ColorAdjust both start with C.
+  // Color and ColorAdjust both start with C; V is View's, as everywhere on the desktop (its
+  // menu comes later, with its letter in its caption), and Edit has the e of Veins.
   static const Accelerator kMenus[] = {{"File1", 'F'},  {"Edit1", 'E'},        {"BW1", 'B'},
-                                       {"Color1", 'C'}, {"ColorAdjust1", 'A'}, {"Veins1", 'V'},
+                                       {"Color1", 'C'}, {"ColorAdjust1", 'A'}, {"Veins1", 'i'},
                                        {"Help1", 'H'}};
   for (const Accelerator& a : kMenus)
     if (auto* menu = menuBar()->findChild<QMenu*>(a.menu))

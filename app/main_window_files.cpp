@@ -1,4 +1,5 @@
 // Opening a picture file and saving the working picture.
+#include <QFileInfo>
 #include <new>
 #include <optional>
 
@@ -51,12 +52,18 @@ bool MainWindow::OpenPictureFile(const QString& path) {
     return false;
   }
   RememberRecent(path);
+  // Until the user has saved somewhere, Save starts beside the picture on screen.
+  if (!savedOnce_) saveStartFolder_ = QFileInfo(path).absolutePath();
   return true;
 }
 
 void MainWindow::OnSave() {
-  const std::optional<FileChoice> choice = platform_.SavePictureDialog(kSaveFilter);
+  const std::optional<FileChoice> choice =
+      platform_.SavePictureDialog(kSaveFilter, saveStartFolder_);
   if (!choice) return;
+  // From now on the dialog's own memory of where it saved last.
+  savedOnce_ = true;
+  saveStartFolder_.clear();
   const std::string name = LocalPath(choice->path);
   // The writers replace an existing file only once the new one is complete, so a failed save
   // keeps what was there.

@@ -6,7 +6,6 @@
 #include <QLabel>
 #include <QScrollArea>
 #include <QScrollBar>
-#include <QStatusBar>
 #include <QToolButton>
 #include <exception>
 #include <new>
@@ -67,10 +66,9 @@ class IgnoreInput : public QObject {
 
 }  // namespace
 
-void MainWindow::RunWhileWindowsWait(const QString& what, const std::function<void()>& work) {
+void MainWindow::RunWhileWindowsWait(const std::function<void()>& work) {
   effectRunning_ = true;
   QApplication::setOverrideCursor(Qt::WaitCursor);
-  statusBar()->showMessage(what);
   {
     const IgnoreInput ignoreInput;
     QEventLoop loop;
@@ -81,7 +79,6 @@ void MainWindow::RunWhileWindowsWait(const QString& what, const std::function<vo
     loop.exec();
     worker.join();
   }
-  statusBar()->clearMessage();
   QApplication::restoreOverrideCursor();
   effectRunning_ = false;
 }
@@ -95,9 +92,7 @@ bool MainWindow::ApplyEffect(const EffectSpec& effect, const EffectParams& param
     // windows can be painted meanwhile and nothing ever sees a half-made picture.
     EffectRun run(document_, effect, params);
     std::exception_ptr failure;
-    QString what = QString::fromStdString(effect.menuEntry).replace("&&", "&");
-    if (what.isEmpty()) what = QString::fromStdString(effect.statusText);
-    RunWhileWindowsWait(what + QStringLiteral("..."), [&run, &failure] {
+    RunWhileWindowsWait([&run, &failure] {
       try {
         run.Compute();
       } catch (...) {

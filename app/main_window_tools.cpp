@@ -1,7 +1,7 @@
 // The tool windows: opening and closing them, and what their batch panels ask of the main
 // window (the shared folders, the batch file list and the Convert loop).
+#include <QApplication>
 #include <QListWidget>
-#include <QStatusBar>
 #include <QToolButton>
 #include <exception>
 #include <string>
@@ -14,6 +14,18 @@
 #include "ui/tool_window.h"
 
 namespace quillane {
+namespace {
+
+// The busy cursor while the Convert loop runs, whatever way it ends.
+class BusyCursor {
+ public:
+  BusyCursor() { QApplication::setOverrideCursor(Qt::WaitCursor); }
+  ~BusyCursor() { QApplication::restoreOverrideCursor(); }
+  BusyCursor(const BusyCursor&) = delete;
+  BusyCursor& operator=(const BusyCursor&) = delete;
+};
+
+}  // namespace
 
 void MainWindow::RegisterToolWindow(ToolWindow* window) {
   const int number = window->Number();
@@ -94,18 +106,16 @@ BatchResult MainWindow::ConvertBatchFolder(const EffectSpec& effect, const Effec
 
   BatchObserver observer;
   observer.message = [this](const std::string& caption, const std::string& text) {
+    // A message box in the middle of the loop waits for the user: the usual pointer over it.
+    QApplication::setOverrideCursor(Qt::ArrowCursor);
     platform_.ShowMessage(QString::fromStdString(caption), QString::fromStdString(text));
+    QApplication::restoreOverrideCursor();
   };
   // The loop blocks the event loop; repaint() draws the window at once, so the user sees each
-  // picture as it is loaded and converted without any input getting through meanwhile.
+  // picture as it is loaded and converted without any input getting through meanwhile. The
+  // status bar stays empty; the busy cursor says the loop runs.
   observer.progress = [this](const BatchProgress& progress) {
     switch (progress.step) {
-      case BatchProgress::Step::Loading:
-        statusBar()->showMessage(QStringLiteral("Converting picture %1 of %2: %3")
-                                     .arg(progress.index)
-                                     .arg(progress.count)
-                                     .arg(QString::fromStdString(ShownName(progress.name))));
-        break;
       case BatchProgress::Step::Loaded:
         ShowLoadedPicture(false);
         repaint();
@@ -114,6 +124,7 @@ BatchResult MainWindow::ConvertBatchFolder(const EffectSpec& effect, const Effec
         ShowWorkingChanged();
         repaint();
         break;
+      case BatchProgress::Step::Loading:
       case BatchProgress::Step::Written:
       case BatchProgress::Step::Skipped:
         break;
@@ -124,13 +135,15 @@ BatchResult MainWindow::ConvertBatchFolder(const EffectSpec& effect, const Effec
   };
 
   BatchResult result;
-  try {
-    result = ConvertBatch(document_, effect, params, job, observer);
-  } catch (const std::exception& e) {
-    result.end = BatchResult::End::Stopped;
-    result.error = e.what();
+  {
+    const BusyCursor busy;
+    try {
+      result = ConvertBatch(document_, effect, params, job, observer);
+    } catch (const std::exception& e) {
+      result.end = BatchResult::End::Stopped;
+      result.error = e.what();
+    }
   }
-  statusBar()->clearMessage();
   // A loop that stopped half-way may have loaded a picture it never showed converted.
   ShowWorkingChanged();
   // The output folder is taken from its field only once the input has been accepted.

@@ -52,7 +52,7 @@ void MainWindow::BuildViewControls() {
     connect(findChild<QAction*>(name), &QAction::triggered, this, &MainWindow::OnImageSize);
 
   // The zoom where a desktop user looks for it, with the usual keys.
-  auto* view = new QMenu(" View", menuBar());
+  auto* view = new QMenu(" &View", menuBar());
   view->setObjectName("View1");
   const QList<QAction*> menus = menuBar()->actions();
   menuBar()->insertMenu(menus.size() > 2 ? menus[2] : nullptr, view);

@@ -5,6 +5,7 @@
 #include <QDesktopServices>
 #include <QFileDialog>
 #include <QFileInfo>
+#include <QFileSystemModel>
 #include <QGridLayout>
 #include <QHeaderView>
 #include <QImageReader>
@@ -13,7 +14,9 @@
 #include <QMessageBox>
 #include <QPrintDialog>
 #include <QProcess>
+#include <QScreen>
 #include <QStandardPaths>
+#include <QTimer>
 #include <QTreeView>
 #include <QUrl>
 #include <algorithm>
@@ -52,16 +55,41 @@ void RememberFolder(const QFileDialog& dialog, const QString& key) {
   settings.setValue(key, dialog.directory().absolutePath());
 }
 
-// The file list in details, wide enough that no column title is cut short.
-void ShowWholeColumnTitles(QFileDialog& dialog) {
+// Size, type and date as wide as their titles and the entries shown need (they only grow, so
+// a width the user chose stays while it fits), and the name column the rest of the list, with
+// the dialog widened where the list is too narrow for that.
+void FitColumns(QFileDialog& dialog, QTreeView& view) {
+  QHeaderView* header = view.header();
+  if (header->count() < 2) return;
+  const QAbstractItemView& entries = view;  // where the entries' widths are public
+  int others = 0;
+  for (int i = 1; i < header->count(); ++i) {
+    const int needed = std::max(header->sectionSizeHint(i), entries.sizeHintForColumn(i));
+    header->resizeSection(i, std::max(header->sectionSize(i), needed));
+    others += header->sectionSize(i);
+  }
+  // Room for a name of about thirty characters.
+  const int name = std::max(header->sectionSizeHint(0), view.fontMetrics().averageCharWidth() * 30);
+  const int missing = name + others - view.viewport()->width();
+  if (missing > 0 && dialog.isVisible()) {
+    const QRect screen = dialog.screen()->availableGeometry();
+    dialog.resize(std::min(dialog.width() + missing, screen.width()), dialog.height());
+  }
+  header->resizeSection(0, std::max(name, view.viewport()->width() - others));
+}
+
+// The file list in details, every column wide enough for its title and its entries.
+void ShowWholeColumns(QFileDialog& dialog) {
   dialog.setViewMode(QFileDialog::Detail);
-  dialog.resize(dialog.size().expandedTo(QSize(800, 500)));
+  dialog.resize(dialog.size().expandedTo(QSize(860, 500)));
   auto* view = dialog.findChild<QTreeView*>("treeView");
-  if (view == nullptr || view->model() == nullptr) return;
-  // Each column at least as wide as its title with its margins and sort arrow needs.
-  QHeaderView* header = view->header();
-  for (int i = 0; i < header->count(); ++i)
-    header->resizeSection(i, std::max(header->sectionSize(i), header->sectionSizeHint(i)));
+  auto* model = dialog.findChild<QFileSystemModel*>();
+  if (view == nullptr || model == nullptr) return;
+  // The entries are read on a thread of the model's own: fitted once the dialog is up, and
+  // again as each folder has been read.
+  const auto fit = [&dialog, view] { FitColumns(dialog, *view); };
+  QObject::connect(model, &QFileSystemModel::directoryLoaded, view, fit, Qt::QueuedConnection);
+  QTimer::singleShot(0, view, fit);
 }
 
 // The open dialog shows a small preview of the file under the cursor, as the picture dialogs of
@@ -140,7 +168,7 @@ std::optional<FileChoice> QtPlatformServices::OpenPictureDialog(const QString& f
   const QStringList filters = NameFiltersFromPairs(filter);
   dialog.setNameFilters(filters);
   StartInRememberedFolder(dialog, kOpenFolderKey);
-  ShowWholeColumnTitles(dialog);
+  ShowWholeColumns(dialog);
   if (auto* grid = qobject_cast<QGridLayout*>(dialog.layout())) {
     auto* preview = new PreviewLabel(&dialog);
     grid->addWidget(preview, 1, grid->columnCount(), 1, 1, Qt::AlignTop);
@@ -152,7 +180,8 @@ std::optional<FileChoice> QtPlatformServices::OpenPictureDialog(const QString& f
                     FilterIndexOf(filters, dialog.selectedNameFilter())};
 }
 
-std::optional<FileChoice> QtPlatformServices::SavePictureDialog(const QString& filter) {
+std::optional<FileChoice> QtPlatformServices::SavePictureDialog(const QString& filter,
+                                                                const QString& startFolder) {
   QFileDialog dialog(DialogOwner());
   dialog.setOption(QFileDialog::DontUseNativeDialog);
   dialog.setAcceptMode(QFileDialog::AcceptSave);
@@ -161,8 +190,11 @@ std::optional<FileChoice> QtPlatformServices::SavePictureDialog(const QString& f
   dialog.setOption(QFileDialog::DontConfirmOverwrite);
   const QStringList filters = NameFiltersFromPairs(filter);
   dialog.setNameFilters(filters);
-  StartInRememberedFolder(dialog, kSaveFolderKey);
-  ShowWholeColumnTitles(dialog);
+  if (!startFolder.isEmpty() && QFileInfo(startFolder).isDir())
+    dialog.setDirectory(startFolder);
+  else
+    StartInRememberedFolder(dialog, kSaveFolderKey);
+  ShowWholeColumns(dialog);
   if (dialog.exec() != QDialog::Accepted || dialog.selectedFiles().isEmpty()) return std::nullopt;
   RememberFolder(dialog, kSaveFolderKey);
   return FileChoice{dialog.selectedFiles().first(),
@@ -181,7 +213,10 @@ std::optional<QString> QtPlatformServices::BrowseFolder(const QString& title,
 std::optional<std::uint32_t> QtPlatformServices::ChooseColor(std::uint32_t initial) {
   const QColor start(static_cast<int>(initial & 0xFF), static_cast<int>((initial >> 8) & 0xFF),
                      static_cast<int>((initial >> 16) & 0xFF));
-  const QColor chosen = QColorDialog::getColor(start, DialogOwner());
+  // The toolkit's own dialog, whose custom colours are always shown; a desktop's portal dialog
+  // (GNOME's) opens without them.
+  const QColor chosen =
+      QColorDialog::getColor(start, DialogOwner(), QString(), QColorDialog::DontUseNativeDialog);
   if (!chosen.isValid()) return std::nullopt;
   return static_cast<std::uint32_t>(chosen.red()) |
          (static_cast<std::uint32_t>(chosen.green()) << 8) |

@@ -13,7 +13,8 @@ class QtPlatformServices : public PlatformServices {
   void ShowMessage(const QString& caption, const QString& text) override;
   void ShowError(const QString& text) override;
   std::optional<FileChoice> OpenPictureDialog(const QString& filter) override;
-  std::optional<FileChoice> SavePictureDialog(const QString& filter) override;
+  std::optional<FileChoice> SavePictureDialog(const QString& filter,
+                                              const QString& startFolder) override;
   std::optional<QString> BrowseFolder(const QString& title, const QString& startFolder) override;
   std::optional<std::uint32_t> ChooseColor(std::uint32_t initial) override;
   bool OpenFolder(const QString& folder) override;

@@ -62,7 +62,9 @@ class NoPlatform : public PlatformServices {
   void ShowMessage(const QString&, const QString&) override {}
   void ShowError(const QString&) override {}
   std::optional<FileChoice> OpenPictureDialog(const QString&) override { return {}; }
-  std::optional<FileChoice> SavePictureDialog(const QString&) override { return {}; }
+  std::optional<FileChoice> SavePictureDialog(const QString&, const QString&) override {
+    return {};
+  }
   std::optional<QString> BrowseFolder(const QString&, const QString&) override { return {}; }
   std::optional<std::uint32_t> ChooseColor(std::uint32_t) override { return {}; }
   bool OpenFolder(const QString&) override { return false; }

@@ -2,8 +2,11 @@
 // display and saves the screen as a PNG, to look at the windows as a user sees them.
 //   xvfb-run -a -s "-screen 0 1280x1024x24" ./gui_screenshot out.png [TOOL_NUMBER [colorup]]
 // With "colorup" after a drawing window's number, its "Color up" opens the freehand windows
-// too, and the whole screen is saved as out.png.colorup.png.
+// too, and the whole screen is saved as out.png.colorup.png. A folder (starting with "/") in
+// place of "colorup" is typed into the batch panel's Input and Output fields, to see how a long
+// path shows.
 #include <QApplication>
+#include <QLineEdit>
 #include <QScreen>
 #include <QTimer>
 #include <cstdlib>
@@ -28,6 +31,12 @@ int main(int argc, char* argv[]) {
     open->ToggleBatchPanel();
     open->OnApply();
     if (argc > 3 && QString(argv[3]) == "colorup") open->OpenColorUp();
+    if (argc > 3 && argv[3][0] == '/') {
+      for (const std::string& name : {open->Spec().inputField, open->Spec().outputField})
+        if (auto* field = open->findChild<QLineEdit*>(QString::fromStdString(name)))
+          field->setText(QString::fromLocal8Bit(argv[3]) +
+                         (name == open->Spec().outputField ? QStringLiteral("/out") : QString()));
+    }
   }
   QTimer::singleShot(700, [&] {
     const QPixmap screen = QApplication::primaryScreen()->grabWindow(0);

@@ -34,6 +34,21 @@ QLabel* CaptionLabel(const ParamSpec& p, QWidget& window) {
   return label;
 }
 
+// Every slider caption of a window as wide as the widest one (and at least kCaptionWidth), so
+// that the window's sliders start and end at the same place, each caption shown whole.
+void LineUpSliderCaptions(QWidget& window, QLabel& added) {
+  static constexpr char kSliderCaption[] = "quillaneSliderCaption";
+  added.setProperty(kSliderCaption, true);
+  QList<QLabel*> captions;
+  int width = kCaptionWidth;
+  for (QLabel* label : window.findChildren<QLabel*>()) {
+    if (!label->property(kSliderCaption).toBool()) continue;
+    captions << label;
+    width = std::max(width, label->sizeHint().width());
+  }
+  for (QLabel* label : captions) label->setFixedWidth(width);
+}
+
 class SliderParam : public ParamWidget {
  public:
   SliderParam(const ParamSpec& p, QWidget& window, QVBoxLayout& rows, std::function<void()> changed)
@@ -41,8 +56,7 @@ class SliderParam : public ParamWidget {
     auto* row = new QHBoxLayout;
     row->setSpacing(6);
     QLabel* caption = CaptionLabel(p, window);
-    // Short captions line their sliders up; a longer one is shown whole rather than cut off.
-    caption->setFixedWidth(std::max(kCaptionWidth, caption->sizeHint().width()));
+    LineUpSliderCaptions(window, *caption);
     row->addWidget(caption);
     slider_ = new QSlider(Qt::Horizontal, &window);
     slider_->setObjectName(Text(p.objectName));

@@ -34,9 +34,11 @@ class PlatformServices {
   virtual void ShowError(const QString& text) = 0;
 
   // The picture open and save dialogs. filter lists pairs of displayed name and mask separated
-  // by "|": "*.jpg|*.jpg|All files|*.*". std::nullopt when the user cancels.
+  // by "|": "*.jpg|*.jpg|All files|*.*". std::nullopt when the user cancels. The save dialog
+  // opens in startFolder, or with none in the folder it was last used in.
   virtual std::optional<FileChoice> OpenPictureDialog(const QString& filter) = 0;
-  virtual std::optional<FileChoice> SavePictureDialog(const QString& filter) = 0;
+  virtual std::optional<FileChoice> SavePictureDialog(const QString& filter,
+                                                      const QString& startFolder) = 0;
 
   // The folder browser: folders only, with a title line, opened at startFolder. The chosen
   // folder's full path, or std::nullopt on cancel.

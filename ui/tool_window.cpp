@@ -13,6 +13,7 @@
 
 #include "batch/batch_convert.h"
 #include "ui/glyphs.h"
+#include "ui/path_field.h"
 #include "ui/platform.h"
 
 namespace quillane {
@@ -115,7 +116,7 @@ void ToolWindow::BuildBatchPanel(QBoxLayout* outer) {
                     const char* buttonName) {
     auto* label = new QLabel(caption, batchPanel_);
     label->setObjectName(labelName);
-    auto* edit = new QLineEdit(batchPanel_);
+    auto* edit = new PathField(batchPanel_);
     edit->setObjectName(editName);
     auto* browse = new QToolButton(batchPanel_);
     browse->setObjectName(buttonName);
@@ -130,7 +131,8 @@ void ToolWindow::BuildBatchPanel(QBoxLayout* outer) {
       addRow(1, "Label7", "Output:", spec_.outputField.c_str(), "SpeedButton3");
   inputField_ = input;
   outputField_ = output;
-  // A long folder does not fit the field; its tooltip shows the whole of it.
+  // A long folder does not fit the field, which leaves out its middle; the tooltip shows the
+  // whole of it.
   for (QLineEdit* field : {input, output})
     connect(field, &QLineEdit::textChanged, field, &QLineEdit::setToolTip);
   connect(browseIn, &QToolButton::clicked, this, &ToolWindow::BrowseInputFolder);

@@ -3,6 +3,7 @@
 #include <QApplication>
 #include <QLabel>
 #include <QPushButton>
+#include <QStatusBar>
 #include <QTest>
 #include <QTimer>
 #include <chrono>
@@ -30,8 +31,12 @@ TEST_F(EffectWhileBusy, ASecondApplyWhileOneRunsIsIgnored) {
                   }};
   bool runningMeanwhile = false, secondApplied = true;
   Qt::CursorShape cursorMeanwhile = Qt::ArrowCursor;
+  QString barMeanwhile = "not read", statusMeanwhile;
+  Main().SetStatusText("Before");
   QTimer::singleShot(0, [&] {
     runningMeanwhile = Main().EffectRunning();
+    barMeanwhile = Main().statusBar()->currentMessage();
+    statusMeanwhile = Main().StatusText();
     cursorMeanwhile =
         QApplication::overrideCursor() ? QApplication::overrideCursor()->shape() : Qt::ArrowCursor;
     secondApplied = Main().ApplyEffect(Giving(Flat(2), "Second"), {}, true);
@@ -40,6 +45,9 @@ TEST_F(EffectWhileBusy, ASecondApplyWhileOneRunsIsIgnored) {
   ASSERT_TRUE(Main().ApplyEffect(slow, {}, true));
   EXPECT_TRUE(runningMeanwhile);
   EXPECT_EQ(cursorMeanwhile, Qt::WaitCursor);
+  // One text says what was done last: the status line's. The bar below it stays empty.
+  EXPECT_EQ(barMeanwhile, "");
+  EXPECT_EQ(statusMeanwhile, "Before");
   EXPECT_FALSE(secondApplied);
   EXPECT_FALSE(Main().EffectRunning());
   EXPECT_EQ(QApplication::overrideCursor(), nullptr);

@@ -1,12 +1,16 @@
 // The main window as a desktop program: keyboard, menus, drag and drop, the recent list, the
 // place of its tool windows, and the boxes and dialogs of the real platform.
+#include <QColorDialog>
 #include <QFileDialog>
+#include <QFileInfo>
+#include <QHeaderView>
 #include <QMessageBox>
 #include <QMimeData>
 #include <QSignalSpy>
 #include <QTest>
 #include <QTimer>
 #include <QToolButton>
+#include <QTreeView>
 #include <functional>
 
 #include "app/qt_messages.h"
@@ -61,6 +65,28 @@ TEST_F(Desktop, StandardShortcutsRunTheirCommands) {
     EXPECT_FALSE(done());
     QTest::keyClick(&Main(), keys.key(), keys.keyboardModifiers());
     EXPECT_TRUE(done());
+  }
+}
+
+// Alt+V opened Veins, and the View menu had no letter at all.
+TEST_F(Desktop, EveryMenuHasAnAltLetterOfItsOwn) {
+  QMap<QKeySequence, QString> menus;
+  for (QAction* menu : Main().menuBar()->actions()) {
+    const QKeySequence alt = QKeySequence::mnemonic(menu->text());
+    EXPECT_FALSE(alt.isEmpty()) << menu->text().toStdString();
+    EXPECT_FALSE(menus.contains(alt))
+        << menu->text().toStdString() << " and " << menus.value(alt).toStdString();
+    menus.insert(alt, menu->menu()->objectName());
+  }
+  EXPECT_EQ(menus.size(), 8);
+  const std::pair<QKeyCombination, const char*> cases[] = {{Qt::ALT | Qt::Key_V, "View1"},
+                                                           {Qt::ALT | Qt::Key_I, "Veins1"}};
+  for (const auto& [keys, name] : cases) {
+    EXPECT_EQ(menus.value(QKeySequence(keys)), name);
+    QTest::keyClick(&Main(), keys.key(), keys.keyboardModifiers());
+    auto* menu = Main().menuBar()->findChild<QMenu*>(name);
+    EXPECT_TRUE(menu->isVisible()) << name;
+    menu->close();
   }
 }
 
@@ -143,31 +169,82 @@ TEST_F(Desktop, MessageBoxesBelongToTheWindowThatRaisedThem) {
   }
 }
 
-TEST_F(Desktop, OpenAndSaveDialogsRememberTheirOwnFolders) {
+// Through a main window on the real dialogs: the first save of a run started at home rather
+// than beside the picture just opened.
+TEST_F(Desktop, OpenAndSaveDialogsStartWhereTheUserWorks) {
   QtPlatformServices real;
+  MainWindow window(real, TestPicture());
+  window.show();
   QDir(Path("")).mkpath("opened");
   QDir(Path("")).mkpath("saved");
   Picture("opened/a.bmp", 2);
   const std::tuple<bool, QString, QString> steps[] = {// open?, file chosen, folder shown first
                                                       {true, "opened/a.bmp", ""},
-                                                      {false, "saved/b.jpg", ""},
+                                                      {false, "saved/b.jpg", "opened"},
                                                       {true, "opened/a.bmp", "opened"},
                                                       {false, "saved/c.jpg", "saved"}};
   for (const auto& [open, file, startsIn] : steps) {
+    WhileModal([&, open = open] { open ? window.OnOpen() : window.OnSave(); },
+               [&, file = file, startsIn = startsIn](QDialog* d) {
+                 auto* dialog = qobject_cast<QFileDialog*>(d);
+                 if (!startsIn.isEmpty()) {
+                   EXPECT_EQ(dialog->directory().path(), Path(startsIn)) << file.toStdString();
+                 }
+                 dialog->selectFile(Path(file));
+                 QMetaObject::invokeMethod(dialog, "accept");
+               });
+  }
+  EXPECT_TRUE(QFileInfo::exists(Path("saved/c.jpg")));
+  EXPECT_EQ(ProgramSettings().value("dialogs/saveFolder").toString(), Path("saved"));
+}
+
+// The list cut its entries at the dialogs' first size ("73....KiB", "JPE...age").
+TEST_F(Desktop, PictureDialogsShowTheirColumnsWhole) {
+  QtPlatformServices real;
+  QDir(Path("")).mkpath("pictures");
+  WriteBytes(LocalPath("pictures/a.jpg"), std::string(75000, 'x'));
+  WriteBytes(LocalPath("pictures/by the lake at dawn.jpg"), std::string(900, 'x'));
+  ProgramSettings().setValue("dialogs/openFolder", Path("pictures"));
+  ProgramSettings().setValue("dialogs/saveFolder", Path("pictures"));
+  for (bool open : {true, false}) {
     WhileModal(
-        [&, open = open] {
-          open ? real.OpenPictureDialog("*.bmp|*.bmp") : real.SavePictureDialog("*.jpg|*.jpg");
+        [&] {
+          open ? real.OpenPictureDialog("*.jpg|*.jpg") : real.SavePictureDialog("*.jpg|*.jpg", {});
         },
-        [&, file = file, startsIn = startsIn](QDialog* d) {
-          auto* dialog = qobject_cast<QFileDialog*>(d);
-          if (!startsIn.isEmpty()) {
-            EXPECT_EQ(dialog->directory().path(), Path(startsIn));
+        [&](QDialog* dialog) {
+          SCOPED_TRACE(open ? "open" : "save");
+          auto* tree = dialog->findChild<QTreeView*>("treeView");
+          const QAbstractItemView* view = tree;
+          EXPECT_TRUE(
+              QTest::qWaitFor([&] { return view->model()->rowCount(view->rootIndex()) == 2; }));
+          QTest::qWait(20);  // the columns are fitted once the folder is read
+          QHeaderView* header = tree->header();
+          int total = 0;
+          for (int i = 0; i < header->count(); ++i) {
+            EXPECT_GE(header->sectionSize(i), view->sizeHintForColumn(i)) << i;
+            EXPECT_GE(header->sectionSize(i), header->sectionSizeHint(i)) << i;
+            total += header->sectionSize(i);
           }
-          dialog->selectFile(Path(file));
-          QMetaObject::invokeMethod(dialog, "accept");
+          EXPECT_LE(total, view->viewport()->width()) << "no sideways scrolling";
+          dialog->reject();
         });
   }
-  EXPECT_EQ(ProgramSettings().value("dialogs/saveFolder").toString(), Path("saved"));
+}
+
+// Under GNOME the portal's colour dialog opened, without the custom colours.
+TEST_F(Desktop, TheColourDialogIsTheToolkitsOwnWithItsCustomColours) {
+  QtPlatformServices real;
+  std::optional<std::uint32_t> chosen;
+  WhileModal([&] { chosen = real.ChooseColor(0x0000FF); },
+             [&](QDialog* d) {
+               auto* dialog = qobject_cast<QColorDialog*>(d);
+               ASSERT_NE(dialog, nullptr);
+               EXPECT_TRUE(dialog->testOption(QColorDialog::DontUseNativeDialog));
+               EXPECT_EQ(dialog->currentColor(), QColor(255, 0, 0));
+               dialog->setCurrentColor(QColor(1, 2, 3));
+               dialog->accept();
+             });
+  EXPECT_EQ(chosen, std::optional<std::uint32_t>(0x030201));
 }
 
 TEST(QtMessages, AMessageRepeatedAThousandTimesIsWrittenAFewTimes) {

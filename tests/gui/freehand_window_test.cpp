@@ -5,6 +5,7 @@
 #include <QPushButton>
 #include <QScrollArea>
 #include <QSlider>
+#include <QTest>
 #include <QToolButton>
 
 #include "tests/gui/gui_fixture.h"
@@ -151,6 +152,43 @@ TEST_F(FreehandWindows, PhotoFitsTheViewAndTheEyedropperPicksFromIt) {
   Main().ShowNewPicture(Bitmap32(800, 600, kWhite), true);
   Painting().ColorUp();
   EXPECT_EQ(Panel().PhotoView()->size(), QSize(217, 163));
+}
+
+// Once a tool button or Thin had the focus, Ctrl+Z did nothing until the work area was clicked.
+TEST_F(FreehandWindows, CtrlZTakesBackOneStepWhicheverWindowHasTheFocus) {
+  Main().SetLineArt(true);
+  Painting().ColorUp();
+  const std::pair<const char*, QWidget*> cases[] = {
+      {"Pen button", Control<QWidget>("SpeedButton12")},
+      {"Thin button", Control<QWidget>("Button8")},
+      {"work area", Area().Canvas()}};
+  for (const auto& [where, focus] : cases) {
+    SCOPED_TRACE(where);
+    Press("SpeedButton12");
+    Stroke({{2, 20}, {30, 20}});
+    const Bitmap32 afterStroke = Area().Picture();
+    Press("Button8");
+    ASSERT_NE(Area().Picture(), afterStroke);
+    focus->window()->activateWindow();
+    focus->setFocus();
+    ASSERT_TRUE(QTest::qWaitForWindowActive(focus->window()));
+    QTest::keyClick(focus, Qt::Key_Z, Qt::ControlModifier);
+    EXPECT_EQ(Area().Picture(), afterStroke) << "Thin taken back, and only Thin";
+  }
+}
+
+// "Rubber" was cut on both sides: the five tool buttons were narrower than their captions.
+TEST_F(FreehandWindows, EveryToolButtonShowsItsWholeCaption) {
+  Painting().ColorUp();
+  int right = 0;
+  for (const char* name :
+       {"SpeedButton14", "SpeedButton12", "SpeedButton1", "SpeedButton15", "SpeedButton11"}) {
+    auto* button = Control<QToolButton>(name);
+    EXPECT_GE(button->width(), button->fontMetrics().horizontalAdvance(button->text()) + 4) << name;
+    EXPECT_GT(button->x(), right) << name << " in its place in the row";
+    right = button->geometry().right();
+  }
+  EXPECT_LE(right, Control<QWidget>("Panel1")->width()) << "the row fits its panel";
 }
 
 TEST_F(FreehandWindows, NoPictureNoPainting) {

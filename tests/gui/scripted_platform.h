@@ -30,6 +30,7 @@ class ScriptedPlatform : public PlatformServices {
   std::vector<QString> errors;
   std::vector<QString> openFilters;
   std::vector<QString> saveFilters;
+  std::vector<QString> saveStartFolders;
   std::vector<FolderRequest> folderRequests;
   std::vector<std::uint32_t> colorRequests;
   std::vector<QString> openedFolders;
@@ -53,8 +54,10 @@ class ScriptedPlatform : public PlatformServices {
     openFilters.push_back(filter);
     return Next(openAnswers);
   }
-  std::optional<FileChoice> SavePictureDialog(const QString& filter) override {
+  std::optional<FileChoice> SavePictureDialog(const QString& filter,
+                                              const QString& startFolder) override {
     saveFilters.push_back(filter);
+    saveStartFolders.push_back(startFolder);
     return Next(saveAnswers);
   }
   std::optional<QString> BrowseFolder(const QString& title, const QString& startFolder) override {

@@ -1,5 +1,6 @@
 #include <QLineEdit>
 #include <QPushButton>
+#include <QSlider>
 #include <QToolButton>
 
 #include "tests/gui/gui_fixture.h"
@@ -50,6 +51,54 @@ TEST_F(ToolWindows, ChoosingTheOpenWindowAgainShowsItAfresh) {
   EXPECT_TRUE(Tool(kPencilSketch).isVisible());
   EXPECT_EQ(Main().ActiveTool(), 1);
   EXPECT_FALSE(colorUp->isEnabled());
+}
+
+// The size a window has when its show event arrives.
+class SizeWhenShown : public QObject {
+ public:
+  QSize size;
+  bool eventFilter(QObject* watched, QEvent* event) override {
+    if (event->type() == QEvent::Show) size = static_cast<QWidget*>(watched)->size();
+    return false;
+  }
+};
+
+// Color Filter and Color variety grew while first being shown, which on a desktop took the
+// position for the window's inside and opened them a title bar higher than placed.
+TEST_F(ToolWindows, EveryWindowHasItsSizeAndPlaceBeforeItIsFirstShown) {
+  for (const EffectSpec* spec : Effects()) {
+    SCOPED_TRACE(spec->windowObjectName);
+    ToolWindow& window = Tool(spec->toolNumber);
+    SizeWhenShown shown;
+    window.installEventFilter(&shown);
+    Main().OpenTool(spec->toolNumber);
+    window.removeEventFilter(&shown);
+    EXPECT_EQ(window.size(), shown.size);
+    EXPECT_GE(window.height(), window.minimumSizeHint().height()) << "nothing cut off";
+    const QRect main = Main().frameGeometry();
+    EXPECT_EQ(window.frameGeometry().topLeft(),
+              QPoint(main.right() + 1 - window.frameGeometry().width() - 25, main.top() + 84));
+  }
+}
+
+// In Vuzorar, HSL adjust and Stria each slider started where its own caption ended.
+TEST_F(ToolWindows, TheSlidersOfAWindowLineUp) {
+  int windowsWithSeveral = 0;
+  for (const EffectSpec* spec : Effects()) {
+    SCOPED_TRACE(spec->windowObjectName);
+    ToolWindow& window = Tool(spec->toolNumber);
+    Main().OpenTool(spec->toolNumber);
+    const QList<QSlider*> sliders = window.findChildren<QSlider*>();
+    if (sliders.size() < 2) continue;
+    ++windowsWithSeveral;
+    const QRect first(sliders[0]->mapTo(&window, QPoint()), sliders[0]->size());
+    for (QSlider* slider : sliders) {
+      EXPECT_EQ(slider->mapTo(&window, QPoint()).x(), first.x())
+          << slider->objectName().toStdString();
+      EXPECT_EQ(slider->width(), first.width()) << slider->objectName().toStdString();
+    }
+  }
+  EXPECT_GE(windowsWithSeveral, 4);
 }
 
 TEST_F(ToolWindows, FoldersAreSharedBetweenWindows) {

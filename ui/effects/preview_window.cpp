@@ -4,6 +4,7 @@
 #include <QButtonGroup>
 #include <QGridLayout>
 #include <QHBoxLayout>
+#include <QLayout>
 #include <QVBoxLayout>
 #include <algorithm>
 #include <functional>
@@ -54,13 +55,24 @@ PreviewWindow::PreviewWindow(const EffectSpec& spec, ToolHost& host, QWidget* pa
   ControlsLayout()->insertLayout(0, row);
 }
 
+void PreviewWindow::setVisible(bool visible) {
+  // The swatches' style sheets take effect once the window is polished; only then does the
+  // layout know how tall the window must be. The height is set before the window is shown: a
+  // window resized while it is first being shown takes the position it was placed at for its
+  // inside rather than its frame, and opens a title bar higher than placed.
+  if (visible && isHidden()) {
+    ensurePolished();
+    // The controls added after the base window was built count only once the layout has run.
+    layout()->activate();
+    SetWindowHeights(std::max(height(), sizeHint().height()), 0);
+  }
+  ToolWindow::setVisible(visible);
+}
+
 void PreviewWindow::OnShown() {
   // The shared steps uncheck "For current", which loads the source.
   ToolWindow::OnShown();
   LoadBase();
-  // The swatches' style sheets take effect once the window is polished; only then does the
-  // layout know how tall the window must be.
-  SetWindowHeights(std::max(height(), sizeHint().height()), 0);
 }
 
 void PreviewWindow::LoadBase() {

@@ -23,6 +23,9 @@ class PreviewWindow : public ToolWindow {
   void OnApply() override;
   void ShowBase();
 
+ public:
+  void setVisible(bool visible) override;
+
  protected:
   void OnShown() override;
   void ControlChanged(const ParamSpec& param) override;

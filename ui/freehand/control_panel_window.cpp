@@ -14,9 +14,11 @@
 #include <QPushButton>
 #include <QShowEvent>
 #include <QSlider>
+#include <QStyle>
 #include <QToolButton>
 #include <algorithm>
 #include <cmath>
+#include <vector>
 
 #include "imaging/numeric.h"
 #include "ui/clickable.h"
@@ -115,6 +117,21 @@ ControlPanelWindow::ControlPanelWindow(PaintingState& state, ToolHost& host,
     toolRow->addWidget(button);
   }
   grid->addLayout(toolRow, 0, 0, 1, 3);
+  // Each button as wide as its caption with the frame around it, or "Rubber" is cut on both
+  // sides, and what is left of the row shared out equally.
+  const QList<QAbstractButton*> toolButtons = tools_->buttons();
+  std::vector<int> widths;
+  int spare = kViewWidth - grid->contentsMargins().left() - grid->contentsMargins().right() -
+              toolRow->spacing() * static_cast<int>(toolButtons.size() - 1);
+  for (QAbstractButton* button : toolButtons) {
+    const int frame = button->style()->pixelMetric(QStyle::PM_DefaultFrameWidth, nullptr, button);
+    widths.push_back(button->fontMetrics().horizontalAdvance(button->text()) + 2 * (frame + 2));
+    spare -= widths.back();
+  }
+  for (int i = 0; i < static_cast<int>(toolButtons.size()); ++i) {
+    const int share = std::max(0, spare) / static_cast<int>(toolButtons.size());
+    toolButtons[i]->setFixedWidth(widths[static_cast<std::size_t>(i)] + share);
+  }
 
   auto* panel = new Clickable<QFrame>(toolPanel_, [this] { ChooseBrushColor(); });
   panel->setObjectName("ColorPanel");
@@ -154,6 +171,9 @@ ControlPanelWindow::ControlPanelWindow(PaintingState& state, ToolHost& host,
   addButton("Button2", "Cancel", nullptr, 1, 1, &ControlPanelWindow::OnCancel);
   grid->addLayout(buttons, 3, 0, 1, 3);
   grid->setRowStretch(4, 1);
+
+  // After a click on a tool or Thin the focus is here, and Ctrl+Z must still take back a step.
+  addAction(workArea_.UndoStrokeAction());
 }
 
 // --- Opening and closing -----------------------------------------------------------------------

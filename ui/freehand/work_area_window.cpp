@@ -104,12 +104,12 @@ WorkAreaWindow::WorkAreaWindow(PaintingState& state, ToolHost& host)
   scrollBox_->setWidget(canvas_);
   layout->addWidget(scrollBox_);
 
-  auto* undo = new QAction("Undo stroke", this);
-  undo->setObjectName("UndoStroke");
-  undo->setShortcut(QKeySequence::Undo);
-  undo->setShortcutContext(Qt::WindowShortcut);
-  connect(undo, &QAction::triggered, this, &WorkAreaWindow::UndoStroke);
-  addAction(undo);
+  undoStroke_ = new QAction("Undo stroke", this);
+  undoStroke_->setObjectName("UndoStroke");
+  undoStroke_->setShortcut(QKeySequence::Undo);
+  undoStroke_->setShortcutContext(Qt::WindowShortcut);
+  connect(undoStroke_, &QAction::triggered, this, &WorkAreaWindow::UndoStroke);
+  addAction(undoStroke_);
 }
 
 // --- Opening and closing -----------------------------------------------------------------------

@@ -13,6 +13,7 @@
 #include "freehand/strokes.h"
 #include "imaging/bitmap32.h"
 
+class QAction;
 class QScrollArea;
 
 namespace quillane {
@@ -58,6 +59,9 @@ class WorkAreaWindow : public QWidget {
   void ThickPicture();
   // Ctrl+Z: the last stroke (or Thin, Thick) taken back.
   void UndoStroke();
+  // The Ctrl+Z action, for the control panel to carry too: one action, so the key works in
+  // either window of the pair and never takes back two steps at once.
+  QAction* UndoStrokeAction() const { return undoStroke_; }
   // The pointers for the current tool; the brush outline follows a new pen size at once.
   void UpdateToolCursor();
   void PenSizeChanged();
@@ -97,6 +101,7 @@ class WorkAreaWindow : public QWidget {
   QWidget* controlPanel_ = nullptr;
   QScrollArea* scrollBox_ = nullptr;
   FreehandCanvas* canvas_ = nullptr;
+  QAction* undoStroke_ = nullptr;
 
   Bitmap32 picture_;
   StrokeHistory strokes_;
