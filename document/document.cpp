@@ -95,7 +95,8 @@ const Bitmap32& EmptyPicture() {
 
 }  // namespace
 
-PictureDocument::PictureDocument(Bitmap32 picture) {
+PictureDocument::PictureDocument(Bitmap32 picture, History history)
+    : keepsHistory_(history == History::Kept) {
   Load(std::move(picture));
   ResetHistory();
 }
@@ -154,6 +155,7 @@ void PictureDocument::Load(std::shared_ptr<Bitmap32> picture) {
 
 void PictureDocument::Backup() {
   spare_.storage = Bitmap32();
+  if (!keepsHistory_) return;
   currentSlot_ = currentSlot_ % kSlots + 1;
   SlotAt(currentSlot_) = Record(working_);
   if (undoCount_ < kMaxSteps) ++undoCount_;
@@ -255,7 +257,7 @@ void PictureDocument::ResetHistory() {
   currentSlot_ = 1;
   undoCount_ = 0;
   redoCount_ = 0;
-  SlotAt(1) = Record(working_);
+  if (keepsHistory_) SlotAt(1) = Record(working_);
   LetGoOfUnreachableSlots();
   // The memory kept for pictures of another size goes back to the system with the slots let go.
   ReleasePictureMemory(working_->PixelCount() * sizeof(Pixel));

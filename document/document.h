@@ -27,9 +27,14 @@ class PictureDocument {
   static constexpr int kSlots = 21;
   static constexpr int kMaxSteps = kSlots - 1;
 
+  // Whether the document records history states. A one-shot command can never undo, so it
+  // runs without: its pictures are then never packed or kept for Undo, and Backup and
+  // ResetHistory leave the slots empty and the counts at 0.
+  enum class History { Kept, None };
+
   // Starts with picture (its alpha set to 255) as working, source and opened picture and in
   // slot 1.
-  explicit PictureDocument(Bitmap32 picture = Bitmap32());
+  explicit PictureDocument(Bitmap32 picture = Bitmap32(), History history = History::Kept);
 
   const Bitmap32& Working() const { return *working_; }
   const Bitmap32& Source() const { return *source_; }
@@ -39,6 +44,11 @@ class PictureDocument {
   void SetWorking(Bitmap32 picture) { working_ = Share(std::move(picture)); }
   // Rotation and resizing change the source picture as well.
   void SetSource(Bitmap32 picture) { source_ = Share(std::move(picture)); }
+  // Both at once, as one picture, when a change of shape made the same result of both.
+  void SetWorkingAndSource(Bitmap32 picture) { working_ = source_ = Share(std::move(picture)); }
+  // True while the working and the source picture are one picture in memory, so that work
+  // done on both need be done once.
+  bool WorkingIsSource() const { return working_ == source_; }
 
   // Makes picture (alpha set to 255) the working, source and opened picture, as loading a file
   // does. The history is left alone; opening a file follows this with ResetHistory.
@@ -115,6 +125,7 @@ class PictureDocument {
   int undoCount_ = 0;
   int redoCount_ = 0;
   std::uint32_t randomState_ = 0;
+  bool keepsHistory_ = true;
 };
 
 }  // namespace quillane
