@@ -88,7 +88,7 @@ void MainWindow::BuildViewControls() {
 // --- Zoom ----------------------------------------------------------------------------------
 
 void MainWindow::ShowWorking(double zoom) {
-  image1_->SetPicture(document_.Working());
+  image1_->SetPicture(document_.SharedWorking());
   SetDisplaySize(zoom);
 }
 

@@ -16,12 +16,27 @@ QImage OpaqueImage(const Bitmap32& picture) {
   return view.copy();
 }
 
+QImage SharedOpaqueImage(std::shared_ptr<const Bitmap32> picture) {
+  if (!picture || picture->Empty()) return QImage();
+  const Bitmap32& shown = *picture;
+  auto* holder = new std::shared_ptr<const Bitmap32>(std::move(picture));
+  return QImage(
+      reinterpret_cast<const uchar*>(shown.Data()), shown.Width(), shown.Height(),
+      static_cast<qsizetype>(shown.Width()) * 4, QImage::Format_RGB32,
+      [](void* held) { delete static_cast<std::shared_ptr<const Bitmap32>*>(held); }, holder);
+}
+
 PictureView::PictureView(QWidget* parent) : QWidget(parent) {
   setAttribute(Qt::WA_OpaquePaintEvent);
 }
 
 void PictureView::SetPicture(const Bitmap32& picture) {
   image_ = OpaqueImage(picture);
+  update();
+}
+
+void PictureView::SetPicture(std::shared_ptr<const Bitmap32> picture) {
+  image_ = SharedOpaqueImage(std::move(picture));
   update();
 }
 
