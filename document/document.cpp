@@ -15,12 +15,18 @@ namespace quillane {
 // One history state. It starts as the recorded picture itself; once packed, only a weak
 // reference to that picture is kept, which finds it again while a document still shows it.
 // Packing is the only change a state ever sees, and it does not change what the state holds.
+// A state next to the document's current one is also kept unpacked (ready), so that one Undo
+// or Redo shows it without waiting for the unpacking.
 struct PictureDocument::SlotState {
   explicit SlotState(Picture picture) : seen(picture), picture(std::move(picture)) {}
   std::mutex mutex;
+  std::condition_variable unpacked;
   std::weak_ptr<const Bitmap32> seen;
   Picture picture;  // until packed
   std::shared_ptr<const PackedPicture> packed;
+  Picture ready;
+  bool wanted = false;     // next to the current state: worth keeping ready
+  bool unpacking = false;  // being made ready on the background thread
 };
 
 namespace {
@@ -161,64 +167,99 @@ void PictureDocument::Backup() {
   if (undoCount_ < kMaxSteps) ++undoCount_;
   redoCount_ = 0;
   LetGoOfUnreachableSlots();
+  KeepNeighboursReady();
 }
 
-PictureDocument::Picture PictureDocument::TakeSlot(int target, int leaving) {
-  // The picture being left can lend its storage when the slot it came from has it packed and
-  // nothing else holds it: fresh memory costs far more than unpacking.
-  std::shared_ptr<const PackedPicture> leavingPacked;
-  if (const SlotHandle& from = SlotAt(leaving); from && working_.use_count() == 1) {
-    std::lock_guard lock(from->mutex);
-    const bool same = !from->seen.owner_before(working_) && !working_.owner_before(from->seen);
-    if (same && from->packed && !from->picture) leavingPacked = from->packed;
-  }
-  const auto lend = [&](Bitmap32& storage) {
-    storage = std::move(const_cast<Bitmap32&>(*working_));
-    working_.reset();
-  };
-
+PictureDocument::Picture PictureDocument::TakeSlot(int target) {
   SlotState& state = *SlotAt(target);
   std::shared_ptr<const PackedPicture> packed;
   {
-    std::lock_guard lock(state.mutex);
-    Picture shown = state.picture ? state.picture : state.seen.lock();
-    if (shown) {
-      if (leavingPacked) lend(spare_.storage);
-      return shown;
-    }
+    std::unique_lock lock(state.mutex);
+    // Unpacking it twice would only slow both down.
+    state.unpacked.wait(lock, [&] { return !state.unpacking; });
+    if (state.ready) return state.ready;
+    if (Picture shown = state.picture ? state.picture : state.seen.lock()) return shown;
     packed = state.packed;
   }
-
-  Bitmap32 storage;
-  if (leavingPacked) {
-    lend(storage);
-  } else {
-    storage = std::move(spare_.storage);
-    spare_.storage = Bitmap32();
-  }
-  try {
-    packed->UnpackInto(storage);
-  } catch (...) {
-    if (leavingPacked) {
-      // Give the working picture back before reporting the failure.
-      try {
-        leavingPacked->UnpackInto(storage);
-      } catch (...) {
-      }
-      working_ = Share(std::move(storage));
-      std::lock_guard lock(SlotAt(leaving)->mutex);
-      SlotAt(leaving)->seen = working_;
-    }
-    throw;
-  }
+  Bitmap32 storage = std::move(spare_.storage);
+  spare_.storage = Bitmap32();
+  packed->UnpackInto(storage);
   Picture picture = Share(std::move(storage));
   std::lock_guard lock(state.mutex);
+  if (Picture shown = state.seen.lock()) return shown;  // made ready meanwhile
   state.seen = picture;
   return picture;
 }
 
+void PictureDocument::KeepNeighboursReady() {
+  const int back = currentSlot_ == 1 ? kSlots : currentSlot_ - 1;
+  const int forward = currentSlot_ % kSlots + 1;
+  for (int slot = 1; slot <= kSlots; ++slot) {
+    const SlotHandle& state = SlotAt(slot);
+    if (!state) continue;
+    const bool wanted = (slot == back && undoCount_ > 0) || (slot == forward && redoCount_ > 0);
+    std::shared_ptr<const PackedPicture> packed;
+    {
+      std::lock_guard lock(state->mutex);
+      state->wanted = wanted;
+      if (!wanted) {
+        Picture released = std::move(state->ready);
+        state->ready.reset();
+        // Nobody else holds it, and nobody can find it while the lock is held: its storage
+        // serves the next state to be unpacked.
+        if (released && released.use_count() == 1 && spare_.storage.Empty()) {
+          state->seen.reset();
+          spare_.storage = std::move(const_cast<Bitmap32&>(*released));
+        }
+        continue;
+      }
+      if (state->ready || state->unpacking) continue;
+      state->ready = state->picture ? state->picture : state->seen.lock();
+      if (state->ready) continue;
+      packed = state->packed;
+    }
+    if (packed) UnpackAhead(state, std::move(packed));
+  }
+}
+
+void PictureDocument::UnpackAhead(const SlotHandle& state,
+                                  std::shared_ptr<const PackedPicture> packed) {
+  auto storage = std::make_shared<Bitmap32>(std::move(spare_.storage));
+  spare_.storage = Bitmap32();
+  HistoryPacker::Instance().Add([weak = std::weak_ptr<SlotState>(state), packed, storage] {
+    const SlotHandle slot = weak.lock();
+    if (!slot) return;
+    {
+      std::lock_guard lock(slot->mutex);
+      if (!slot->wanted || slot->ready || slot->unpacking) return;
+      if ((slot->ready = slot->seen.lock())) return;
+      slot->unpacking = true;
+    }
+    Picture picture;
+    try {
+      packed->UnpackInto(*storage);
+      picture = Share(std::move(*storage));
+    } catch (const std::exception&) {
+      // Short of memory: Undo or Redo unpacks it when it comes.
+    }
+    {
+      std::lock_guard lock(slot->mutex);
+      slot->unpacking = false;
+      if (picture && slot->wanted) {
+        if (Picture shown = slot->seen.lock()) {
+          slot->ready = std::move(shown);
+        } else {
+          slot->seen = picture;
+          slot->ready = std::move(picture);
+        }
+      }
+    }
+    slot->unpacked.notify_all();
+  });
+}
+
 void PictureDocument::Restore(int target) {
-  working_ = TakeSlot(target, currentSlot_);
+  working_ = TakeSlot(target);
   currentSlot_ = target;
   // Only the widths are compared: a change of height alone leaves the source as it is.
   if (working_->Width() != source_->Width() && !source_->Empty()) {
@@ -236,6 +277,7 @@ bool PictureDocument::Undo() {
   Restore(currentSlot_ == 1 ? kSlots : currentSlot_ - 1);
   --undoCount_;
   ++redoCount_;
+  KeepNeighboursReady();
   return true;
 }
 
@@ -244,6 +286,7 @@ bool PictureDocument::Redo() {
   Restore(currentSlot_ % kSlots + 1);
   ++undoCount_;
   --redoCount_;
+  KeepNeighboursReady();
   return true;
 }
 
@@ -259,6 +302,7 @@ void PictureDocument::ResetHistory() {
   redoCount_ = 0;
   if (keepsHistory_) SlotAt(1) = Record(working_);
   LetGoOfUnreachableSlots();
+  KeepNeighboursReady();
   // The memory kept for pictures of another size goes back to the system with the slots let go.
   ReleasePictureMemory(working_->PixelCount() * sizeof(Pixel));
 }

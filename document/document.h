@@ -8,7 +8,9 @@
 //
 // History states are packed losslessly on a background thread once recorded; a state that no
 // document picture shows any more is then held only packed, so twenty steps of a large picture
-// fit in memory. Undo and Redo unpack into the storage of the picture they leave. States that
+// fit in memory. The states one Undo and one Redo away are kept unpacked as well (made ready
+// on the background thread when needed), so that a step through the history shows its picture
+// at once; stepping further than the background has prepared unpacks on the spot. States that
 // can no longer be reached by Undo or Redo are let go.
 //
 // A document and the copies made of it are used from one thread at a time.
@@ -21,6 +23,8 @@
 #include "imaging/bitmap32.h"
 
 namespace quillane {
+
+class PackedPicture;
 
 class PictureDocument {
  public:
@@ -100,13 +104,16 @@ class PictureDocument {
   SlotHandle& SlotAt(int slot) { return slots_[static_cast<std::size_t>(slot - 1)]; }
   const SlotHandle& SlotAt(int slot) const { return slots_[static_cast<std::size_t>(slot - 1)]; }
   static SlotHandle Record(Picture picture);
-  // The picture of slot target, unpacked into the storage of the working picture when the
-  // working picture is the state of slot leaving and held nowhere else.
-  Picture TakeSlot(int target, int leaving);
+  // The picture of slot target: the one kept ready or still shown, or else unpacked now.
+  Picture TakeSlot(int target);
+  // The states one Undo and one Redo away are kept unpacked, the others let go of their
+  // unpacked pictures; a packed neighbour is unpacked on the background thread.
+  void KeepNeighboursReady();
+  void UnpackAhead(const SlotHandle& state, std::shared_ptr<const PackedPicture> packed);
   void Restore(int target);
   void LetGoOfUnreachableSlots();
 
-  // Storage of a picture Undo or Redo let go of, kept for the next state to be unpacked while
+  // Storage of a state that stopped being kept ready, for the next state to be unpacked while
   // stepping through the history. A copy of the document starts without one.
   struct Spare {
     Spare() = default;
