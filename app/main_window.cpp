@@ -257,6 +257,7 @@ void MainWindow::BuildView(QWidget* central) {
   // The context menu opens on the release of a right click that did not pan the view.
   image1_->setContextMenuPolicy(Qt::PreventContextMenu);
   scrollBox_->setWidget(image1_);
+  connect(image1_, &PictureView::painted, this, [] { PictureDocument::ResumeBackgroundWork(); });
 }
 
 // --- Layout and lifecycle --------------------------------------------------------------------

@@ -194,6 +194,9 @@ class MainWindow : public QMainWindow, public ToolHost {
   // The view after the working picture changed in place: shown again, history buttons updated.
   void ShowWorkingChanged();
   void UpdateHistoryControls();
+  // Background work (history packing, unpacking ahead) waits until the picture control has
+  // painted what the action about to run makes, so the user sees it first.
+  void HoldBackgroundUntilShown();
   // Print, wallpaper, mail and Help: connected, and the About box created hidden.
   void ConnectExportCommands();
   // The zoom buttons, rotation, panning, the wheel, the View menu and the image size dialog.

@@ -1,6 +1,7 @@
 #include "document/document.h"
 
 #include <algorithm>
+#include <chrono>
 #include <condition_variable>
 #include <deque>
 #include <functional>
@@ -31,7 +32,9 @@ struct PictureDocument::SlotState {
 
 namespace {
 
-// The one background thread that packs history states, in the order they were recorded.
+// The one background thread that packs history states, in the order they were recorded, and
+// unpacks the states next to the current one ahead of need. It can be held back for a moment
+// while the window shows the result of an action.
 class HistoryPacker {
  public:
   using Job = std::function<void()>;
@@ -52,7 +55,22 @@ class HistoryPacker {
 
   void WaitUntilIdle() {
     std::unique_lock lock(mutex_);
+    heldUntil_ = {};
+    wake_.notify_all();
     idle_.wait(lock, [this] { return jobs_.empty() && !busy_; });
+  }
+
+  void Hold(std::chrono::milliseconds longest) {
+    std::lock_guard lock(mutex_);
+    heldUntil_ = std::chrono::steady_clock::now() + longest;
+  }
+
+  void Resume() {
+    {
+      std::lock_guard lock(mutex_);
+      heldUntil_ = {};
+    }
+    wake_.notify_all();
   }
 
   ~HistoryPacker() {
@@ -73,6 +91,10 @@ class HistoryPacker {
     for (;;) {
       wake_.wait(lock, [this] { return stop_ || !jobs_.empty(); });
       if (stop_) return;
+      if (std::chrono::steady_clock::now() < heldUntil_) {
+        wake_.wait_until(lock, heldUntil_);
+        continue;
+      }
       Job job = std::move(jobs_.front());
       jobs_.pop_front();
       busy_ = true;
@@ -91,6 +113,7 @@ class HistoryPacker {
   std::deque<Job> jobs_;
   bool busy_ = false;
   bool stop_ = false;
+  std::chrono::steady_clock::time_point heldUntil_;
   std::thread thread_;
 };
 
@@ -109,6 +132,14 @@ PictureDocument::PictureDocument(Bitmap32 picture, History history)
 
 void PictureDocument::WaitForHistoryPacking() {
   HistoryPacker::Instance().WaitUntilIdle();
+}
+
+void PictureDocument::HoldBackgroundWork(std::chrono::milliseconds longest) {
+  HistoryPacker::Instance().Hold(longest);
+}
+
+void PictureDocument::ResumeBackgroundWork() {
+  HistoryPacker::Instance().Resume();
 }
 
 PictureDocument::SlotHandle PictureDocument::Record(Picture picture) {

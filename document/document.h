@@ -17,6 +17,7 @@
 #pragma once
 
 #include <array>
+#include <chrono>
 #include <cstdint>
 #include <memory>
 
@@ -87,8 +88,13 @@ class PictureDocument {
   std::shared_ptr<const Bitmap32> SharedSource() const { return source_; }
   std::shared_ptr<const Bitmap32> SharedWorking() const { return working_; }
 
-  // Waits until every history state recorded so far (by any document) is packed.
+  // Waits until every history state recorded so far (by any document) is packed, and the
+  // states next to the current ones are unpacked; a hold ends first.
   static void WaitForHistoryPacking();
+  // The background work waits (at most longest, or until ResumeBackgroundWork), so that it
+  // does not compete with showing what an action has just made.
+  static void HoldBackgroundWork(std::chrono::milliseconds longest);
+  static void ResumeBackgroundWork();
 
   // The random generator state the effects that draw continue: 0 when the document is made,
   // never reseeded by loading or history, so every run follows on from the one before.

@@ -44,11 +44,15 @@ void PictureView::paintEvent(QPaintEvent* event) {
   QPainter painter(this);
   if (image_.isNull()) {
     painter.fillRect(event->rect(), palette().window());
+    painter.end();
+    emit painted();
     return;
   }
   // No smoothing: a stretched picture shows its pixels as blocks, like a plain stretch copy.
   painter.setRenderHint(QPainter::SmoothPixmapTransform, false);
   painter.drawImage(rect(), image_);
+  painter.end();
+  emit painted();
 }
 
 }  // namespace quillane

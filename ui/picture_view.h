@@ -25,6 +25,10 @@ class PictureView : public QWidget {
   QSize PictureSize() const { return image_.size(); }
   const QImage& Image() const { return image_; }
 
+ signals:
+  // The control has just painted itself.
+  void painted();
+
  protected:
   void paintEvent(QPaintEvent* event) override;
 
