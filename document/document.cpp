@@ -334,8 +334,14 @@ void PictureDocument::ResetHistory() {
   if (keepsHistory_) SlotAt(1) = Record(working_);
   LetGoOfUnreachableSlots();
   KeepNeighboursReady();
-  // The memory kept for pictures of another size goes back to the system with the slots let go.
-  ReleasePictureMemory(working_->PixelCount() * sizeof(Pixel));
+  // The memory kept for pictures of another size goes back to the system with the slots let go;
+  // with a history, behind the packing of the new first state, so that the picture is shown
+  // first.
+  const std::size_t fitting = working_->PixelCount() * sizeof(Pixel);
+  if (keepsHistory_)
+    HistoryPacker::Instance().Add([fitting] { ReleasePictureMemory(fitting); });
+  else
+    ReleasePictureMemory(fitting);
 }
 
 void PictureDocument::LetGoOfUnreachableSlots() {
