@@ -116,7 +116,9 @@ MainWindow::MainWindow(PlatformServices& platform, Bitmap32 picture)
   resize(kInitialWidth, kInitialHeight);
 }
 
-MainWindow::~MainWindow() = default;
+MainWindow::~MainWindow() {
+  RememberPendingRecent();
+}
 
 // --- Construction ----------------------------------------------------------------------------
 
@@ -257,7 +259,10 @@ void MainWindow::BuildView(QWidget* central) {
   // The context menu opens on the release of a right click that did not pan the view.
   image1_->setContextMenuPolicy(Qt::PreventContextMenu);
   scrollBox_->setWidget(image1_);
-  connect(image1_, &PictureView::painted, this, [] { PictureDocument::ResumeBackgroundWork(); });
+  connect(image1_, &PictureView::painted, this, [this] {
+    PictureDocument::ResumeBackgroundWork();
+    RememberPendingRecent();
+  });
 }
 
 // --- Layout and lifecycle --------------------------------------------------------------------
@@ -274,6 +279,7 @@ void MainWindow::resizeEvent(QResizeEvent* event) {
 }
 
 void MainWindow::closeEvent(QCloseEvent* event) {
+  RememberPendingRecent();
   QMainWindow::closeEvent(event);
   if (event->isAccepted()) emit closed();
 }

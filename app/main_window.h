@@ -180,6 +180,9 @@ class MainWindow : public QMainWindow, public ToolHost {
   void AddDesktopActions();
   void FillRecentMenu();
   void RememberRecent(const QString& path);
+  // A file just opened is stored on the recent list once its picture is on screen: writing
+  // the settings takes longer than painting. The menu and RecentFiles show it at once.
+  void RememberPendingRecent();
   // A recent-list entry: opened, or taken off the list with a message when it is gone.
   void OpenRecentFile(const QString& path);
 
@@ -250,6 +253,7 @@ class MainWindow : public QMainWindow, public ToolHost {
   } panning_;
   int ctrlWheelRest_ = 0;  // Ctrl+wheel turn not yet a whole notch
   QMenu* recentMenu_ = nullptr;
+  QString pendingRecent_;  // opened, not yet on the stored recent list
 };
 
 }  // namespace quillane

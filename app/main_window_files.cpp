@@ -6,6 +6,7 @@
 #include "app/main_window.h"
 #include "codecs/picture_file.h"
 #include "imaging/memory_budget.h"
+#include "ui/picture_view.h"
 #include "ui/platform.h"
 
 namespace quillane {
@@ -50,7 +51,10 @@ bool MainWindow::OpenPictureFile(const QString& path) {
                         QString::fromStdString(MemoryNeedText(OperationBytes(width, height))));
     return false;
   }
-  RememberRecent(path);
+  RememberPendingRecent();  // one opened before, whose picture was never painted
+  pendingRecent_ = path;
+  FillRecentMenu();
+  if (!image1_->isVisible()) RememberPendingRecent();
   return true;
 }
 
