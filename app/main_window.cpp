@@ -259,10 +259,14 @@ void MainWindow::BuildView(QWidget* central) {
   // The context menu opens on the release of a right click that did not pan the view.
   image1_->setContextMenuPolicy(Qt::PreventContextMenu);
   scrollBox_->setWidget(image1_);
-  connect(image1_, &PictureView::painted, this, [this] {
-    PictureDocument::ResumeBackgroundWork();
-    RememberPendingRecent();
-  });
+  // Queued, so that it runs once the painted picture has gone to the screen.
+  connect(
+      image1_, &PictureView::painted, this,
+      [this] {
+        PictureDocument::ResumeBackgroundWork();
+        RememberPendingRecent();
+      },
+      Qt::QueuedConnection);
 }
 
 // --- Layout and lifecycle --------------------------------------------------------------------
