@@ -27,7 +27,9 @@ struct PictureDocument::SlotState {
   std::shared_ptr<const PackedPicture> packed;
   Picture ready;
   bool wanted = false;     // next to the current state: worth keeping ready
+  bool queued = false;     // to be made ready on the background thread, into aheadStorage
   bool unpacking = false;  // being made ready on the background thread
+  Bitmap32 aheadStorage;
 };
 
 namespace {
@@ -211,6 +213,12 @@ PictureDocument::Picture PictureDocument::TakeSlot(int target) {
     if (state.ready) return state.ready;
     if (Picture shown = state.picture ? state.picture : state.seen.lock()) return shown;
     packed = state.packed;
+    // Wanted now: the background's turn may be far off, so its storage is taken back.
+    if (state.queued) {
+      state.queued = false;
+      if (spare_.storage.Empty()) spare_.storage = std::move(state.aheadStorage);
+      state.aheadStorage = Bitmap32();
+    }
   }
   Bitmap32 storage = std::move(spare_.storage);
   spare_.storage = Bitmap32();
@@ -234,6 +242,11 @@ void PictureDocument::KeepNeighboursReady() {
       std::lock_guard lock(state->mutex);
       state->wanted = wanted;
       if (!wanted) {
+        if (state->queued) {
+          state->queued = false;
+          if (spare_.storage.Empty()) spare_.storage = std::move(state->aheadStorage);
+          state->aheadStorage = Bitmap32();
+        }
         Picture released = std::move(state->ready);
         state->ready.reset();
         // Nobody else holds it, and nobody can find it while the lock is held: its storage
@@ -244,32 +257,38 @@ void PictureDocument::KeepNeighboursReady() {
         }
         continue;
       }
-      if (state->ready || state->unpacking) continue;
+      if (state->ready || state->unpacking || state->queued) continue;
       state->ready = state->picture ? state->picture : state->seen.lock();
-      if (state->ready) continue;
+      if (state->ready || !state->packed) continue;
       packed = state->packed;
+      state->queued = true;
+      state->aheadStorage = std::move(spare_.storage);
+      spare_.storage = Bitmap32();
     }
-    if (packed) UnpackAhead(state, std::move(packed));
+    UnpackAhead(state, std::move(packed));
   }
 }
 
 void PictureDocument::UnpackAhead(const SlotHandle& state,
                                   std::shared_ptr<const PackedPicture> packed) {
-  auto storage = std::make_shared<Bitmap32>(std::move(spare_.storage));
-  spare_.storage = Bitmap32();
-  HistoryPacker::Instance().Add([weak = std::weak_ptr<SlotState>(state), packed, storage] {
+  HistoryPacker::Instance().Add([weak = std::weak_ptr<SlotState>(state), packed] {
     const SlotHandle slot = weak.lock();
     if (!slot) return;
+    Bitmap32 storage;
     {
       std::lock_guard lock(slot->mutex);
-      if (!slot->wanted || slot->ready || slot->unpacking) return;
+      if (!slot->queued) return;  // taken back, or no longer wanted
+      slot->queued = false;
+      storage = std::move(slot->aheadStorage);
+      slot->aheadStorage = Bitmap32();
+      if (!slot->wanted || slot->ready) return;
       if ((slot->ready = slot->seen.lock())) return;
       slot->unpacking = true;
     }
     Picture picture;
     try {
-      packed->UnpackInto(*storage);
-      picture = Share(std::move(*storage));
+      packed->UnpackInto(storage);
+      picture = Share(std::move(storage));
     } catch (const std::exception&) {
       // Short of memory: Undo or Redo unpacks it when it comes.
     }
@@ -305,6 +324,7 @@ void PictureDocument::Restore(int target) {
 
 bool PictureDocument::Undo() {
   if (undoCount_ == 0) return false;
+  const Picture leaving = working_;  // the state Redo goes back to: kept ready
   Restore(currentSlot_ == 1 ? kSlots : currentSlot_ - 1);
   --undoCount_;
   ++redoCount_;
@@ -314,6 +334,7 @@ bool PictureDocument::Undo() {
 
 bool PictureDocument::Redo() {
   if (redoCount_ == 0) return false;
+  const Picture leaving = working_;  // the state Undo goes back to: kept ready
   Restore(currentSlot_ % kSlots + 1);
   ++undoCount_;
   --redoCount_;

@@ -115,6 +115,7 @@ class PictureDocument {
   // The states one Undo and one Redo away are kept unpacked, the others let go of their
   // unpacked pictures; a packed neighbour is unpacked on the background thread.
   void KeepNeighboursReady();
+  // Queues the unpacking of a state marked queued, into the storage it was given.
   void UnpackAhead(const SlotHandle& state, std::shared_ptr<const PackedPicture> packed);
   void Restore(int target);
   void LetGoOfUnreachableSlots();
