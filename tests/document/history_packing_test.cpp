@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include <cstdint>
+#include <memory>
 #include <vector>
 
 #include "document/document.h"
@@ -90,6 +91,12 @@ TEST(PictureDocument, StepsDuringAndAfterBackgroundWorkGiveTheExactStates) {
         }
         at = undo ? at - 1 : at + 1;
         ASSERT_EQ(doc.Working(), states[at]) << walk << " at " << (step - walk);
+      }
+      // The state a step leaves is kept ready for the step back, even once packed.
+      PictureDocument::WaitForHistoryPacking();
+      const std::weak_ptr<const Bitmap32> left = doc.SharedWorking();
+      if (doc.Undo() || doc.Redo()) {
+        EXPECT_FALSE(left.expired()) << walk;
       }
     }
   }
