@@ -81,6 +81,7 @@ bench:
 	$(MAKE) deps PACKAGES="$(PACKAGES) libopencv-dev"
 	$(MAKE) build
 	$(BUILD)/bench/side_by_side_bench
+	@if [ -x $(BUILD)/bench/gui_latency_bench ]; then $(BUILD)/bench/gui_latency_bench; fi
 
 # Every benchmark program, the table's included.
 bench-all: build

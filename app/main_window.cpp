@@ -116,7 +116,9 @@ MainWindow::MainWindow(PlatformServices& platform, Bitmap32 picture)
   resize(kInitialWidth, kInitialHeight);
 }
 
-MainWindow::~MainWindow() = default;
+MainWindow::~MainWindow() {
+  RememberPendingRecent();
+}
 
 // --- Construction ----------------------------------------------------------------------------
 
@@ -257,6 +259,14 @@ void MainWindow::BuildView(QWidget* central) {
   // The context menu opens on the release of a right click that did not pan the view.
   pictureView_->setContextMenuPolicy(Qt::PreventContextMenu);
   scrollBox_->setWidget(pictureView_);
+  // Queued, so that it runs once the painted picture has gone to the screen.
+  connect(
+      pictureView_, &PictureView::painted, this,
+      [this] {
+        PictureDocument::ResumeBackgroundWork();
+        RememberPendingRecent();
+      },
+      Qt::QueuedConnection);
 }
 
 // --- Layout and lifecycle --------------------------------------------------------------------
@@ -273,6 +283,7 @@ void MainWindow::resizeEvent(QResizeEvent* event) {
 }
 
 void MainWindow::closeEvent(QCloseEvent* event) {
+  RememberPendingRecent();
   QMainWindow::closeEvent(event);
   if (event->isAccepted()) emit closed();
 }

@@ -180,6 +180,9 @@ class MainWindow : public QMainWindow, public ToolHost {
   void AddDesktopActions();
   void FillRecentMenu();
   void RememberRecent(const QString& path);
+  // A file just opened is stored on the recent list once its picture is on screen: writing
+  // the settings takes longer than painting. The menu and RecentFiles show it at once.
+  void RememberPendingRecent();
   // A recent-list entry: opened, or taken off the list with a message when it is gone.
   void OpenRecentFile(const QString& path);
 
@@ -194,6 +197,9 @@ class MainWindow : public QMainWindow, public ToolHost {
   // The view after the working picture changed in place: shown again, history buttons updated.
   void ShowWorkingChanged();
   void UpdateHistoryControls();
+  // Background work (history packing, unpacking ahead) waits until the picture control has
+  // painted what the action about to run makes, so the user sees it first.
+  void HoldBackgroundUntilShown();
   // Print, wallpaper, mail and Help: connected, and the About box created hidden.
   void ConnectExportCommands();
   // The zoom buttons, rotation, panning, the wheel, the View menu and the image size dialog.
@@ -254,6 +260,7 @@ class MainWindow : public QMainWindow, public ToolHost {
   } panning_;
   int ctrlWheelRest_ = 0;  // Ctrl+wheel turn not yet a whole notch
   QMenu* recentMenu_ = nullptr;
+  QString pendingRecent_;  // opened, not yet on the stored recent list
 };
 
 }  // namespace quillane

@@ -13,6 +13,7 @@
 #include <QToolButton>
 #include <QUrl>
 #include <iterator>
+#include <utility>
 
 #include "app/main_window.h"
 #include "app/settings.h"
@@ -110,24 +111,39 @@ void MainWindow::AddDesktopActions() {
   setAcceptDrops(true);
 }
 
-QStringList MainWindow::RecentFiles() const {
-  return StoredRecent();
-}
+namespace {
 
-void MainWindow::RememberRecent(const QString& path) {
+QStringList WithRecent(QStringList files, const QString& path) {
   const QString full = QFileInfo(path).absoluteFilePath();
-  QStringList files = StoredRecent();
   files.removeAll(full);
   files.prepend(full);
   while (files.size() > kRecentCount) files.removeLast();
-  StoreRecent(files);
+  return files;
+}
+
+}  // namespace
+
+QStringList MainWindow::RecentFiles() const {
+  const QStringList files = StoredRecent();
+  return pendingRecent_.isEmpty() ? files : WithRecent(files, pendingRecent_);
+}
+
+void MainWindow::RememberRecent(const QString& path) {
+  pendingRecent_.clear();
+  StoreRecent(WithRecent(StoredRecent(), path));
   FillRecentMenu();
+}
+
+void MainWindow::RememberPendingRecent() {
+  if (pendingRecent_.isEmpty()) return;
+  const QString path = std::exchange(pendingRecent_, QString());
+  RememberRecent(path);
 }
 
 void MainWindow::FillRecentMenu() {
   if (recentMenu_ == nullptr) return;
   recentMenu_->clear();
-  const QStringList files = StoredRecent();
+  const QStringList files = RecentFiles();
   int number = 0;
   for (const QString& path : files) {
     ++number;
@@ -142,6 +158,7 @@ void MainWindow::FillRecentMenu() {
 }
 
 void MainWindow::OpenRecentFile(const QString& path) {
+  RememberPendingRecent();
   if (!QFileInfo(path).isFile()) {
     QStringList files = StoredRecent();
     files.removeAll(path);

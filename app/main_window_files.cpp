@@ -7,6 +7,7 @@
 #include "app/main_window.h"
 #include "codecs/picture_file.h"
 #include "imaging/memory_budget.h"
+#include "ui/picture_view.h"
 #include "ui/platform.h"
 
 namespace quillane {
@@ -51,7 +52,10 @@ bool MainWindow::OpenPictureFile(const QString& path) {
                         QString::fromStdString(MemoryNeedText(OperationBytes(width, height))));
     return false;
   }
-  RememberRecent(path);
+  RememberPendingRecent();  // one opened before, whose picture was never painted
+  pendingRecent_ = path;
+  FillRecentMenu();
+  if (!pictureView_->isVisible()) RememberPendingRecent();
   // Until the user has saved somewhere, Save starts beside the picture on screen.
   if (!savedOnce_) saveStartFolder_ = QFileInfo(path).absolutePath();
   return true;

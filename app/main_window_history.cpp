@@ -7,6 +7,7 @@
 #include <QScrollArea>
 #include <QScrollBar>
 #include <QToolButton>
+#include <chrono>
 #include <exception>
 #include <new>
 #include <string>
@@ -15,11 +16,13 @@
 #include "app/main_window.h"
 #include "document/run_effect.h"
 #include "imaging/memory_budget.h"
+#include "ui/picture_view.h"
 #include "ui/platform.h"
 
 namespace quillane {
 
 void MainWindow::ShowNewPicture(Bitmap32 picture, bool resetHistory) {
+  HoldBackgroundUntilShown();
   document_.Load(std::move(picture));
   ShowLoadedPicture(resetHistory);
 }
@@ -100,6 +103,7 @@ bool MainWindow::ApplyEffect(const EffectSpec& effect, const EffectParams& param
       }
     });
     if (failure) std::rethrow_exception(failure);
+    HoldBackgroundUntilShown();
     run.Land(document_, recordHistory);
   } catch (const std::bad_alloc&) {
     const Bitmap32& source = document_.Source();
@@ -121,6 +125,7 @@ bool MainWindow::ApplyEffect(const EffectSpec& effect, const EffectParams& param
 }
 
 void MainWindow::SetWorkingPicture(Bitmap32 picture, bool recordHistory) {
+  HoldBackgroundUntilShown();
   document_.SetWorking(std::move(picture));
   if (recordHistory) document_.Backup();
   ShowWorkingChanged();
@@ -143,7 +148,14 @@ void MainWindow::UpdateHistoryControls() {
   redoAction_->setEnabled(document_.CanRedo());
 }
 
+void MainWindow::HoldBackgroundUntilShown() {
+  // A control that is not on screen is not painted; the hold then simply runs out.
+  constexpr std::chrono::milliseconds kLongestHold(250);
+  if (pictureView_->isVisible()) PictureDocument::HoldBackgroundWork(kLongestHold);
+}
+
 void MainWindow::OnUndo() {
+  HoldBackgroundUntilShown();
   if (document_.Undo()) {
     ShowWorking(ZoomFromLabel());
     SetStatusText("Undo");
@@ -152,6 +164,7 @@ void MainWindow::OnUndo() {
 }
 
 void MainWindow::OnRedo() {
+  HoldBackgroundUntilShown();
   if (document_.Redo()) {
     ShowWorking(ZoomFromLabel());
     SetStatusText("Redo");
@@ -160,6 +173,7 @@ void MainWindow::OnRedo() {
 }
 
 void MainWindow::OnRenew() {
+  HoldBackgroundUntilShown();
   document_.Renew();
   ShowWorking(zoomPercent_);
   scrollBox_->horizontalScrollBar()->setValue(0);

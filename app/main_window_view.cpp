@@ -75,6 +75,7 @@ void MainWindow::BuildViewControls() {
       platform_,
       [this] { return QSize(document_.Working().Width(), document_.Working().Height()); },
       [this](int w, int h) {
+        HoldBackgroundUntilShown();
         const ResizeResult result = ResizeDocument(document_, w, h);
         if (result == ResizeResult::Resized) ShowWorkingChanged();
         return result;
@@ -88,7 +89,7 @@ void MainWindow::BuildViewControls() {
 // --- Zoom ----------------------------------------------------------------------------------
 
 void MainWindow::ShowWorking(double zoom) {
-  pictureView_->SetPicture(document_.Working());
+  pictureView_->SetPicture(document_.SharedWorking());
   SetDisplaySize(zoom);
 }
 
@@ -233,6 +234,7 @@ void MainWindow::Rotate(QuarterTurn turn) {
   const Bitmap32& working = document_.Working();
   const int width = working.Width(), height = working.Height();
   bool turned = false;
+  HoldBackgroundUntilShown();
   try {
     turned = RotateDocument(document_, turn);
   } catch (const std::bad_alloc&) {

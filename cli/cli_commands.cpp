@@ -167,8 +167,9 @@ int ApplyCommand(const Options& o, std::ostream& out, std::ostream& err) {
   const std::string name = o.input.empty() ? "the built-in picture" : o.input;
   const int width = picture->Width(), height = picture->Height();
   try {
-    // Through a document, as the program does it: alpha 255, source in, working out.
-    PictureDocument document(std::move(*picture));
+    // Through a document, as the program does it: alpha 255, source in, working out. A
+    // one-shot command cannot undo, so it keeps no history.
+    PictureDocument document(std::move(*picture), PictureDocument::History::None);
     document.RandomState() = o.seed;
     try {
       RunEffect(document, *o.effect, o.params, false);
@@ -199,7 +200,7 @@ int PictureCommand(const Options& o, std::ostream& out, std::ostream& err) {
                            : o.command == Command::Resize ? "resize"
                                                           : "convert";
   try {
-    PictureDocument document(std::move(*picture));
+    PictureDocument document(std::move(*picture), PictureDocument::History::None);
     if (o.command == Command::Rotate && !RotateDocument(document, o.turn)) {
       err << "quillane-cli: rotate: " << ShownName(name) << " (" << width << " by " << height
           << " pixels) is too small to turn\n";
@@ -391,7 +392,7 @@ int GalleryCommand(const Options& o, std::ostream& out, std::ostream& err) {
   }
 
   const fs::path folder(o.output);
-  PictureDocument document(std::move(*picture));
+  PictureDocument document(std::move(*picture), PictureDocument::History::None);
   int status = kExitOk;
   auto write = [&](const Bitmap32& p, const std::string& file) {
     try {

@@ -1,6 +1,7 @@
 #include "document/document.h"
 
 #include <algorithm>
+#include <chrono>
 #include <condition_variable>
 #include <deque>
 #include <functional>
@@ -15,17 +16,27 @@ namespace quillane {
 // One history state. It starts as the recorded picture itself; once packed, only a weak
 // reference to that picture is kept, which finds it again while a document still shows it.
 // Packing is the only change a state ever sees, and it does not change what the state holds.
+// A state next to the document's current one is also kept unpacked (ready), so that one Undo
+// or Redo shows it without waiting for the unpacking.
 struct PictureDocument::SlotState {
   explicit SlotState(Picture picture) : seen(picture), picture(std::move(picture)) {}
   std::mutex mutex;
+  std::condition_variable unpacked;
   std::weak_ptr<const Bitmap32> seen;
   Picture picture;  // until packed
   std::shared_ptr<const PackedPicture> packed;
+  Picture ready;
+  bool wanted = false;     // next to the current state: worth keeping ready
+  bool queued = false;     // to be made ready on the background thread, into aheadStorage
+  bool unpacking = false;  // being made ready on the background thread
+  Bitmap32 aheadStorage;
 };
 
 namespace {
 
-// The one background thread that packs history states, in the order they were recorded.
+// The one background thread that packs history states, in the order they were recorded, and
+// unpacks the states next to the current one ahead of need. It can be held back for a moment
+// while the window shows the result of an action.
 class HistoryPacker {
  public:
   using Job = std::function<void()>;
@@ -46,7 +57,22 @@ class HistoryPacker {
 
   void WaitUntilIdle() {
     std::unique_lock lock(mutex_);
+    heldUntil_ = {};
+    wake_.notify_all();
     idle_.wait(lock, [this] { return jobs_.empty() && !busy_; });
+  }
+
+  void Hold(std::chrono::milliseconds longest) {
+    std::lock_guard lock(mutex_);
+    heldUntil_ = std::chrono::steady_clock::now() + longest;
+  }
+
+  void Resume() {
+    {
+      std::lock_guard lock(mutex_);
+      heldUntil_ = {};
+    }
+    wake_.notify_all();
   }
 
   ~HistoryPacker() {
@@ -67,6 +93,10 @@ class HistoryPacker {
     for (;;) {
       wake_.wait(lock, [this] { return stop_ || !jobs_.empty(); });
       if (stop_) return;
+      if (std::chrono::steady_clock::now() < heldUntil_) {
+        wake_.wait_until(lock, heldUntil_);
+        continue;
+      }
       Job job = std::move(jobs_.front());
       jobs_.pop_front();
       busy_ = true;
@@ -85,6 +115,7 @@ class HistoryPacker {
   std::deque<Job> jobs_;
   bool busy_ = false;
   bool stop_ = false;
+  std::chrono::steady_clock::time_point heldUntil_;
   std::thread thread_;
 };
 
@@ -95,13 +126,22 @@ const Bitmap32& EmptyPicture() {
 
 }  // namespace
 
-PictureDocument::PictureDocument(Bitmap32 picture) {
+PictureDocument::PictureDocument(Bitmap32 picture, History history)
+    : keepsHistory_(history == History::Kept) {
   Load(std::move(picture));
   ResetHistory();
 }
 
 void PictureDocument::WaitForHistoryPacking() {
   HistoryPacker::Instance().WaitUntilIdle();
+}
+
+void PictureDocument::HoldBackgroundWork(std::chrono::milliseconds longest) {
+  HistoryPacker::Instance().Hold(longest);
+}
+
+void PictureDocument::ResumeBackgroundWork() {
+  HistoryPacker::Instance().Resume();
 }
 
 PictureDocument::SlotHandle PictureDocument::Record(Picture picture) {
@@ -154,69 +194,122 @@ void PictureDocument::Load(std::shared_ptr<Bitmap32> picture) {
 
 void PictureDocument::Backup() {
   spare_.storage = Bitmap32();
+  if (!keepsHistory_) return;
   currentSlot_ = currentSlot_ % kSlots + 1;
   SlotAt(currentSlot_) = Record(working_);
   if (undoCount_ < kMaxSteps) ++undoCount_;
   redoCount_ = 0;
   LetGoOfUnreachableSlots();
+  KeepNeighboursReady();
 }
 
-PictureDocument::Picture PictureDocument::TakeSlot(int target, int leaving) {
-  // The picture being left can lend its storage when the slot it came from has it packed and
-  // nothing else holds it: fresh memory costs far more than unpacking.
-  std::shared_ptr<const PackedPicture> leavingPacked;
-  if (const SlotHandle& from = SlotAt(leaving); from && working_.use_count() == 1) {
-    std::lock_guard lock(from->mutex);
-    const bool same = !from->seen.owner_before(working_) && !working_.owner_before(from->seen);
-    if (same && from->packed && !from->picture) leavingPacked = from->packed;
-  }
-  const auto lend = [&](Bitmap32& storage) {
-    storage = std::move(const_cast<Bitmap32&>(*working_));
-    working_.reset();
-  };
-
+PictureDocument::Picture PictureDocument::TakeSlot(int target) {
   SlotState& state = *SlotAt(target);
   std::shared_ptr<const PackedPicture> packed;
   {
-    std::lock_guard lock(state.mutex);
-    Picture shown = state.picture ? state.picture : state.seen.lock();
-    if (shown) {
-      if (leavingPacked) lend(spare_.storage);
-      return shown;
-    }
+    std::unique_lock lock(state.mutex);
+    // Unpacking it twice would only slow both down.
+    state.unpacked.wait(lock, [&] { return !state.unpacking; });
+    if (state.ready) return state.ready;
+    if (Picture shown = state.picture ? state.picture : state.seen.lock()) return shown;
     packed = state.packed;
-  }
-
-  Bitmap32 storage;
-  if (leavingPacked) {
-    lend(storage);
-  } else {
-    storage = std::move(spare_.storage);
-    spare_.storage = Bitmap32();
-  }
-  try {
-    packed->UnpackInto(storage);
-  } catch (...) {
-    if (leavingPacked) {
-      // Give the working picture back before reporting the failure.
-      try {
-        leavingPacked->UnpackInto(storage);
-      } catch (...) {
-      }
-      working_ = Share(std::move(storage));
-      std::lock_guard lock(SlotAt(leaving)->mutex);
-      SlotAt(leaving)->seen = working_;
+    // Wanted now: the background's turn may be far off, so its storage is taken back.
+    if (state.queued) {
+      state.queued = false;
+      if (spare_.storage.Empty()) spare_.storage = std::move(state.aheadStorage);
+      state.aheadStorage = Bitmap32();
     }
-    throw;
   }
+  Bitmap32 storage = std::move(spare_.storage);
+  spare_.storage = Bitmap32();
+  packed->UnpackInto(storage);
   Picture picture = Share(std::move(storage));
   std::lock_guard lock(state.mutex);
+  if (Picture shown = state.seen.lock()) return shown;  // made ready meanwhile
   state.seen = picture;
   return picture;
 }
 
+void PictureDocument::KeepNeighboursReady() {
+  const int back = currentSlot_ == 1 ? kSlots : currentSlot_ - 1;
+  const int forward = currentSlot_ % kSlots + 1;
+  for (int slot = 1; slot <= kSlots; ++slot) {
+    const SlotHandle& state = SlotAt(slot);
+    if (!state) continue;
+    const bool wanted = (slot == back && undoCount_ > 0) || (slot == forward && redoCount_ > 0);
+    std::shared_ptr<const PackedPicture> packed;
+    {
+      std::lock_guard lock(state->mutex);
+      state->wanted = wanted;
+      if (!wanted) {
+        if (state->queued) {
+          state->queued = false;
+          if (spare_.storage.Empty()) spare_.storage = std::move(state->aheadStorage);
+          state->aheadStorage = Bitmap32();
+        }
+        Picture released = std::move(state->ready);
+        state->ready.reset();
+        // Nobody else holds it, and nobody can find it while the lock is held: its storage
+        // serves the next state to be unpacked.
+        if (released && released.use_count() == 1 && spare_.storage.Empty()) {
+          state->seen.reset();
+          spare_.storage = std::move(const_cast<Bitmap32&>(*released));
+        }
+        continue;
+      }
+      if (state->ready || state->unpacking || state->queued) continue;
+      state->ready = state->picture ? state->picture : state->seen.lock();
+      if (state->ready || !state->packed) continue;
+      packed = state->packed;
+      state->queued = true;
+      state->aheadStorage = std::move(spare_.storage);
+      spare_.storage = Bitmap32();
+    }
+    UnpackAhead(state, std::move(packed));
+  }
+}
+
+void PictureDocument::UnpackAhead(const SlotHandle& state,
+                                  std::shared_ptr<const PackedPicture> packed) {
+  HistoryPacker::Instance().Add([weak = std::weak_ptr<SlotState>(state), packed] {
+    const SlotHandle slot = weak.lock();
+    if (!slot) return;
+    Bitmap32 storage;
+    {
+      std::lock_guard lock(slot->mutex);
+      if (!slot->queued) return;  // taken back, or no longer wanted
+      slot->queued = false;
+      storage = std::move(slot->aheadStorage);
+      slot->aheadStorage = Bitmap32();
+      if (!slot->wanted || slot->ready) return;
+      if ((slot->ready = slot->seen.lock())) return;
+      slot->unpacking = true;
+    }
+    Picture picture;
+    try {
+      packed->UnpackInto(storage);
+      picture = Share(std::move(storage));
+    } catch (const std::exception&) {
+      // Short of memory: Undo or Redo unpacks it when it comes.
+    }
+    {
+      std::lock_guard lock(slot->mutex);
+      slot->unpacking = false;
+      if (picture && slot->wanted) {
+        if (Picture shown = slot->seen.lock()) {
+          slot->ready = std::move(shown);
+        } else {
+          slot->seen = picture;
+          slot->ready = std::move(picture);
+        }
+      }
+    }
+    slot->unpacked.notify_all();
+  });
+}
+
 void PictureDocument::Restore(int target) {
-  working_ = TakeSlot(target, currentSlot_);
+  working_ = TakeSlot(target);
   currentSlot_ = target;
   // Only the widths are compared: a change of height alone leaves the source as it is.
   if (working_->Width() != source_->Width() && !source_->Empty()) {
@@ -231,17 +324,21 @@ void PictureDocument::Restore(int target) {
 
 bool PictureDocument::Undo() {
   if (undoCount_ == 0) return false;
+  const Picture leaving = working_;  // the state Redo goes back to: kept ready
   Restore(currentSlot_ == 1 ? kSlots : currentSlot_ - 1);
   --undoCount_;
   ++redoCount_;
+  KeepNeighboursReady();
   return true;
 }
 
 bool PictureDocument::Redo() {
   if (redoCount_ == 0) return false;
+  const Picture leaving = working_;  // the state Undo goes back to: kept ready
   Restore(currentSlot_ % kSlots + 1);
   ++undoCount_;
   --redoCount_;
+  KeepNeighboursReady();
   return true;
 }
 
@@ -255,10 +352,17 @@ void PictureDocument::ResetHistory() {
   currentSlot_ = 1;
   undoCount_ = 0;
   redoCount_ = 0;
-  SlotAt(1) = Record(working_);
+  if (keepsHistory_) SlotAt(1) = Record(working_);
   LetGoOfUnreachableSlots();
-  // The memory kept for pictures of another size goes back to the system with the slots let go.
-  ReleasePictureMemory(working_->PixelCount() * sizeof(Pixel));
+  KeepNeighboursReady();
+  // The memory kept for pictures of another size goes back to the system with the slots let go;
+  // with a history, behind the packing of the new first state, so that the picture is shown
+  // first.
+  const std::size_t fitting = working_->PixelCount() * sizeof(Pixel);
+  if (keepsHistory_)
+    HistoryPacker::Instance().Add([fitting] { ReleasePictureMemory(fitting); });
+  else
+    ReleasePictureMemory(fitting);
 }
 
 void PictureDocument::LetGoOfUnreachableSlots() {

@@ -8,13 +8,16 @@
 //
 // History states are packed losslessly on a background thread once recorded; a state that no
 // document picture shows any more is then held only packed, so twenty steps of a large picture
-// fit in memory. Undo and Redo unpack into the storage of the picture they leave. States that
+// fit in memory. The states one Undo and one Redo away are kept unpacked as well (made ready
+// on the background thread when needed), so that a step through the history shows its picture
+// at once; stepping further than the background has prepared unpacks on the spot. States that
 // can no longer be reached by Undo or Redo are let go.
 //
 // A document and the copies made of it are used from one thread at a time.
 #pragma once
 
 #include <array>
+#include <chrono>
 #include <cstdint>
 #include <memory>
 
@@ -22,14 +25,21 @@
 
 namespace quillane {
 
+class PackedPicture;
+
 class PictureDocument {
  public:
   static constexpr int kSlots = 21;
   static constexpr int kMaxSteps = kSlots - 1;
 
+  // Whether the document records history states. A one-shot command can never undo, so it
+  // runs without: its pictures are then never packed or kept for Undo, and Backup and
+  // ResetHistory leave the slots empty and the counts at 0.
+  enum class History { Kept, None };
+
   // Starts with picture (its alpha set to 255) as working, source and opened picture and in
   // slot 1.
-  explicit PictureDocument(Bitmap32 picture = Bitmap32());
+  explicit PictureDocument(Bitmap32 picture = Bitmap32(), History history = History::Kept);
 
   const Bitmap32& Working() const { return *working_; }
   const Bitmap32& Source() const { return *source_; }
@@ -39,6 +49,11 @@ class PictureDocument {
   void SetWorking(Bitmap32 picture) { working_ = Share(std::move(picture)); }
   // Rotation and resizing change the source picture as well.
   void SetSource(Bitmap32 picture) { source_ = Share(std::move(picture)); }
+  // Both at once, as one picture, when a change of shape made the same result of both.
+  void SetWorkingAndSource(Bitmap32 picture) { working_ = source_ = Share(std::move(picture)); }
+  // True while the working and the source picture are one picture in memory, so that work
+  // done on both need be done once.
+  bool WorkingIsSource() const { return working_ == source_; }
 
   // Makes picture (alpha set to 255) the working, source and opened picture, as loading a file
   // does. The history is left alone; opening a file follows this with ResetHistory.
@@ -73,8 +88,13 @@ class PictureDocument {
   std::shared_ptr<const Bitmap32> SharedSource() const { return source_; }
   std::shared_ptr<const Bitmap32> SharedWorking() const { return working_; }
 
-  // Waits until every history state recorded so far (by any document) is packed.
+  // Waits until every history state recorded so far (by any document) is packed, and the
+  // states next to the current ones are unpacked; a hold ends first.
   static void WaitForHistoryPacking();
+  // The background work waits (at most longest, or until ResumeBackgroundWork), so that it
+  // does not compete with showing what an action has just made.
+  static void HoldBackgroundWork(std::chrono::milliseconds longest);
+  static void ResumeBackgroundWork();
 
   // The random generator state the effects that draw continue: 0 when the document is made,
   // never reseeded by loading or history, so every run follows on from the one before.
@@ -90,13 +110,17 @@ class PictureDocument {
   SlotHandle& SlotAt(int slot) { return slots_[static_cast<std::size_t>(slot - 1)]; }
   const SlotHandle& SlotAt(int slot) const { return slots_[static_cast<std::size_t>(slot - 1)]; }
   static SlotHandle Record(Picture picture);
-  // The picture of slot target, unpacked into the storage of the working picture when the
-  // working picture is the state of slot leaving and held nowhere else.
-  Picture TakeSlot(int target, int leaving);
+  // The picture of slot target: the one kept ready or still shown, or else unpacked now.
+  Picture TakeSlot(int target);
+  // The states one Undo and one Redo away are kept unpacked, the others let go of their
+  // unpacked pictures; a packed neighbour is unpacked on the background thread.
+  void KeepNeighboursReady();
+  // Queues the unpacking of a state marked queued, into the storage it was given.
+  void UnpackAhead(const SlotHandle& state, std::shared_ptr<const PackedPicture> packed);
   void Restore(int target);
   void LetGoOfUnreachableSlots();
 
-  // Storage of a picture Undo or Redo let go of, kept for the next state to be unpacked while
+  // Storage of a state that stopped being kept ready, for the next state to be unpacked while
   // stepping through the history. A copy of the document starts without one.
   struct Spare {
     Spare() = default;
@@ -115,6 +139,7 @@ class PictureDocument {
   int undoCount_ = 0;
   int redoCount_ = 0;
   std::uint32_t randomState_ = 0;
+  bool keepsHistory_ = true;
 };
 
 }  // namespace quillane

@@ -14,6 +14,12 @@ bool RotateDocument(PictureDocument& document, QuarterTurn turn) {
   };
   std::optional<Bitmap32> working = turned(document.Working());
   if (!working) return false;
+  if (document.WorkingIsSource()) {
+    // A picture just opened or renewed: one turn serves both.
+    document.SetWorkingAndSource(std::move(*working));
+    document.ResetHistory();
+    return true;
+  }
   std::optional<Bitmap32> source = turned(document.Source());
   if (!source) return false;
   document.SetWorking(std::move(*working));
@@ -49,10 +55,14 @@ ResizeResult ResizeDocument(PictureDocument& document, int w, int h) {
 
   Bitmap32 newWorking = working;
   ResampleNearest(newWorking, f.height, f.width);
-  Bitmap32 newSource = source;
-  ResampleNearest(newSource, f.height, f.width);
-  document.SetWorking(std::move(newWorking));
-  document.SetSource(std::move(newSource));
+  if (document.WorkingIsSource()) {
+    document.SetWorkingAndSource(std::move(newWorking));
+  } else {
+    Bitmap32 newSource = source;
+    ResampleNearest(newSource, f.height, f.width);
+    document.SetWorking(std::move(newWorking));
+    document.SetSource(std::move(newSource));
+  }
   document.Backup();
   return ResizeResult::Resized;
 }

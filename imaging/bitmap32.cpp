@@ -101,9 +101,25 @@ void Bitmap32::DrawOver(int x, int y, Bitmap32& target) const {
 }
 
 void SetAlphaChannel(Bitmap32& bitmap, std::uint8_t value) {
+  // Pixels read as 32-bit words, block by block: a block whose alpha bytes hold value already
+  // is only read, so a picture a decoder made opaque costs one read pass instead of a rewrite.
+  constexpr std::size_t kBlock = 4096;
+  const auto word = [](Pixel p) {
+    std::uint32_t w;
+    std::memcpy(&w, &p, sizeof w);
+    return w;
+  };
+  const std::uint32_t alphaMask = word(Pixel{0, 0, 0, 0xFF});
+  const std::uint32_t alpha = word(Pixel{0, 0, 0, value});
   Pixel* p = bitmap.Data();
   const std::size_t n = bitmap.PixelCount();
-  for (std::size_t i = 0; i < n; ++i) p[i].a = value;
+  for (std::size_t start = 0; start < n; start += kBlock) {
+    const std::size_t end = std::min(n, start + kBlock);
+    std::uint32_t differ = 0;
+    for (std::size_t i = start; i < end; ++i) differ |= word(p[i]) ^ alpha;
+    if ((differ & alphaMask) == 0) continue;
+    for (std::size_t i = start; i < end; ++i) p[i].a = value;
+  }
 }
 
 void ResampleNearest(Bitmap32& bitmap, long double heightFactor, long double widthFactor) {

@@ -16,6 +16,16 @@ QImage OpaqueImage(const Bitmap32& picture) {
   return view.copy();
 }
 
+QImage SharedOpaqueImage(std::shared_ptr<const Bitmap32> picture) {
+  if (!picture || picture->Empty()) return QImage();
+  const Bitmap32& shown = *picture;
+  auto* holder = new std::shared_ptr<const Bitmap32>(std::move(picture));
+  return QImage(
+      reinterpret_cast<const uchar*>(shown.Data()), shown.Width(), shown.Height(),
+      static_cast<qsizetype>(shown.Width()) * 4, QImage::Format_RGB32,
+      [](void* held) { delete static_cast<std::shared_ptr<const Bitmap32>*>(held); }, holder);
+}
+
 PictureView::PictureView(QWidget* parent) : QWidget(parent) {
   setAttribute(Qt::WA_OpaquePaintEvent);
 }
@@ -25,15 +35,24 @@ void PictureView::SetPicture(const Bitmap32& picture) {
   update();
 }
 
+void PictureView::SetPicture(std::shared_ptr<const Bitmap32> picture) {
+  image_ = SharedOpaqueImage(std::move(picture));
+  update();
+}
+
 void PictureView::paintEvent(QPaintEvent* event) {
   QPainter painter(this);
   if (image_.isNull()) {
     painter.fillRect(event->rect(), palette().window());
+    painter.end();
+    emit painted();
     return;
   }
   // No smoothing: a stretched picture shows its pixels as blocks, like a plain stretch copy.
   painter.setRenderHint(QPainter::SmoothPixmapTransform, false);
   painter.drawImage(rect(), image_);
+  painter.end();
+  emit painted();
 }
 
 }  // namespace quillane

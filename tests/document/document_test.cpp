@@ -2,6 +2,14 @@
 
 #include <gtest/gtest.h>
 
+#include <functional>
+#include <string>
+#include <vector>
+
+#include "document/reshape.h"
+#include "document/run_effect.h"
+#include "tests/imaging/random_picture.h"
+
 namespace quillane {
 namespace {
 
@@ -18,6 +26,64 @@ TEST(PictureDocument, StartsWithOnePictureEverywhereHeldOnce) {
   EXPECT_FALSE(doc.CanUndo());
   EXPECT_FALSE(doc.CanRedo());
   EXPECT_EQ(doc.CurrentSlot(), 1);
+}
+
+// A one-shot command's document keeps no history: it must still make exactly the pictures a
+// document with history makes, whether the turn or resample meets one picture that is both
+// working and source, or two that differ after an effect.
+TEST(PictureDocument, WithoutHistoryMakesTheSamePicturesAndRecordsNothing) {
+  using Step = std::function<void(PictureDocument&)>;
+  const Step emboss = [](PictureDocument& d) {
+    RunEffect(d, *FindEffectByCliName("emboss"), {}, true);
+  };
+  const Step turn = [](PictureDocument& d) {
+    ASSERT_TRUE(RotateDocument(d, QuarterTurn::Clockwise));
+  };
+  const Step resize = [](PictureDocument& d) {
+    ASSERT_EQ(ResizeDocument(d, 11, 30), ResizeResult::Resized);
+  };
+  const struct {
+    std::string name;
+    std::vector<Step> steps;
+  } cases[] = {
+      {"effect", {emboss}},
+      {"turn", {turn}},
+      {"resize", {resize}},
+      {"effect, turn", {emboss, turn}},
+      {"effect, resize", {emboss, resize}},
+      {"turn, resize, effect", {turn, resize, emboss}},
+  };
+  Bitmap32 photo = RandomPicture(37, 23, 3);
+  SetAlphaChannel(photo, 255);
+  for (const auto& c : cases) {
+    PictureDocument kept(photo);
+    PictureDocument none(photo, PictureDocument::History::None);
+    for (const Step& step : c.steps) {
+      step(kept);
+      step(none);
+    }
+    EXPECT_EQ(none.Working(), kept.Working()) << c.name;
+    EXPECT_EQ(none.Source(), kept.Source()) << c.name;
+    EXPECT_FALSE(none.CanUndo()) << c.name;
+    EXPECT_FALSE(none.Undo()) << c.name;
+    EXPECT_TRUE(none.Slot(none.CurrentSlot()).Empty()) << c.name;
+  }
+
+  // The single turn and resample of a fresh picture are those of the routines themselves.
+  PictureDocument turned(photo, PictureDocument::History::None);
+  turn(turned);
+  EXPECT_EQ(turned.Working(),
+            *RotatePicture(photo, RotationCentre(37), RotationCentre(23), QuarterTurn::Clockwise));
+  EXPECT_EQ(turned.Source(), turned.Working());
+  PictureDocument resized(photo);
+  resize(resized);
+  Bitmap32 expected = photo;
+  const SizeFactors f = ImageSizeFactors(11, 30, 37, 23);
+  ResampleNearest(expected, f.height, f.width);
+  EXPECT_EQ(resized.Working(), expected);
+  EXPECT_EQ(resized.Source(), expected);
+  ASSERT_TRUE(resized.Undo());
+  EXPECT_EQ(resized.Working(), photo);
 }
 
 TEST(PictureDocument, UndoAfterResizeResamplesSourceOnlyWhenWidthDiffers) {

@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include <cstdint>
+#include <memory>
 #include <vector>
 
 #include "document/document.h"
@@ -54,6 +55,51 @@ TEST(PictureDocument, UndoAndRedoAfterPackingGiveBackTheExactStates) {
   EXPECT_FALSE(doc.Redo());
   EXPECT_EQ(copy.Working(), states[24]);
   EXPECT_EQ(copy.Slot(copy.CurrentSlot() == 1 ? 21 : copy.CurrentSlot() - 1), states[23]);
+}
+
+// Undo and Redo arrive while states are still being packed or made ready in the background,
+// in every order a user may press them, and after the background went quiet; each gives the
+// exact state. Once quiet, the states one step away are ready: the step shows that very
+// picture instead of unpacking one.
+TEST(PictureDocument, StepsDuringAndAfterBackgroundWorkGiveTheExactStates) {
+  const char* walks[] = {"uuuu", "ururur", "uuurrruu", "uuuuuurrr", "ruuurur"};
+  for (const bool waitEachStep : {false, true}) {
+    for (const char* walk : walks) {
+      std::vector<Bitmap32> states{RandomPicture(300, 400, 0)};
+      PictureDocument doc(states[0]);
+      for (std::uint32_t i = 1; i <= 8; ++i) {
+        states.push_back(RandomPicture(300, 400 + static_cast<int>(i % 2), i));
+        doc.SetWorking(states.back());
+        doc.Backup();
+      }
+      std::size_t at = 8;
+      for (const char* step = walk; *step != 0; ++step) {
+        const bool undo = *step == 'u';
+        if (!(undo ? doc.CanUndo() : doc.CanRedo())) {
+          EXPECT_FALSE(undo ? doc.Undo() : doc.Redo());
+          continue;
+        }
+        if (waitEachStep) {
+          PictureDocument::WaitForHistoryPacking();
+          const int next = undo ? (doc.CurrentSlot() == 1 ? 21 : doc.CurrentSlot() - 1)
+                                : doc.CurrentSlot() % 21 + 1;
+          const Pixel* ready = doc.Slot(next).Data();
+          ASSERT_TRUE(undo ? doc.Undo() : doc.Redo()) << walk;
+          EXPECT_EQ(doc.Working().Data(), ready) << walk << " at " << (step - walk);
+        } else {
+          ASSERT_TRUE(undo ? doc.Undo() : doc.Redo()) << walk;
+        }
+        at = undo ? at - 1 : at + 1;
+        ASSERT_EQ(doc.Working(), states[at]) << walk << " at " << (step - walk);
+      }
+      // The state a step leaves is kept ready for the step back, even once packed.
+      PictureDocument::WaitForHistoryPacking();
+      const std::weak_ptr<const Bitmap32> left = doc.SharedWorking();
+      if (doc.Undo() || doc.Redo()) {
+        EXPECT_FALSE(left.expired()) << walk;
+      }
+    }
+  }
 }
 
 TEST(PictureDocument, ANewStepAfterUndoDiscardsRedoAndLetsUnreachableStatesGo) {

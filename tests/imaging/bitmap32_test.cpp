@@ -75,6 +75,14 @@ TEST(SetAlphaChannel, SetsAlphaOnlyAndEmptyIsANoOp) {
   Bitmap32 empty;
   SetAlphaChannel(empty, 255);
   EXPECT_TRUE(empty.Empty());
+  // Stretches already holding the value are left as they are; a single pixel that does not,
+  // anywhere (first, middle and last stretch, the last one short), is set.
+  for (const auto& [x, y] : {std::pair{0, 0}, {57, 61}, {99, 99}}) {
+    Bitmap32 opaque = Numbered(100, 100, 255);
+    opaque.At(x, y).a = 0;
+    SetAlphaChannel(opaque, 255);
+    EXPECT_EQ(opaque, Numbered(100, 100, 255)) << x << ", " << y;
+  }
 }
 
 Pixel Over(Pixel overlay, Pixel target) {
