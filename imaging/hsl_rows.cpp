@@ -689,7 +689,7 @@ QUILLANE_AVX512 void Avx512Row(const HslChange& change, const std::uint32_t* hue
 #endif
 
 template <LightnessFrom kFrom>
-void ChangeRow(const HslChange& change, const std::uint32_t* hueSaturation,
+void ChangeRow([[maybe_unused]] const HslChange& change, const std::uint32_t* hueSaturation,
                const std::uint8_t* lightRows, const Pixel* in, Pixel* out, int width,
                const LightnessSource& source) {
 #if defined(__x86_64__) && defined(__GNUC__)
