@@ -17,6 +17,7 @@
 #include <vector>
 
 #include "bench/synthetic_photo.h"
+#include "bench/wall_clock.h"
 #include "codecs/codec_internal.h"
 #include "codecs/picture_file.h"
 #include "effects/registry.h"
@@ -31,23 +32,6 @@ namespace {
 constexpr int kWidth = 6028;
 constexpr int kHeight = 3391;
 constexpr int kRuns = 5;
-
-using Clock = std::chrono::steady_clock;
-
-double Milliseconds(Clock::time_point since) {
-  return std::chrono::duration<double, std::milli>(Clock::now() - since).count();
-}
-
-double MedianOf(int runs, const std::function<void()>& work) {
-  std::vector<double> times;
-  for (int i = 0; i < runs; ++i) {
-    const auto start = Clock::now();
-    work();
-    times.push_back(Milliseconds(start));
-  }
-  std::sort(times.begin(), times.end());
-  return times[times.size() / 2];
-}
 
 void WriteBytes(const std::string& path, const std::vector<std::uint8_t>& bytes) {
   std::ofstream(path, std::ios::binary)

@@ -31,6 +31,7 @@
 #include "app/main_window.h"
 #include "app/tool_windows.h"
 #include "bench/synthetic_photo.h"
+#include "bench/wall_clock.h"
 #include "codecs/codec_internal.h"
 #include "codecs/picture_file.h"
 #include "document/run_effect.h"
@@ -47,17 +48,6 @@ namespace {
 constexpr int kWidth = 6028;
 constexpr int kHeight = 3391;
 constexpr int kRuns = 5;
-
-using Clock = std::chrono::steady_clock;
-
-double Milliseconds(Clock::time_point since) {
-  return std::chrono::duration<double, std::milli>(Clock::now() - since).count();
-}
-
-double Median(std::vector<double> v) {
-  std::sort(v.begin(), v.end());
-  return v[v.size() / 2];
-}
 
 double ResidentMegabytes() {
   std::ifstream statm("/proc/self/statm");
