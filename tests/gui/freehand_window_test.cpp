@@ -169,6 +169,8 @@ TEST_F(FreehandWindows, CtrlZTakesBackOneStepWhicheverWindowHasTheFocus) {
     const Bitmap32 afterStroke = Area().Picture();
     Press("Button8");
     ASSERT_NE(Area().Picture(), afterStroke);
+    EXPECT_EQ(Area().Picture().At(38, 10), kWhite) << "the bar's last interior column thinned";
+    EXPECT_EQ(Area().Picture().At(39, 10), kBlack) << "the border column left";
     focus->window()->activateWindow();
     focus->setFocus();
     ASSERT_TRUE(QTest::qWaitForWindowActive(focus->window()));
