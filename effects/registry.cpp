@@ -6,15 +6,16 @@ namespace quillane {
 
 // Each effect's entry is defined beside its routine. This list is the only place that names them
 // all; its order is the tool numbers' and the gallery's.
-#define QUILLANE_EFFECTS(X)                                                               \
-  X(PencilSketch)                                                                         \
-  X(PenSketch)                                                                            \
-  X(Vuzorar)                                                                              \
-  X(PenAndInk)                                                                            \
-  X(ColorPencil)                                                                          \
-  X(Realism)                                                                              \
-  X(Abstract) X(PopArt) X(WaterColor) X(Brume) X(HslAdjust) X(ColorVariety) X(ColorPanel) \
-      X(Texture) X(Emboss) X(ColorFilter) X(Stria)
+#define QUILLANE_EFFECTS(X)                                                                        \
+  X(PencilSketch)                                                                                  \
+  X(PenSketch)                                                                                     \
+  X(Vuzorar)                                                                                       \
+  X(PenAndInk)                                                                                     \
+  X(ColorPencil)                                                                                   \
+  X(Realism)                                                                                       \
+  X(Abstract)                                                                                      \
+  X(PopArt) X(WaterColor) X(Brume) X(HslAdjust) X(ColorVariety) X(ColorPanel) X(Texture) X(Emboss) \
+      X(ColorFilter) X(Stria)
 
 #define QUILLANE_DECLARE_EFFECT(name) const EffectSpec& name##Effect();
 QUILLANE_EFFECTS(QUILLANE_DECLARE_EFFECT)
