@@ -5,10 +5,14 @@
 #if defined(__x86_64__) && defined(__GNUC__)
 // GCC 12's AVX-512 intrinsics start some results from a deliberately undefined register, which
 // its own warning then reports from inside the header.
+#if defined(__clang__)
+#include <immintrin.h>
+#else
 #pragma GCC diagnostic push
 #pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
 #include <immintrin.h>
 #pragma GCC diagnostic pop
+#endif
 
 // Functions for processors with AVX-512 F, BW, VL and DQ besides AVX2, as UseAvx512() asks.
 #define QUILLANE_AVX512 [[gnu::target("avx2,avx512f,avx512bw,avx512vl,avx512dq")]]
