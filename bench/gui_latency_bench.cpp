@@ -30,6 +30,7 @@
 #include "app/image_size_dialog.h"
 #include "app/main_window.h"
 #include "app/tool_windows.h"
+#include "bench/resident_memory.h"
 #include "bench/synthetic_photo.h"
 #include "bench/wall_clock.h"
 #include "codecs/codec_internal.h"
@@ -48,13 +49,6 @@ namespace {
 constexpr int kWidth = 6028;
 constexpr int kHeight = 3391;
 constexpr int kRuns = 5;
-
-double ResidentMegabytes() {
-  std::ifstream statm("/proc/self/statm");
-  long size = 0, resident = 0;
-  statm >> size >> resident;
-  return static_cast<double>(resident) * static_cast<double>(sysconf(_SC_PAGESIZE)) / 1e6;
-}
 
 // Answers the save dialog from a queue; everything else is refused or cancelled, and any
 // message or error is printed, since the benchmark expects none.

@@ -10,6 +10,7 @@
 #include <fstream>
 #include <string>
 
+#include "bench/resident_memory.h"
 #include "bench/synthetic_photo.h"
 #include "document/document.h"
 #include "document/run_effect.h"
@@ -21,13 +22,6 @@ namespace {
 constexpr int kWidth = 6000;
 constexpr int kHeight = 4000;
 constexpr int kSteps = 20;
-
-double ResidentMegabytes() {
-  std::ifstream statm("/proc/self/statm");
-  long size = 0, resident = 0;
-  statm >> size >> resident;
-  return static_cast<double>(resident) * static_cast<double>(sysconf(_SC_PAGESIZE)) / 1e6;
-}
 
 // Processor time of the whole process, every thread: unlike the clock on the wall it does not
 // count the time other programs on a busy machine take.
